@@ -1,0 +1,27 @@
+# SPDX-License-Identifier: Apache-2.0
+# Settings that hold for every target.
+set(CMAKE_CXX_STANDARD 20)
+set(CMAKE_CXX_STANDARD_REQUIRED ON)
+set(CMAKE_CXX_EXTENSIONS OFF)
+set(CMAKE_EXPORT_COMPILE_COMMANDS ON)
+set(CMAKE_RUNTIME_OUTPUT_DIRECTORY ${CMAKE_BINARY_DIR}/bin)
+
+find_program(PROBEVIEW_CCACHE ccache)
+if(PROBEVIEW_CCACHE AND NOT CMAKE_CXX_COMPILER_LAUNCHER)
+  set(CMAKE_CXX_COMPILER_LAUNCHER ${PROBEVIEW_CCACHE})
+endif()
+
+find_package(Threads REQUIRED)
+
+# One interface target carries the warnings, the include root and the sanitizers.
+add_library(probeview_settings INTERFACE)
+target_include_directories(probeview_settings INTERFACE ${PROJECT_SOURCE_DIR})
+target_compile_options(probeview_settings INTERFACE
+  -Wall -Wextra -Wpedantic -Wshadow -Wconversion -Werror -fno-omit-frame-pointer)
+target_compile_definitions(probeview_settings INTERFACE PROBEVIEW_VERSION="${PROJECT_VERSION}")
+
+set(PROBEVIEW_SANITIZE "" CACHE STRING "Sanitizers, as in -fsanitize=")
+if(PROBEVIEW_SANITIZE)
+  add_compile_options(-fsanitize=${PROBEVIEW_SANITIZE} -fno-sanitize-recover=all)
+  add_link_options(-fsanitize=${PROBEVIEW_SANITIZE})
+endif()

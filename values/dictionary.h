@@ -1,0 +1,111 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// Insertion-ordered containers of values. The order is a promise: it is the order of the rows on a page, of the entries
+// on a log line and of the keys in JSON.
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+#include <initializer_list>
+#include <string_view>
+#include <utility>
+#include <vector>
+
+#include "values/value.h"
+
+namespace probeview {
+
+// A dictionary's key: a view of a constant (no copy, no allocation), or a text of its own.
+class Key {
+ public:
+  // A string literal.
+  template <std::size_t N>
+  consteval Key(const char (&literal)[N]) : data_(literal), size_(N - 1), owned_(false) {}
+  // A text that lives as long as the process, such as a key of a field table.
+  static Key constant(std::string_view text) noexcept { return Key(text); }
+  static Key copy(std::string_view text);
+
+  Key(const Key& other);
+  Key(Key&& other) noexcept;
+  Key& operator=(const Key& other);
+  Key& operator=(Key&& other) noexcept;
+  ~Key();
+
+  std::string_view text() const noexcept { return {data_, size_}; }
+  friend bool operator==(const Key& left, const Key& right) noexcept { return left.text() == right.text(); }
+
+ private:
+  explicit Key(std::string_view text) noexcept
+      : data_(text.data()), size_(static_cast<std::uint32_t>(text.size())), owned_(false) {}
+
+  const char* data_;
+  std::uint32_t size_;
+  bool owned_;
+};
+
+class List {
+ public:
+  List() = default;
+  List(std::initializer_list<Value> values) : values_(values) {}
+
+  std::size_t size() const noexcept { return values_.size(); }
+  bool empty() const noexcept { return values_.empty(); }
+  void reserve(std::size_t count) { values_.reserve(count); }
+  void append(Value value) { values_.push_back(std::move(value)); }
+  void clear() noexcept { values_.clear(); }
+
+  // The index must be below size().
+  const Value& operator[](std::size_t index) const noexcept { return values_[index]; }
+  Value& operator[](std::size_t index) noexcept { return values_[index]; }
+
+  auto begin() const noexcept { return values_.begin(); }
+  auto end() const noexcept { return values_.end(); }
+  auto begin() noexcept { return values_.begin(); }
+  auto end() noexcept { return values_.end(); }
+
+  friend bool operator==(const List& left, const List& right) noexcept { return left.values_ == right.values_; }
+
+ private:
+  std::vector<Value> values_;
+};
+
+class Dictionary {
+ public:
+  struct Entry {
+    Key key;
+    Value value;
+  };
+
+  Dictionary() = default;
+  Dictionary(std::initializer_list<Entry> entries);
+
+  std::size_t size() const noexcept { return entries_.size(); }
+  bool empty() const noexcept { return entries_.empty(); }
+  void reserve(std::size_t count) { entries_.reserve(count); }
+  void clear() noexcept { entries_.clear(); }
+
+  // Null when there is no such key. Valid until the dictionary changes.
+  const Value* find(std::string_view key) const noexcept;
+  Value* find(std::string_view key) noexcept;
+  bool contains(std::string_view key) const noexcept { return find(key) != nullptr; }
+
+  // Replaces the value in its place, or adds the entry at the end.
+  void set(Key key, Value value);
+  // Adds an entry whose key is known not to be there; saves the search.
+  void append(Key key, Value value) { entries_.push_back({std::move(key), std::move(value)}); }
+
+  // Entries in the order of insertion; the index must be below size().
+  const Entry& operator[](std::size_t index) const noexcept { return entries_[index]; }
+  auto begin() const noexcept { return entries_.begin(); }
+  auto end() const noexcept { return entries_.end(); }
+  auto begin() noexcept { return entries_.begin(); }
+  auto end() noexcept { return entries_.end(); }
+
+  // Same keys with equal values, in any order.
+  friend bool operator==(const Dictionary& left, const Dictionary& right) noexcept;
+
+ private:
+  std::vector<Entry> entries_;
+};
+
+}  // namespace probeview
