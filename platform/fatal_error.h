@@ -1,0 +1,18 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include <functional>
+#include <string_view>
+
+namespace probeview {
+
+// Stops the program because a contract is broken: flushes the logs, writes one line with the reason to standard error
+// and aborts, in release builds too, from any thread and from inside a queue's task. Never for bad input from outside.
+[[noreturn]] void fatalError(std::string_view reason);
+
+// Runs before the program stops, in the order of registration: logs register their flush here. The hook may throw to
+// leave fatalError(), which is how tests and the batch tool observe a stop. Main thread, before the first event.
+void setFatalErrorObserver(std::function<void(std::string_view reason)> observer);
+void addFatalErrorFlush(std::function<void()> flush);
+
+}  // namespace probeview
