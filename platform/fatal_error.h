@@ -10,9 +10,11 @@ namespace probeview {
 // and aborts, in release builds too, from any thread and from inside a queue's task. Never for bad input from outside.
 [[noreturn]] void fatalError(std::string_view reason);
 
-// Runs before the program stops, in the order of registration: logs register their flush here. The hook may throw to
-// leave fatalError(), which is how tests and the batch tool observe a stop. Main thread, before the first event.
-void setFatalErrorObserver(std::function<void(std::string_view reason)> observer);
+// Logs register their flush here; run in order before the program stops. Main thread, at start-up.
 void addFatalErrorFlush(std::function<void()> flush);
+
+// Sees the reason after the flushes. It may throw to leave fatalError(), which is how tests and the batch tool observe
+// a stop without ending their process. An empty function removes it.
+void setFatalErrorObserver(std::function<void(std::string_view reason)> observer);
 
 }  // namespace probeview
