@@ -1,0 +1,72 @@
+# SPDX-License-Identifier: Apache-2.0
+# The Debian 12 packages that each purpose needs, and the one way to install what is missing. Sourced by run and test.
+
+packages_build="g++ cmake ninja-build pkg-config ccache libcli11-dev libtomlplusplus-dev libncurses-dev \
+qt6-base-dev qt6-base-dev-tools qt6-declarative-dev qt6-declarative-dev-tools libgl-dev libxkbcommon-dev"
+# QML modules are loaded by name at run time, so no library pulls them in. Fonts: digits need one.
+packages_window="qml6-module-qtqml qml6-module-qtqml-models qml6-module-qtqml-workerscript qml6-module-qtquick \
+qml6-module-qtquick-controls qml6-module-qtquick-layouts qml6-module-qtquick-templates qml6-module-qtquick-window \
+qt6-wayland fonts-dejavu-core"
+packages_test="libgtest-dev libgmock-dev libprotobuf-dev protobuf-compiler nlohmann-json3-dev python3 locales dbus"
+packages_deep="clang libclang-rt-14-dev valgrind libprotozero-dev nanopb libnanopb-dev"
+
+# Installs those of the packages named that are missing.
+install_packages() {
+  local missing="" package
+  for package in "$@"; do
+    dpkg-query -W -f '${db:Status-Status}' "$package" 2>/dev/null | grep -qx installed || missing="$missing $package"
+  done
+  [ -n "$missing" ] || return 0
+  echo "installing:$missing"
+  local sudo=""
+  if [ "$(id -u)" != 0 ]; then
+    if ! command -v sudo >/dev/null; then
+      echo "error: these packages are missing and there is neither root nor sudo to install them:$missing" >&2
+      return 1
+    fi
+    sudo=sudo
+  fi
+  # Another apt may be at work; wait for it rather than fail.
+  local apt="$sudo env DEBIAN_FRONTEND=noninteractive apt-get -o DPkg::Lock::Timeout=300 -qq"
+  # shellcheck disable=SC2086
+  if ! $apt install -y --no-install-recommends $missing >"$top/build/packages.log" 2>&1; then
+    # Most often the lists of packages are old or absent.
+    # shellcheck disable=SC2086
+    if ! { $apt update && $apt install -y --no-install-recommends $missing; } >"$top/build/packages.log" 2>&1; then
+      tail -n 5 "$top/build/packages.log" >&2
+      echo "error: the packages could not be installed; the whole story is in build/packages.log" >&2
+      return 1
+    fi
+  fi
+}
+
+# stage "what": prints what begins and, before it, how long the one before took.
+stage_name=""
+stage() {
+  local now
+  now=$(date +%s)
+  if [ -n "$stage_name" ]; then echo "-- $stage_name: $((now - stage_began)) s"; fi
+  stage_name=$1
+  stage_began=$now
+  if [ -n "$1" ]; then echo "== $1"; fi
+}
+
+# configure_and_build PRESET [CMake arguments]: quiet when all is well, the errors otherwise.
+configure_and_build() {
+  local preset=$1 log="$top/build/$1.log"
+  shift
+  # Two builds of one folder at once would write over each other.
+  exec 8>"$top/build/$preset.lock"
+  flock 8
+  if ! cmake --preset "$preset" "$@" >"$log" 2>&1; then
+    tail -n 30 "$log" >&2
+    echo "error: configuring failed; the whole story is in ${log#"$top"/}" >&2
+    return 1
+  fi
+  if ! cmake --build "$top/build/$preset" >>"$log" 2>&1 </dev/null; then
+    grep -E 'error|undefined reference|FAILED' "$log" | head -n 30 >&2
+    echo "error: the build failed; the whole story is in ${log#"$top"/}" >&2
+    return 1
+  fi
+  exec 8>&-
+}
