@@ -25,7 +25,7 @@ function(probeview_test name)
   cmake_parse_arguments(ARG "" "" "SOURCES;KNOWS;LINKS;ENVIRONMENT" ${ARGN})
   add_executable(${name} ${ARG_SOURCES})
   list(TRANSFORM ARG_KNOWS PREPEND pv_)
-  target_link_libraries(${name} PRIVATE probeview_settings ${ARG_KNOWS} ${ARG_LINKS} GTest::gtest_main)
+  target_link_libraries(${name} PRIVATE probeview_settings ${ARG_KNOWS} ${ARG_LINKS} GTest::gtest_main GTest::gmock)
   set_target_properties(${name} PROPERTIES RUNTIME_OUTPUT_DIRECTORY ${CMAKE_BINARY_DIR}/tests)
   # PRE_TEST: the tests are listed when ctest runs, so that a build does not run programs.
   gtest_discover_tests(${name} TEST_PREFIX "${name}." DISCOVERY_MODE PRE_TEST DISCOVERY_TIMEOUT 60

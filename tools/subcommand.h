@@ -1,0 +1,51 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// How a subcommand of probectl is made. Each lies in a file of its own and offers one function that declares it:
+//
+//   void addStatusCommand(CLI::App& program, Tool& tool) {
+//     CLI::App* command = program.add_subcommand("status", "Show sources, clients, rates and losses");
+//     struct Options { bool json = false; };
+//     auto options = std::make_shared<Options>();
+//     command->add_flag("--json", options->json, "One JSON object instead of text");
+//     command->footer("Examples:\n  probectl status");
+//     command->callback([options, &tool] { tool.run = [options, &tool] { return showStatus(*options, tool); }; });
+//   }
+//
+// and one line in subcommands.cpp. The callback only chooses what to run; it runs after the whole command line has been
+// understood, so that an error further on leaves nothing half done.
+#pragma once
+
+#include <CLI/CLI.hpp>
+#include <functional>
+#include <iosfwd>
+#include <optional>
+#include <string>
+
+namespace probeview {
+
+// The exit statuses of probectl; the manual page lists them.
+enum class ExitStatus : int {
+  Success = 0,
+  Failure = 1,         // the answer is no: a payload does not decode, the service refuses or is away, a file is missing
+  UsageError = 2,      // the command line is not understood
+  BrokenContract = 3,  // what was fed stops the program (store --batch)
+};
+
+// What a subcommand is given to live on. Streams are handed in, so that tests can put their own in their place.
+struct Tool {
+  std::istream& input;
+  std::ostream& output;
+  std::ostream& errors;
+  // The service's socket, where the command line names one. It is also in the environment as RADIXD_SOCKET before run
+  // is called, which is where the client library looks for it.
+  std::optional<std::string> socketPath;
+  // Set by the chosen subcommand.
+  std::function<ExitStatus()> run;
+};
+
+using AddSubcommand = void (*)(CLI::App& program, Tool& tool);
+
+// Declares every subcommand, in the order of --help.
+void addSubcommands(CLI::App& program, Tool& tool);
+
+}  // namespace probeview
