@@ -1,46 +1,63 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// A list page without a toolkit: it answers the questions that a list asks and knows which page a tapped row leads to.
-// A front asks each question once per reload, through a snapshot, and draws the answers; it decides nothing.
+// A list page without a toolkit: the list's content, a title, the hook before navigating and the call to reload.
+// A front takes one snapshot per reload (ui/page_snapshot.h) and draws it; it decides nothing. Main thread.
 #pragma once
 
-#include <cstddef>
+#include <functional>
 #include <memory>
-#include <optional>
 #include <string>
-#include <string_view>
+#include <utility>
+
+#include "ui/list_content.h"
 
 namespace probeview {
 
-// A reusable list cell. A label that the page does not set stays absent and is drawn blank.
-struct ListCell {
-  std::string_view identifier;
-  std::optional<std::string> text;
-  std::optional<std::string> detail;
-};
+// Rows are as high as their content needs.
+inline constexpr double automaticDimension = -1.0;
 
-class ListPage {
+class ListPage : public ListContent {
  public:
-  virtual ~ListPage() = default;
+  ListPage() = default;
+  ListPage(const ListPage&) = delete;
+  ListPage& operator=(const ListPage&) = delete;
 
-  // For the navigation bar; a front's matter, never part of the list.
+  // For the navigation bar; never part of the list.
   virtual std::string title() const = 0;
 
-  virtual std::size_t numberOfSections() = 0;
-  virtual std::optional<std::string> titleForHeaderInSection(std::size_t section) = 0;
-  virtual std::size_t numberOfRowsInSection(std::size_t section) = 0;
-  // The cell comes cleared. A section or row past the end stops the program.
-  virtual void cellForRow(std::size_t section, std::size_t row, ListCell& cell) = 0;
-
-  // Called once, when the page has been made and its properties are set.
-  virtual void viewDidLoad() {}
-  // The page that a tap on a row leads to; null when rows lead nowhere.
-  virtual std::unique_ptr<ListPage> makeDestination() { return nullptr; }
-  // The hook before navigating: hands the tapped cell's text on to the destination.
-  virtual void prepareForNavigation(const ListCell& sender, ListPage& destination) {
-    static_cast<void>(sender);
-    static_cast<void>(destination);
+  virtual double heightForRow(std::size_t /*section*/, std::size_t /*row*/) const { return automaticDimension; }
+  virtual double estimatedHeightForRow(std::size_t /*section*/, std::size_t /*row*/) const {
+    return automaticDimension;
   }
+
+  // Called once by the navigation stack, when the page has been made and its properties are set.
+  virtual void viewDidLoad() {}
+  virtual void didReceiveMemoryWarning() {}
+
+  // The hook before navigating: hands the tapped cell's text on to the page below. The sender is null when something
+  // else than a cell navigates.
+  virtual void prepareForNavigation(const ListCell* /*sender*/, ListPage& /*destination*/) {}
+
+  // The list that draws this page; called on the main queue when all rows are to be asked again. Replaces the one
+  // before it; an empty function removes it.
+  void setReloadObserver(std::function<void()> observer) { reload_->observer = std::move(observer); }
+
+ protected:
+  // Asks the list to reload, if the page still lives by then: made to be posted to a queue.
+  std::function<void()> reloadTask() const {
+    return [reload = std::weak_ptr<Reload>(reload_)] {
+      const auto alive = reload.lock();
+      if (!alive) return;
+      // A copy, so that the observer may replace itself.
+      if (const auto observer = alive->observer) observer();
+    };
+  }
+
+ private:
+  struct Reload {
+    std::function<void()> observer;
+  };
+  std::shared_ptr<Reload> reload_ = std::make_shared<Reload>();
 };
 
 }  // namespace probeview

@@ -1,0 +1,47 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "ui/navigation_stack.h"
+
+#include <utility>
+
+namespace probeview {
+
+NavigationStack::NavigationStack(InterfaceDescription description)
+    : NavigationStack(description, description.makeRootPage()) {}
+
+NavigationStack::NavigationStack(InterfaceDescription description, std::unique_ptr<ListPage> rootPage)
+    : description_(std::move(description)) {
+  push(std::move(rootPage));
+}
+
+NavigationStack::~NavigationStack() {
+  // From the top down, as if every page were popped.
+  while (!pages_.empty()) pages_.pop_back();
+}
+
+bool NavigationStack::tap(const ListCell& cell) {
+  auto destination = description_.makeDestination(cell.identifier);
+  if (!destination) return false;
+  topPage().prepareForNavigation(&cell, *destination);
+  push(std::move(destination));
+  return true;
+}
+
+bool NavigationStack::pop() {
+  if (pages_.size() == 1) return false;
+  if (observer_) observer_->willPop(topPage());
+  pages_.pop_back();
+  return true;
+}
+
+void NavigationStack::popToRoot() {
+  while (pop()) {
+  }
+}
+
+void NavigationStack::push(std::unique_ptr<ListPage> page) {
+  pages_.push_back(std::move(page));
+  topPage().viewDidLoad();
+  if (observer_) observer_->didPush(topPage());
+}
+
+}  // namespace probeview

@@ -1,0 +1,51 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "ui/second_level_view_controller.h"
+
+#include "platform/fatal_error.h"
+#include "ui/category_page.h"
+
+namespace probeview {
+
+SecondLevelViewController::SecondLevelViewController(const PageEnvironment& environment)
+    : myMetricValidator(environment.metricValidator),
+      mainQueue_(environment.mainQueue),
+      scheduler_(environment.scheduler),
+      consoleLog_(environment.consoleLog) {}
+
+std::string SecondLevelViewController::title() const { return seguedThroughRow.value_or(""); }
+
+std::size_t SecondLevelViewController::numberOfSections() {
+  return CategoryPage(key(), myMetricValidator, consoleLog_).numberOfSections();
+}
+
+std::optional<std::string> SecondLevelViewController::titleForHeaderInSection(std::size_t section) {
+  return CategoryPage(key(), myMetricValidator, consoleLog_).titleForHeaderInSection(section);
+}
+
+std::size_t SecondLevelViewController::numberOfRowsInSection(std::size_t section) {
+  return CategoryPage(key(), myMetricValidator, consoleLog_).numberOfRowsInSection(section);
+}
+
+void SecondLevelViewController::cellForRow(std::size_t section, std::size_t row, ListCell& cell) {
+  CategoryPage(key(), myMetricValidator, consoleLog_).cellForRow(section, row, cell);
+}
+
+double SecondLevelViewController::heightForRow(std::size_t, std::size_t) const { return automaticDimension; }
+
+double SecondLevelViewController::estimatedHeightForRow(std::size_t, std::size_t) const { return automaticDimension; }
+
+void SecondLevelViewController::viewDidLoad() {
+  ListPage::viewDidLoad();
+  timer_ = scheduler_.every(reloadInterval, [this] { update(); });
+}
+
+void SecondLevelViewController::update() { mainQueue_.post(reloadTask()); }
+
+std::string SecondLevelViewController::key() const {
+  if (!firstSelection || !seguedThroughRow) {
+    fatalError("a category page was asked for its rows before it was told its technology and category");
+  }
+  return pageKey(*firstSelection, *seguedThroughRow);
+}
+
+}  // namespace probeview
