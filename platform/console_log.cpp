@@ -1,0 +1,87 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "platform/console_log.h"
+
+#include <poll.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <cerrno>
+#include <csignal>
+#include <vector>
+
+#include "platform/fatal_error.h"
+
+namespace probeview {
+
+namespace {
+
+// The logs that live now; registered for the fatal stop as one, because a flush cannot be taken back.
+std::vector<ConsoleLog*>& livingLogs() {
+  static auto* logs = [] {
+    addFatalErrorFlush([] {
+      for (ConsoleLog* log : livingLogs()) log->flush();
+    });
+    // A write to a closed pipe must report an error, not end the process.
+    std::signal(SIGPIPE, SIG_IGN);
+    return new std::vector<ConsoleLog*>;
+  }();
+  return *logs;
+}
+
+bool writeAll(int fileDescriptor, std::string_view text) {
+  while (!text.empty()) {
+    const ssize_t written = ::write(fileDescriptor, text.data(), text.size());
+    if (written >= 0) {
+      text.remove_prefix(static_cast<std::size_t>(written));
+    } else if (errno == EAGAIN) {
+      // Somebody else made the descriptor non-blocking; a log line is not to be lost for that.
+      pollfd ready{fileDescriptor, POLLOUT, 0};
+      if (::poll(&ready, 1, -1) < 0 && errno != EINTR) return false;
+    } else if (errno != EINTR) {
+      return false;
+    }
+  }
+  return true;
+}
+
+LineSink*& chosenSink() {
+  static LineSink* sink = nullptr;
+  return sink;
+}
+
+}  // namespace
+
+ConsoleLog::ConsoleLog(int fileDescriptor) : fileDescriptor_(fileDescriptor) { livingLogs().push_back(this); }
+
+ConsoleLog::~ConsoleLog() {
+  flush();
+  std::erase(livingLogs(), this);
+}
+
+void ConsoleLog::line(std::string_view text) {
+  if (closed_) return;
+  held_ += text;
+  held_ += '\n';
+  if (openGroups_ == 0) flush();
+}
+
+void ConsoleLog::endGroup() {
+  if (openGroups_ > 0) --openGroups_;
+  if (openGroups_ == 0) flush();
+}
+
+void ConsoleLog::flush() {
+  if (held_.empty()) return;
+  if (!closed_ && !writeAll(fileDescriptor_, held_)) closed_ = true;
+  held_.clear();
+}
+
+LineSink& consoleLog() {
+  if (chosenSink() != nullptr) return *chosenSink();
+  static auto* standardOutput = new ConsoleLog(STDOUT_FILENO);
+  return *standardOutput;
+}
+
+void setConsoleLog(LineSink& sink) { chosenSink() = &sink; }
+
+}  // namespace probeview
