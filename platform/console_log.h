@@ -8,9 +8,9 @@
 
 namespace probeview {
 
-// Writes lines to a file descriptor: one write for each line, one for all lines of a group. What is held back is written
-// when the log is destroyed and when the program stops through fatalError(). A reader that has gone away (a closed
-// pipe, a full disk) silences the log and disturbs nobody else. Main thread.
+// Writes lines to a file descriptor: one write for each line, one for all lines of a group. What is held back is
+// written when the log is destroyed and when the program stops through fatalError(). A reader that has gone away (a
+// closed pipe, a full disk) silences the log and disturbs nobody else. Main thread.
 class ConsoleLog final : public LineSink {
  public:
   // The descriptor stays the caller's and must outlive the log.

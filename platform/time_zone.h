@@ -13,7 +13,7 @@ namespace probeview {
 struct ZonePeriod {
   std::int64_t from = 0;
   std::int64_t until = 0;
-  std::int64_t offset = 0;  // seconds to add to UTC, positive east of Greenwich
+  std::int64_t offset = 0;   // seconds to add to UTC, positive east of Greenwich
   std::string abbreviation;  // such as "CET"
 };
 

@@ -19,9 +19,9 @@ class TimestampFormatter {
   // The zone must outlive the formatter.
   explicit TimestampFormatter(const TimeZone& zone = deviceTimeZone());
 
-  // Milliseconds since 1970-01-01 UTC, floored to seconds. The year has at least four digits and is always whole, in the
-  // Gregorian calendar without end in both directions. A number that is not finite, or further than 9.2e18 seconds from
-  // 1970, is no time and stops the program. The text holds until the next call.
+  // Milliseconds since 1970-01-01 UTC, floored to seconds. The year has at least four digits and is always whole, in
+  // the Gregorian calendar without end in both directions. A number that is not finite, or further than 9.2e18 seconds
+  // from 1970, is no time and stops the program. The text holds until the next call.
   std::string_view format(double milliseconds);
 
  private:

@@ -1,0 +1,167 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "client/radix_wrapper.h"
+
+#include <charconv>
+#include <fstream>
+#include <span>
+#include <utility>
+#include <vector>
+
+#include "platform/serial_queue.h"
+#include "values/printer.h"
+
+namespace probeview {
+
+namespace {
+
+// Only this application may use the door.
+constexpr std::string_view applicationId = "probeview";
+// What every command says of itself to the service, whatever name gated the call.
+constexpr std::int64_t serviceAppId = 2;
+constexpr std::int64_t configurationPayloadType = 0;
+
+constexpr std::string_view blockName = "-[RadixWrapper listen]_block_invoke";
+
+Value widened(std::int32_t number) { return static_cast<std::int64_t>(number); }
+
+// The whole content, byte for byte; absent when the file cannot be read.
+std::optional<Value> readWholeFile(const std::string& path) {
+  std::ifstream file(path, std::ios::binary);
+  std::vector<char> content;
+  char block[4096];
+  while (file.read(block, sizeof block) || file.gcount() > 0)
+    content.insert(content.end(), block, block + file.gcount());
+  // The end of the file is how reading is meant to end; a folder fails otherwise.
+  if (!file.eof()) return std::nullopt;
+  return Value::bytes({reinterpret_cast<const std::uint8_t*>(content.data()), content.size()});
+}
+
+void appendInteger(std::int32_t number, std::string& out) { printNumber(static_cast<std::int64_t>(number), out); }
+
+}  // namespace
+
+struct RadixWrapper::Shared {
+  // Which operation of the delegate an event is for, and the word of its log line.
+  using Operation = void (RadixWrapperDelegate::*)(const Dictionary*);
+
+  TaskQueue& mainQueue;
+  LineSink& systemLog;
+  const Clock& clock;
+  Guarded<std::weak_ptr<RadixWrapperDelegate>> delegate;
+  std::optional<ServiceStatus::LastRecord> lastRecord;  // main thread
+
+  // On the wrapper's queue.
+  static void take(const std::shared_ptr<Shared>& shared, const radix::client::ObjectHandle& event,
+                   std::string_view eventName, Operation operation, bool isRecord) {
+    auto content = std::make_shared<const Dictionary>(radix::client::nativeDictionary(*event));
+    std::string line(blockName);
+    line += ": ";
+    line += eventName;
+    line += " dict=";
+    print(*content, line);
+    shared->systemLog.line(line);
+    if (shared->delegate.get().expired()) return;
+    shared->mainQueue.post([shared, content = std::move(content), operation, isRecord] {
+      const std::shared_ptr<RadixWrapperDelegate> delegate = shared->delegate.get().lock();
+      if (delegate == nullptr) return;
+      if (isRecord) shared->noteRecord(*content);
+      (*delegate.*operation)(content.get());
+    });
+  }
+
+  void noteRecord(const Dictionary& event) {
+    ServiceStatus::LastRecord record;
+    if (const Value* origin = event.find(radix::kKeyOrigin)) record.origin = origin->text().value_or("");
+    if (const Value* time = event.find(radix::kKeyTime); time != nullptr && time->int64()) {
+      record.time = std::chrono::milliseconds(*time->int64());
+    }
+    record.receivedWallTime = clock.wallTime();
+    record.receivedMonotonicTime = clock.monotonicTime();
+    lastRecord = std::move(record);
+  }
+};
+
+const std::shared_ptr<TaskQueue>& RadixWrapper::queue() {
+  // Never destroyed: the library may still hand it work while the process ends.
+  static const auto& theQueue =
+      *new std::shared_ptr<TaskQueue>(onceCreatedQueue("probeview.RadixWrapper.serialQ.queue"));
+  return theQueue;
+}
+
+RadixWrapper::RadixWrapper(radix::client::ManagerHandle manager, const Surroundings& surroundings)
+    : radixManager_(std::move(manager)),
+      shared_(new Shared{surroundings.mainQueue, surroundings.systemLog, surroundings.clock, {}, {}}) {}
+
+RadixWrapper::~RadixWrapper() = default;
+
+bool RadixWrapper::addTelemConfigForAppId(std::string_view appId, const std::string& protofFilePath) {
+  if (appId != applicationId) return false;
+  const std::optional<Value> payload = readWholeFile(protofFilePath);
+  if (!payload) return false;
+  return perform("-[RadixWrapper addTelemConfigForAppId:andProtofFilePath:]", radix::kCommandAddConfiguration,
+                 {{radix::kKeyAppID, serviceAppId},
+                  {radix::kKeyPayload, *payload},
+                  {radix::kKeyPayloadType, configurationPayloadType}});
+}
+
+bool RadixWrapper::removeTelemConfigForAppid(std::string_view appId) {
+  if (appId != applicationId) return false;
+  return perform("-[RadixWrapper removeTelemConfigForAppid:]", radix::kCommandClearConfiguration,
+                 {{radix::kKeyAppID, serviceAppId}});
+}
+
+bool RadixWrapper::querySpecificMetric(std::string_view appId, std::int32_t triggerRef, std::int32_t triggerType,
+                                       std::int32_t triggerID, std::int32_t profileID, std::int32_t metricID) {
+  if (appId != applicationId) return false;
+  return perform("-[RadixWrapper querySpecificMetric:triggerRef:triggerType:triggerID:profileID:metricID:]",
+                 radix::kCommandQueryMetric,
+                 {{radix::kKeyAppID, serviceAppId},
+                  {radix::kKeyPayloadType, configurationPayloadType},
+                  {radix::kKeyTriggerRef, widened(triggerRef)},
+                  {radix::kKeyTriggerType, widened(triggerType)},
+                  {radix::kKeyTriggerID, widened(triggerID)},
+                  {radix::kKeyProfileID, widened(profileID)},
+                  {radix::kKeyMetricID, widened(metricID)}});
+}
+
+bool RadixWrapper::perform(std::string_view operation, std::string_view command, const Dictionary& arguments) {
+  // The call keeps the manager alive by itself.
+  const radix::client::ManagerHandle manager = radixManager_;
+  radix::client::ObjectHandle reply;
+  const radix::client::Result result = radix::client::PerformCommand(manager, command, arguments, reply);
+  std::string line(operation);
+  line += ": error=";
+  appendInteger(result.status, line);
+  line += " msg=";
+  line += result.message;
+  shared_->systemLog.line(line);
+  return result.status == 0;
+}
+
+void RadixWrapper::listen() {
+  const radix::client::ManagerHandle manager = radixManager_;
+  radix::client::RegisterEventHandler(
+      manager, radix::kEventTrigger,
+      [shared = shared_](const radix::client::ObjectHandle& event, radix::client::Group) {
+        Shared::take(shared, event, "EventTrigger", &RadixWrapperDelegate::eventsDidUpdate, false);
+      });
+  radix::client::RegisterEventHandler(
+      manager, radix::kEventMetric, [shared = shared_](const radix::client::ObjectHandle& event, radix::client::Group) {
+        Shared::take(shared, event, "MetricsTrigger", &RadixWrapperDelegate::metricsDidUpdate, true);
+      });
+  radix::client::EventsOff(manager);
+  radix::client::EventsOn(manager);
+  shared_->systemLog.line("-[RadixWrapper listen]: listening for events");
+}
+
+std::shared_ptr<RadixWrapperDelegate> RadixWrapper::delegate() const { return shared_->delegate.get().lock(); }
+
+void RadixWrapper::setDelegate(std::weak_ptr<RadixWrapperDelegate> delegate) {
+  shared_->delegate.set(std::move(delegate));
+}
+
+ServiceStatus RadixWrapper::serviceStatus() const {
+  return {radix::client::Connection(radixManager_), shared_->lastRecord};
+}
+
+}  // namespace probeview
