@@ -14,7 +14,7 @@ class FirstLevelViewController final : public ListPage {
  public:
   static constexpr std::string_view cellIdentifier = "FirstClickView";
 
-  explicit FirstLevelViewController(const PageEnvironment& environment);
+  explicit FirstLevelViewController(const PageEnvironment& environment = {});
 
   // The technology that was tapped on the launch list. Absent, or a name that has no categories, stops the program as
   // soon as a row is asked for; only the launch list's hand-over sets it.

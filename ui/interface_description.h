@@ -13,7 +13,7 @@ namespace probeview {
 // only fill the destination.
 class InterfaceDescription {
  public:
-  explicit InterfaceDescription(const PageEnvironment& environment) : environment_(environment) {}
+  explicit InterfaceDescription(const PageEnvironment& environment = {}) : environment_(environment) {}
 
   std::unique_ptr<ListPage> makeRootPage() const;
   // Null when cells of this kind lead nowhere.

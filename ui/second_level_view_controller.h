@@ -16,7 +16,7 @@ class SecondLevelViewController final : public ListPage {
   static constexpr std::string_view cellIdentifier = "SecondClickView";
   static constexpr std::chrono::nanoseconds reloadInterval = std::chrono::seconds(5);
 
-  explicit SecondLevelViewController(const PageEnvironment& environment);
+  explicit SecondLevelViewController(const PageEnvironment& environment = {});
 
   VarnetViewItems tableViewFields;
   // The technology and the category; set before the page is shown, never changed. While either is absent each question
