@@ -1,0 +1,166 @@
+// SPDX-License-Identifier: Apache-2.0
+#include <fcntl.h>
+#include <gtest/gtest.h>
+#include <sys/socket.h>
+#include <unistd.h>
+
+#include <stdexcept>
+#include <string>
+#include <vector>
+
+#include "platform/console_log.h"
+#include "platform/fatal_error.h"
+#include "platform/system_log.h"
+
+namespace probeview {
+namespace {
+
+// Keeps each write apart: a datagram socket's records are the writes.
+class WriteWatch {
+ public:
+  WriteWatch() {
+    if (::socketpair(AF_UNIX, SOCK_SEQPACKET | SOCK_NONBLOCK, 0, ends_) != 0) throw std::runtime_error("socketpair");
+  }
+  ~WriteWatch() {
+    ::close(ends_[0]);
+    if (ends_[1] >= 0) ::close(ends_[1]);
+  }
+  int writingEnd() const { return ends_[0]; }
+  void closeReadingEnd() {
+    ::close(ends_[1]);
+    ends_[1] = -1;
+  }
+  std::vector<std::string> writes() const {
+    std::vector<std::string> all;
+    char buffer[65536];
+    for (ssize_t size; (size = ::read(ends_[1], buffer, sizeof buffer)) > 0;) {
+      all.emplace_back(buffer, static_cast<std::size_t>(size));
+    }
+    return all;
+  }
+
+ private:
+  int ends_[2];
+};
+
+using Writes = std::vector<std::string>;
+
+TEST(ConsoleLog, ALineOnItsOwnIsWrittenAtOnce) {
+  const WriteWatch watch;
+  ConsoleLog log(watch.writingEnd());
+  log.line("pushing metric file");
+  log.line("");
+  EXPECT_EQ(watch.writes(), (Writes{"pushing metric file\n", "\n"}));
+}
+
+TEST(ConsoleLog, TheLinesOfAGroupLeaveInOneWrite) {
+  const WriteWatch watch;
+  ConsoleLog log(watch.writingEnd());
+  {
+    const LineGroup outer(log);
+    log.line("one");
+    {
+      const LineGroup inner(log);
+      log.line("two");
+    }
+    EXPECT_EQ(watch.writes(), Writes{});
+    log.line("three");
+  }
+  EXPECT_EQ(watch.writes(), (Writes{"one\ntwo\nthree\n"}));
+}
+
+TEST(ConsoleLog, AFatalStopWritesWhatAGroupHeldBack) {
+  const WriteWatch watch;
+  ConsoleLog log(watch.writingEnd());
+  setFatalErrorObserver([&watch](std::string_view) {
+    EXPECT_EQ(watch.writes(), (Writes{"Metric ID in Hex = 3C4E04\n"}));
+    throw std::runtime_error("stopped");
+  });
+  {
+    const LineGroup group(log);
+    log.line("Metric ID in Hex = 3C4E04");
+    EXPECT_THROW(fatalError("a broken contract"), std::runtime_error);
+  }
+  setFatalErrorObserver({});
+  EXPECT_EQ(watch.writes(), Writes{});
+}
+
+TEST(ConsoleLog, ALogThatIsGoneIsNotFlushedByAFatalStop) {
+  const WriteWatch watch;
+  { ConsoleLog log(watch.writingEnd()); }
+  setFatalErrorObserver([](std::string_view) { throw std::runtime_error("stopped"); });
+  EXPECT_THROW(fatalError("a broken contract"), std::runtime_error);
+  setFatalErrorObserver({});
+}
+
+TEST(ConsoleLog, SurvivesAClosedPipe) {
+  int ends[2];
+  ASSERT_EQ(::pipe(ends), 0);
+  ::close(ends[0]);
+  {
+    ConsoleLog log(ends[1]);
+    log.line("nobody reads this");
+    EXPECT_TRUE(log.closed());
+    log.line("nor this");
+  }
+  ::close(ends[1]);
+}
+
+TEST(ConsoleLog, WaitsForASlowReaderInsteadOfLosingLines) {
+  int ends[2];
+  ASSERT_EQ(::pipe2(ends, O_NONBLOCK), 0);
+  const std::string line(100'000, 'x');  // more than a pipe holds
+  std::string read;
+  const pid_t child = ::fork();
+  if (child == 0) {
+    ::close(ends[0]);
+    {
+      ConsoleLog log(ends[1]);
+      log.line(line);
+    }
+    ::_exit(0);
+  }
+  ::close(ends[1]);
+  ::fcntl(ends[0], F_SETFL, 0);
+  char buffer[4096];
+  for (ssize_t size; (size = ::read(ends[0], buffer, sizeof buffer)) > 0;) {
+    read.append(buffer, static_cast<std::size_t>(size));
+  }
+  EXPECT_EQ(read, line + "\n");
+  ::close(ends[0]);
+}
+
+TEST(ConsoleLog, AProgramMayChooseAnotherSink) {
+  class Collected final : public LineSink {
+   public:
+    void line(std::string_view text) override { lines.emplace_back(text); }
+    std::vector<std::string> lines;
+  };
+  static Collected collected;
+  setConsoleLog(collected);
+  consoleLog().line("Querying SIM files");
+  EXPECT_EQ(collected.lines, (Writes{"Querying SIM files"}));
+}
+
+TEST(SystemLog, EachLineIsEchoedToStandardErrorInOneWrite) {
+  const WriteWatch watch;
+  const int before = ::dup(STDERR_FILENO);
+  ASSERT_GE(::dup2(watch.writingEnd(), STDERR_FILENO), 0);
+  SystemLog("probeview").line("-[RadixWrapper listen]: listening for %s events");
+  ::dup2(before, STDERR_FILENO);
+  ::close(before);
+  EXPECT_EQ(watch.writes(), (Writes{"-[RadixWrapper listen]: listening for %s events\n"}));
+}
+
+TEST(SystemLog, SurvivesAClosedStandardError) {
+  WriteWatch watch;
+  watch.closeReadingEnd();
+  const int before = ::dup(STDERR_FILENO);
+  ASSERT_GE(::dup2(watch.writingEnd(), STDERR_FILENO), 0);
+  SystemLog("probeview").line("nobody reads this");
+  ::dup2(before, STDERR_FILENO);
+  ::close(before);
+}
+
+}  // namespace
+}  // namespace probeview
