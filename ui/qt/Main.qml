@@ -1,0 +1,142 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// The window: title bar, the stack of pages, status line.
+import QtQuick
+import QtQuick.Controls
+
+ApplicationWindow {
+    id: window
+
+    // What the window shows and asks; made in C++.
+    required property var viewer
+    readonly property QtObject theme: Theme
+
+    width: 400
+    height: 800
+    minimumWidth: 240
+    minimumHeight: 320
+    title: stack.currentItem ? "probeview – " + stack.currentItem.page.title : "probeview"
+    color: Theme.ground
+
+    palette.window: Theme.ground
+    palette.windowText: Theme.text
+    palette.base: Theme.card
+    palette.text: Theme.text
+    palette.button: Theme.bar
+    palette.buttonText: Theme.text
+    palette.highlight: Theme.accent
+
+    property bool keyboardUsed: false
+
+    Binding {
+        target: Theme
+        property: "dark"
+        value: window.viewer.dark
+    }
+    Binding {
+        target: Theme
+        property: "textScale"
+        value: window.viewer.textScale
+    }
+    Binding {
+        target: Theme
+        property: "valueFamily"
+        value: window.viewer.valueFamily
+    }
+
+    function open(row) {
+        // A second tap while a page still slides in is not meant for the page beneath.
+        if (stack.busy)
+            return;
+        const page = viewer.open(row);
+        if (page)
+            stack.push(pageView, { page: page });
+    }
+
+    function back() {
+        if (stack.busy || stack.depth < 2)
+            return;
+        viewer.back();
+        stack.pop();
+    }
+
+    function backByKey() {
+        keyboardUsed = true;
+        back();
+    }
+
+    header: TitleBar {
+        context: stack.depth > 2 ? stack.get(stack.depth - 2).page.title : ""
+        title: stack.currentItem ? stack.currentItem.page.title : ""
+        canGoBack: stack.depth > 1
+        onBackRequested: window.back()
+    }
+
+    footer: StatusLine {
+        visible: text !== ""
+        text: window.viewer.statusText
+    }
+
+    Component {
+        id: pageView
+
+        PageView {
+            keyboardUsed: window.keyboardUsed
+            onRowOpened: row => window.open(row)
+            onKeyPressed: window.keyboardUsed = true
+            StackView.onActivated: {
+                forceActiveFocus();
+                if (window.keyboardUsed && list.currentIndex < 0)
+                    select(page.rowAfter(-1));
+            }
+            // Until now the page was still on the screen, sliding out.
+            StackView.onRemoved: window.viewer.release(page)
+        }
+    }
+
+    StackView {
+        id: stack
+        objectName: "stack"
+
+        anchors.fill: parent
+        focus: true
+
+        Component.onCompleted: push(pageView, { page: window.viewer.firstPage }, StackView.Immediate)
+
+        component Slide: NumberAnimation {
+            property: "x"
+            duration: Theme.slide
+            easing.type: Easing.OutCubic
+        }
+        pushEnter: Transition { Slide { from: stack.width; to: 0 } }
+        pushExit: Transition { Slide { from: 0; to: -stack.width / 4 } }
+        popEnter: Transition { Slide { from: -stack.width / 4; to: 0 } }
+        popExit: Transition { Slide { from: 0; to: stack.width } }
+
+        Keys.onEscapePressed: window.backByKey()
+        Keys.onBackPressed: window.backByKey()
+        Keys.onPressed: event => {
+            if (event.key === Qt.Key_Left && (event.modifiers & Qt.AltModifier)) {
+                window.backByKey();
+                event.accepted = true;
+            }
+        }
+    }
+
+    // Whoever touches the screen or the mouse needs no ring around the current row.
+    PointHandler {
+        parent: window.contentItem
+        acceptedButtons: Qt.AllButtons
+        onActiveChanged: {
+            if (active)
+                window.keyboardUsed = false;
+        }
+    }
+
+    // The mouse's own back button, wherever the pointer is.
+    MouseArea {
+        anchors.fill: parent
+        acceptedButtons: Qt.BackButton
+        onClicked: window.back()
+    }
+}

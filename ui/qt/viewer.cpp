@@ -1,0 +1,66 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "ui/qt/viewer.h"
+
+#include <QFontDatabase>
+#include <QFontInfo>
+#include <utility>
+
+#include "ui/status_line.h"
+
+namespace probeview::qt {
+
+namespace {
+
+// Digits of equal width, so that a value that changes does not dance. Empty if this machine has no such font.
+QString equalWidthFamily() {
+  const QFontInfo info(QFontDatabase::systemFont(QFontDatabase::FixedFont));
+  return info.fixedPitch() ? info.family() : QString();
+}
+
+}  // namespace
+
+Viewer::Viewer(NavigationStack& stack, StatusText status, Scheduler& scheduler, Appearance& appearance)
+    : stack_(stack),
+      appearance_(appearance),
+      valueFamily_(equalWidthFamily()),
+      status_(std::move(status)),
+      firstPage_(new PageModel(stack.topPage(), this)),
+      top_{firstPage_} {
+  stack_.setObserver(this);
+  connect(&appearance, &Appearance::changed, this, &Viewer::appearanceChanged);
+  if (!status_) return;
+  refreshStatus();
+  statusTimer_ = scheduler.every(StatusLine::refreshInterval, [this] { refreshStatus(); });
+}
+
+Viewer::~Viewer() { stack_.setObserver(nullptr); }
+
+void Viewer::refreshStatus() {
+  const auto text = QString::fromStdString(status_());
+  if (statusText_ == text) return;
+  statusText_ = text;
+  emit statusChanged();
+}
+
+QObject* Viewer::open(int row) {
+  const auto* tapped = topPage()->cell(row);
+  if (!tapped) return nullptr;
+  // A copy: the page may reload while its destination is made.
+  const ListCell cell = *tapped;
+  return stack_.tap(cell) ? topPage() : nullptr;
+}
+
+void Viewer::back() { stack_.pop(); }
+
+void Viewer::release(QObject* page) {
+  if (page) page->deleteLater();
+}
+
+void Viewer::didPush(ListPage& page) { top_.push_back(new PageModel(page, this)); }
+
+void Viewer::willPop(ListPage&) {
+  top_.back()->detach();
+  top_.pop_back();
+}
+
+}  // namespace probeview::qt
