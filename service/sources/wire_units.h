@@ -18,7 +18,7 @@
 #include <optional>
 #include <string_view>
 
-namespace probeview::wire {
+namespace probeview::units {
 
 struct Quantity {
   std::string_view name;
@@ -92,4 +92,4 @@ inline std::uint32_t lteServingUplinkBandwidth(double megahertz) {
   return static_cast<std::uint32_t>(std::lround(std::max(megahertz, 0.0)));
 }
 
-}  // namespace probeview::wire
+}  // namespace probeview::units

@@ -5,7 +5,7 @@
 
 #include <limits>
 
-namespace probeview::wire {
+namespace probeview::units {
 namespace {
 
 struct Case {
@@ -80,4 +80,4 @@ TEST(WireUnits, TheServingDownlinkBandwidthSurvivesBeingHalvedTwice) {
 }
 
 }  // namespace
-}  // namespace probeview::wire
+}  // namespace probeview::units
