@@ -31,8 +31,8 @@ enum Column : std::size_t {
   NeighbourLevel,
   NeighbourQuality,
 };
-constexpr std::array<std::string_view, 10> columnNames = {"Timestamp", "NetworkMode", "RSRP",      "RSRQ",    "SNR",
-                                                          "State",     "LACHEX",      "RAWCELLID", "NRxRSRP", "NRxRSRQ"};
+constexpr std::array<std::string_view, 10> columnNames = {
+    "Timestamp", "NetworkMode", "RSRP", "RSRQ", "SNR", "State", "LACHEX", "RAWCELLID", "NRxRSRP", "NRxRSRQ"};
 using Fields = std::array<std::string_view, columnNames.size()>;
 
 // The levels that the logger wrote when it knew nothing.
@@ -44,9 +44,9 @@ struct TechnologyName {
   TraceTechnology technology;
 };
 constexpr TechnologyName technologyNames[] = {
-    {"LTE", TraceTechnology::Lte},    {"5G", TraceTechnology::Lte},    {"UMTS", TraceTechnology::Umts},
+    {"LTE", TraceTechnology::Lte},    {"5G", TraceTechnology::Lte},     {"UMTS", TraceTechnology::Umts},
     {"HSDPA", TraceTechnology::Umts}, {"HSUPA", TraceTechnology::Umts}, {"HSPA", TraceTechnology::Umts},
-    {"HSPA+", TraceTechnology::Umts}, {"GSM", TraceTechnology::Gsm},   {"GPRS", TraceTechnology::Gsm},
+    {"HSPA+", TraceTechnology::Umts}, {"GSM", TraceTechnology::Gsm},    {"GPRS", TraceTechnology::Gsm},
     {"EDGE", TraceTechnology::Gsm},
 };
 
@@ -144,8 +144,8 @@ class Reader {
       readRow(line);
     }
     if (log_.rows.empty()) {
-      return {std::nullopt,
-              log_.problems.empty() ? "it has a line of column names, but no rows" : "no row is usable; " + log_.problems[0]};
+      return {std::nullopt, log_.problems.empty() ? "it has a line of column names, but no rows"
+                                                  : "no row is usable; " + log_.problems[0]};
     }
     return {std::move(log_), {}};
   }
@@ -354,7 +354,7 @@ TraceTextResult readTraceFile(const std::string& path) {
   // Without blocking, in case somebody names a pipe that nobody writes to.
   const FileDescriptor file(::open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK));
   if (!file) return {std::nullopt, systemError(errno)};
-  struct stat status{};
+  struct stat status {};
   std::string error;
   std::string text;
   if (::fstat(file.number(), &status) != 0) {
@@ -362,8 +362,8 @@ TraceTextResult readTraceFile(const std::string& path) {
   } else if (!S_ISREG(status.st_mode)) {
     error = "it is no regular file";
   } else if (static_cast<std::uint64_t>(status.st_size) > traceFileSizeLimit) {
-    error = "it has " + std::to_string(status.st_size) + " bytes, more than the " +
-            std::to_string(traceFileSizeLimit) + " that a trace may have; split it";
+    error = "it has " + std::to_string(status.st_size) + " bytes, more than the " + std::to_string(traceFileSizeLimit) +
+            " that a trace may have; split it";
   } else {
     text.resize(static_cast<std::size_t>(status.st_size));
     std::size_t length = 0;

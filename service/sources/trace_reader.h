@@ -5,8 +5,9 @@
 //
 // Columns are found by name, in any order, others may stand between them:
 //   Timestamp          yyyy.MM.dd_HH.mm.ss, taken as UTC
-//   NetworkMode        LTE, 5G (the values are those of the LTE anchor), UMTS, HSDPA, HSUPA, HSPA, HSPA+, GSM, GPRS, EDGE
-//   RSRP, RSRQ         the serving cell's level and quality: RSRP dBm and RSRQ dB on LTE, CPICH RSCP dBm and Ec/No dB on
+//   NetworkMode        LTE, 5G (the values are those of the LTE anchor), UMTS, HSDPA, HSUPA, HSPA, HSPA+, GSM, GPRS,
+//   EDGE RSRP, RSRQ         the serving cell's level and quality: RSRP dBm and RSRQ dB on LTE, CPICH RSCP dBm and Ec/No
+//   dB on
 //                      UMTS, RXLEV in dBm and RXQUAL 0…7 on GSM
 //   SNR                signal to noise ratio in dB, on LTE
 //   State              I (idle), D (data), V (voice), VD (both)
@@ -36,8 +37,8 @@ struct TraceActivity {
 };
 
 struct TraceRow {
-  std::uint32_t line = 0;              // in the file, from 1
-  std::chrono::milliseconds time{};    // since 1970-01-01 UTC
+  std::uint32_t line = 0;                     // in the file, from 1
+  std::chrono::milliseconds time{};           // since 1970-01-01 UTC
   std::optional<TraceTechnology> technology;  // absent: no service
   std::optional<TraceActivity> activity;
   std::optional<std::uint32_t> cellIdentity;  // LTE: 28-bit ECI; UMTS: 28 bits; GSM: 16 bits

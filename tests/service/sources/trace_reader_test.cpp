@@ -78,26 +78,24 @@ TEST(TraceReader, ADashAndAnEmptyFieldAreNoValue) {
 
 TEST(TraceReader, ThePairThatTheLoggerWroteWhenItKnewNothingIsNoValue) {
   for (const char* mode : {"LTE", "UMTS"}) {
-    const TraceLog log = read(traceHeader + TraceLine{.mode = mode,
-                                                      .level = "-51.0",
-                                                      .quality = "-24.0",
-                                                      .neighbourLevel = "-51.0",
-                                                      .neighbourQuality = "-24.0"}
-                                                .text());
+    const TraceLog log = read(
+        traceHeader +
+        TraceLine{
+            .mode = mode, .level = "-51.0", .quality = "-24.0", .neighbourLevel = "-51.0", .neighbourQuality = "-24.0"}
+            .text());
     EXPECT_FALSE(log.rows[0].level || log.rows[0].quality || log.rows[0].neighbourLevel ||
                  log.rows[0].neighbourQuality);
-    const TraceLog half =
-        read(traceHeader + TraceLine{.mode = mode, .level = "-51", .quality = "-10"}.text());
+    const TraceLog half = read(traceHeader + TraceLine{.mode = mode, .level = "-51", .quality = "-10"}.text());
     EXPECT_EQ(half.rows[0].level, -51);
     EXPECT_EQ(half.rows[0].quality, -10);
   }
 }
 
 TEST(TraceReader, OnGsmTheLevelAloneSaysThatTheLoggerKnewNothing) {
-  const TraceLog log = read(
-      traceHeader +
-      TraceLine{.mode = "EDGE", .level = "-51", .quality = "3", .neighbourLevel = "-51.0", .neighbourQuality = "-"}
-          .text());
+  const TraceLog log =
+      read(traceHeader +
+           TraceLine{.mode = "EDGE", .level = "-51", .quality = "3", .neighbourLevel = "-51.0", .neighbourQuality = "-"}
+               .text());
   EXPECT_EQ(log.rows[0].level, std::nullopt);
   EXPECT_EQ(log.rows[0].quality, 3);
   EXPECT_EQ(log.rows[0].neighbourLevel, std::nullopt);
@@ -152,8 +150,8 @@ TEST(TraceReader, AnAreaThatIsNotWrittenDownLeavesTheCellItsIdentity) {
 }
 
 TEST(TraceReader, ANumberThatCannotBeMeasuredIsLeftOutAndReportedWithItsLine) {
-  const TraceLog log = read(
-      traceHeader + TraceLine{.level = "-95", .neighbourLevel = "-74.0", .neighbourQuality = "-225.0"}.text());
+  const TraceLog log =
+      read(traceHeader + TraceLine{.level = "-95", .neighbourLevel = "-74.0", .neighbourQuality = "-225.0"}.text());
   ASSERT_EQ(log.rows.size(), 1u);
   EXPECT_EQ(log.rows[0].level, -95);
   EXPECT_EQ(log.rows[0].neighbourLevel, -74);
@@ -168,14 +166,18 @@ TEST(TraceReader, ABadRowIsReportedWithItsLineAndSkipped) {
     const char* problem;
   } cases[] = {
       {"1,2,3\n", "line 3: has 3 fields, not 26; row skipped"},
-      {TraceLine{.time = "2024-03-05 12:00:00"}.text(), "line 3: Timestamp is \"2024-03-05 12:00:00\", not "
-                                                        "yyyy.MM.dd_HH.mm.ss; row skipped"},
-      {TraceLine{.time = "2024.02.30_12.00.00"}.text(), "line 3: Timestamp is \"2024.02.30_12.00.00\", not "
-                                                        "yyyy.MM.dd_HH.mm.ss; row skipped"},
-      {TraceLine{.time = "2024.03.05_24.00.00"}.text(), "line 3: Timestamp is \"2024.03.05_24.00.00\", not "
-                                                        "yyyy.MM.dd_HH.mm.ss; row skipped"},
-      {TraceLine{.mode = "TETRA"}.text(), "line 3: NetworkMode is \"TETRA\", which is no technology that is known; "
-                                          "row skipped"},
+      {TraceLine{.time = "2024-03-05 12:00:00"}.text(),
+       "line 3: Timestamp is \"2024-03-05 12:00:00\", not "
+       "yyyy.MM.dd_HH.mm.ss; row skipped"},
+      {TraceLine{.time = "2024.02.30_12.00.00"}.text(),
+       "line 3: Timestamp is \"2024.02.30_12.00.00\", not "
+       "yyyy.MM.dd_HH.mm.ss; row skipped"},
+      {TraceLine{.time = "2024.03.05_24.00.00"}.text(),
+       "line 3: Timestamp is \"2024.03.05_24.00.00\", not "
+       "yyyy.MM.dd_HH.mm.ss; row skipped"},
+      {TraceLine{.mode = "TETRA"}.text(),
+       "line 3: NetworkMode is \"TETRA\", which is no technology that is known; "
+       "row skipped"},
       {TraceLine{.state = "DX"}.text(), "line 3: State is \"DX\", not I, D, V or VD; row skipped"},
       {TraceLine{.state = "DD"}.text(), "line 3: State is \"DD\", not I, D, V or VD; row skipped"},
       {TraceLine{.level = "-95dBm"}.text(), "line 3: RSRP is \"-95dBm\", not a number; row skipped"},
@@ -183,10 +185,12 @@ TEST(TraceReader, ABadRowIsReportedWithItsLineAndSkipped) {
       {TraceLine{.snr = "1e999"}.text(), "line 3: SNR is \"1e999\", not a number; row skipped"},
       {TraceLine{.neighbourLevel = "\x1b[2J"}.text(), "line 3: NRxRSRP is \"\\u{1b}[2J\", not a number; row skipped"},
       {TraceLine{.cell = "12AB"}.text(), "line 3: RAWCELLID is \"12AB\", not a number; row skipped"},
-      {TraceLine{.area = "XYZ"}.text(), "line 3: LACHEX is \"XYZ\", not an area code of 16 bits in hexadecimal; row "
-                                        "skipped"},
-      {TraceLine{.area = "12345"}.text(), "line 3: LACHEX is \"12345\", not an area code of 16 bits in hexadecimal; "
-                                          "row skipped"},
+      {TraceLine{.area = "XYZ"}.text(),
+       "line 3: LACHEX is \"XYZ\", not an area code of 16 bits in hexadecimal; row "
+       "skipped"},
+      {TraceLine{.area = "12345"}.text(),
+       "line 3: LACHEX is \"12345\", not an area code of 16 bits in hexadecimal; "
+       "row skipped"},
       {std::string(5000, 'x') + "\n", "line 3: is longer than 4096 bytes; row skipped"},
   };
   for (const auto& each : cases) {
