@@ -1,0 +1,11 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include "tools/subcommand.h"
+
+namespace probeview {
+
+// probectl store --batch: one store fed by hand, without a service; its answers are JSON.
+void addStoreCommand(CLI::App& program, Tool& tool);
+
+}  // namespace probeview
