@@ -28,7 +28,8 @@ ExitStatus runStoreBatch(Tool& tool) {
 
 void addStoreCommand(CLI::App& program, Tool& tool) {
   CLI::App* command = program.add_subcommand("store", "Feed a store by hand and look at what it keeps and shows");
-  command->add_flag("--batch", "Read commands from standard input, one a line, and answer each with a line of JSON")
+  command->add_flag("--batch")
+      ->description("Read commands from standard input, one a line, and answer each with a line of JSON")
       ->required();
   command->footer(
       "Commands: event ID HEX, trigger, dict NAME, record LTE|UMTS|GSM|Common, state, page KEY, pages, reset.\n"

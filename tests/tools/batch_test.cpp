@@ -1,0 +1,71 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "tools/batch.h"
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include <limits>
+#include <sstream>
+
+namespace probeview {
+namespace {
+
+using ::testing::ElementsAre;
+using ::testing::Optional;
+
+TEST(BatchInput, HandsOutLinesOfAnyBytesWithoutBlankOnesAndComments) {
+  std::istringstream stream(std::string("one\n\n# no\n  \t\r\ntwo\0\xff\r\n #three\nlast", 34));
+  BatchInput input(stream);
+  std::vector<std::string> lines;
+  while (input.next()) lines.emplace_back(input.line());
+  EXPECT_THAT(lines, ElementsAre("one", std::string("two\0\xff\r", 6), " #three", "last"));
+}
+
+TEST(BatchInput, ALineThatIsTooLongIsReadPastAndTheNextIsWhole) {
+  std::istringstream stream("12345\n123456\n1234567\n12\n");
+  BatchInput input(stream, 5);
+  ASSERT_TRUE(input.next());
+  EXPECT_EQ(input.line(), "12345");
+  EXPECT_FALSE(input.tooLong());
+  for (int count = 0; count < 2; ++count) {
+    ASSERT_TRUE(input.next());
+    EXPECT_TRUE(input.tooLong());
+    EXPECT_EQ(input.line(), "");
+  }
+  ASSERT_TRUE(input.next());
+  EXPECT_EQ(input.line(), "12");
+  EXPECT_FALSE(input.next());
+}
+
+TEST(BatchOutput, AnErrorIsOneObjectWhateverItSays) {
+  std::ostringstream stream;
+  BatchOutput(stream).error("a \"b\"\n\xff");
+  EXPECT_EQ(stream.str(), "{\"error\":\"a \\\"b\\\"\\n\xEF\xBF\xBD\"}\n");
+}
+
+TEST(BatchWords, AreSplitAtBlanksAndNoMoreThanAreOfUse) {
+  EXPECT_THAT(splitWords(" a\tbc  d\r"), ElementsAre("a", "bc", "d"));
+  EXPECT_THAT(splitWords(""), ElementsAre());
+  EXPECT_EQ(splitWords(std::string(1000, ' ') + "a b c d e f g h i j k").size(), mostWords);
+}
+
+TEST(BatchHex, EitherCaseAndADashForNothing) {
+  EXPECT_THAT(parseHex("00fFaB"), Optional(ElementsAre(0x00, 0xff, 0xab)));
+  EXPECT_THAT(parseHex("-"), Optional(ElementsAre()));
+  for (const char* bad : {"", "0", "0x00", "zz", "000", "--", "0-"}) EXPECT_EQ(parseHex(bad), std::nullopt) << bad;
+}
+
+TEST(BatchInteger, DecimalHexadecimalAndNegativeInSixtyFourBits) {
+  EXPECT_EQ(parseInteger64("3952132"), 3952132);
+  EXPECT_EQ(parseInteger64("0x3C4E04"), 0x3C4E04);
+  EXPECT_EQ(parseInteger64("0X3c4e04"), 0x3C4E04);
+  EXPECT_EQ(parseInteger64("-9223372036854775808"), std::numeric_limits<std::int64_t>::min());
+  EXPECT_EQ(parseInteger64("0xFFFFFFFFFFFFFFFF"), -1);
+  for (const char* bad :
+       {"", "-", "+1", "1 ", "0x", "0x-1", "-0x1", "1.0", "9223372036854775808", "0x10000000000000000"}) {
+    EXPECT_EQ(parseInteger64(bad), std::nullopt) << bad;
+  }
+}
+
+}  // namespace
+}  // namespace probeview
