@@ -1,0 +1,89 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "messages/runtime/codable.h"
+
+#include "messages/runtime/table_walker.h"
+#include "values/printer.h"
+
+namespace probeview {
+
+bool PBCodable::readFrom(PBDataReader& reader) { return TableWalker::decode(*this, reader); }
+
+void PBCodable::writeTo(PBDataWriter& writer) const { TableWalker::encode(*this, writer); }
+
+Dictionary PBCodable::dictionaryRepresentation() const { return TableWalker::dictionary(*this, descriptor()); }
+
+std::string PBCodable::description() const {
+  std::string text(className());
+  text += ' ';
+  print(dictionaryRepresentation(), text);
+  return text;
+}
+
+bool PBCodable::copyTo(PBCodable& target) const {
+  if (&descriptor() != &target.descriptor()) return false;
+  TableWalker::copy(target, *this, descriptor());
+  return true;
+}
+
+bool PBCodable::mergeFrom(const PBCodable& other) {
+  if (&descriptor() != &other.descriptor()) return false;
+  TableWalker::merge(*this, other, descriptor());
+  return true;
+}
+
+bool PBCodable::isEqual(const PBCodable& other) const noexcept {
+  return &descriptor() == &other.descriptor() && TableWalker::areEqual(*this, other, descriptor());
+}
+
+std::unique_ptr<PBCodable> PBCodable::copyWithZone() const {
+  std::unique_ptr<PBCodable> copy = descriptor().make();
+  copy->copyFrom(*this);
+  return copy;
+}
+
+std::uint64_t PBCodable::hash() const noexcept { return TableWalker::hash(*this, descriptor()); }
+
+bool PBCodable::hasField(const FieldDescriptor& field) const noexcept { return TableWalker::isPresent(*this, field); }
+
+void PBCodable::reset() {
+  // Taken out of the message while a new one is made in its place.
+  Block* block = block_;
+  const bool isElement = isElement_;
+  const bool isDestroyedLater = isDestroyedLater_;
+  block_ = nullptr;
+  descriptor().renew(*this);
+  isElement_ = isElement;
+  isDestroyedLater_ = isDestroyedLater;
+  if (block == nullptr) return;
+  if (isElement) {
+    block_ = block;
+  } else if (block->isUnique()) {
+    block->rewind();
+    block_ = block;
+  } else {
+    block->release();  // an element that lies in it is still shared
+  }
+}
+
+void PBCodable::copyFrom(const PBCodable& other) {
+  const MessageDescriptor& fields = other.descriptor();
+  Block* block = fields.isFlat || isElement_ ? nullptr : &TableWalker::blockOf(*this);
+  TableWalker::copyDeep(*this, other, fields, block);
+}
+
+void PBCodable::moveFrom(PBCodable& other) noexcept {
+  // What lies in a block that others use too stays there.
+  if (other.isElement_) {
+    copyFrom(other);
+  } else {
+    TableWalker::move(*this, other, other.descriptor());
+  }
+}
+
+void PBCodable::assignFrom(const PBCodable& other) {
+  if (this == &other) return;
+  reset();
+  copyFrom(other);
+}
+
+}  // namespace probeview

@@ -1,0 +1,224 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// How a message class is written: as the table of its fields, one row each, in the order number, key of the dictionary
+// form, property, type. A row makes the member, the accessors and the field's descriptor. A number used twice in one
+// class, or a type or name that is mistyped, does not compile.
+//
+//   class KCellularLteTxPower final : public PBCodable {
+//     PB_MESSAGE(KCellularLteTxPower)
+//     PB_FIELD(1, "timestamp",     timestamp,    Timestamp,    uint64);
+//     PB_LIST (2, "tx_power_info", txPowerInfos, TxPowerInfos, txPowerInfo, TxPowerInfo,
+//     repeated<message<TxPowerInfo>>);
+//   };
+//
+// and, in one source file, PB_DEFINE(KCellularLteTxPower). The accessors that the rows make:
+//
+//   PB_FIELD   a number or truth value: timestamp(), setTimestamp(value), hasTimestamp(), setHasTimestamp(present).
+//              A field that is not present reads as 0; its last value is back when it is made present again.
+//   PB_OBJECT  bytes, a text or a single nested message: guti(), setGuti(value), hasGuti(); setGuti(nullptr) takes it
+//              away. Absent bytes and texts read as empty, an absent message as null.
+//   PB_LIST    nested messages: txPowerInfos() to walk through them, setTxPowerInfos(list), clearTxPowerInfos(),
+//              addTxPowerInfo(handle or message), addTxPowerInfo() for a new one, txPowerInfosCount(),
+//              txPowerInfoAtIndex(index). Handles share, messages are copied.
+//   PB_VALUES  repeated numbers: csTxPwrs(), csTxPwrsCount(), clearCsTxPwrs(), addCsTxPwr(value),
+//              csTxPwrAtIndex(index), setCsTxPwrs(values, count).
+//   An index that is too large throws std::out_of_range, "idx (7) is out of range (3)".
+#pragma once
+
+#include <array>
+#include <new>
+#include <span>
+
+#include "messages/runtime/codable.h"
+#include "messages/runtime/metric_utility.h"
+
+namespace probeview {
+
+template <unsigned Number>
+struct FieldNumber {};
+
+namespace detail {
+
+template <typename Message, unsigned Number>
+inline constexpr bool hasField = requires {
+  Message::pbField(FieldNumber<Number>{});
+};
+
+template <typename Message>
+consteval std::size_t countFields() {
+  return []<std::size_t... Numbers>(std::index_sequence<Numbers...>) {
+    return (std::size_t{0} + ... + std::size_t{hasField<Message, Numbers>});
+  }
+  (std::make_index_sequence<fieldNumberLimit>{});
+}
+
+// No key of a field with a number of 16 bits.
+inline constexpr std::uint32_t neverRead = 0xFFFFFFFF;
+
+// All rows of the class, ordered by number whatever their order in the class, and the row that ends them.
+template <typename Message>
+consteval auto collectFields() {
+  std::array<FieldDescriptor, countFields<Message>() + 1> rows;
+  std::size_t count = 0;
+  const auto collect = [&]<std::size_t Number>() {
+    if constexpr (hasField<Message, Number>) rows[count++] = Message::pbField(FieldNumber<Number>{});
+  };
+  [&]<std::size_t... Numbers>(std::index_sequence<Numbers...>) { (collect.template operator()<Numbers>(), ...); }
+  (std::make_index_sequence<fieldNumberLimit>{});
+  for (FieldDescriptor& row : rows) {
+    // A number that is also that of a metric must go the long way, where it is dropped.
+    row.expectedKey = row.key == 0 || KBBMetricUtility::isMetricId(row.number) ? neverRead : row.key;
+  }
+  return rows;
+}
+
+template <typename Message>
+inline constexpr auto fieldRows = collectFields<Message>();
+
+constexpr std::uint16_t scalarBound(const FieldDescriptor& row) noexcept {
+  const std::size_t keySize = wire::varintSize(row.key);
+  switch (row.kind) {
+    case FieldKind::UInt64:
+    case FieldKind::Int32:  // negative numbers take ten bytes
+    case FieldKind::Enumeration:
+      return static_cast<std::uint16_t>(keySize + 10);
+    case FieldKind::UInt32:
+    case FieldKind::SInt32:
+      return static_cast<std::uint16_t>(keySize + 5);
+    case FieldKind::Bool:
+      return static_cast<std::uint16_t>(keySize + 1);
+    case FieldKind::Bytes:
+    case FieldKind::Text:
+    case FieldKind::Message:
+    case FieldKind::RepeatedMessage:
+    case FieldKind::RepeatedUInt32:
+    case FieldKind::RepeatedSInt32:
+      return 0;
+  }
+  return 0;
+}
+
+template <typename Message>
+consteval MessageDescriptor describeMessage(std::string_view name) {
+  constexpr std::size_t count = fieldRows<Message>.size() - 1;
+  MessageDescriptor descriptor{};
+  descriptor.name = name;
+  descriptor.rows = fieldRows<Message>.data();
+  descriptor.rowCount = count;
+  descriptor.rowOfNumber.fill(count);
+  descriptor.isFlat = true;
+  for (std::size_t index = 0; index < count; ++index) {
+    const FieldDescriptor& row = fieldRows<Message>[index];
+    descriptor.rowOfNumber[row.number] = static_cast<std::uint8_t>(index);
+    descriptor.scalarBound = static_cast<std::uint16_t>(descriptor.scalarBound + scalarBound(row));
+    if (!isScalar(row.kind)) descriptor.isFlat = false;
+  }
+  descriptor.size = sizeof(Message);
+  descriptor.makeElement = [](void* memory, Block& block) -> PBCodable* { return Message::make(memory, block); };
+  descriptor.make = []() -> std::unique_ptr<PBCodable> { return std::make_unique<Message>(); };
+  descriptor.renew = [](PBCodable& message) { Message::renew(static_cast<Message&>(message)); };
+  return descriptor;
+}
+
+}  // namespace detail
+
+// Macros, because a row must make names: of a member, of its accessors and of its descriptor.
+
+#define PB_MESSAGE(Class)                                                                                \
+ public:                                                                                                 \
+  Class() noexcept = default;                                                                            \
+  Class(const Class& other) : PBCodable() { copyFrom(other); }                                           \
+  Class(Class&& other) noexcept : PBCodable() { moveFrom(other); }                                       \
+  Class& operator=(const Class& other) {                                                                 \
+    assignFrom(other);                                                                                   \
+    return *this;                                                                                        \
+  }                                                                                                      \
+  static const ::probeview::MessageDescriptor pbDescriptor;                                              \
+  const ::probeview::MessageDescriptor& descriptor() const noexcept override;                            \
+  std::unique_ptr<Class> copyWithZone() const { return std::make_unique<Class>(*this); }                 \
+  void copyTo(Class& target) const { PBCodable::copyTo(target); }                                        \
+  void mergeFrom(const Class& other) { PBCodable::mergeFrom(other); }                                    \
+  friend bool operator==(const Class& left, const Class& right) noexcept { return left.isEqual(right); } \
+  static Class* make(void* memory, ::probeview::Block& block) noexcept {                                 \
+    auto* element = new (memory) Class;                                                                  \
+    element->becomeElement(block);                                                                       \
+    return element;                                                                                      \
+  }                                                                                                      \
+  static void renew(Class& message) noexcept {                                                           \
+    message.~Class();                                                                                    \
+    new (&message) Class;                                                                                \
+  }                                                                                                      \
+                                                                                                         \
+ private:                                                                                                \
+  using Self = Class;
+
+#define PB_DEFINE(Class)                                               \
+  constinit const ::probeview::MessageDescriptor Class::pbDescriptor = \
+      ::probeview::detail::describeMessage<Class>(#Class);             \
+  const ::probeview::MessageDescriptor& Class::descriptor() const noexcept { return pbDescriptor; }
+
+#define PB_ROW(number, key, property, type)                                                 \
+  static constexpr ::probeview::FieldDescriptor pbField(::probeview::FieldNumber<number>) { \
+    return type::describe(number, key, &Self::_##property);                                 \
+  }                                                                                         \
+                                                                                            \
+ private:                                                                                   \
+  type::Stored _##property {}
+
+#define PB_FIELD(number, key, property, Property, type)                                            \
+ public:                                                                                           \
+  type::Stored property() const noexcept { return hasBit(number) ? _##property : type::Stored{}; } \
+  void set##Property(type::Stored value) noexcept {                                                \
+    _##property = value;                                                                           \
+    setBit(number);                                                                                \
+  }                                                                                                \
+  bool has##Property() const noexcept { return hasBit(number); }                                   \
+  void setHas##Property(bool present) noexcept { setBit(number, present); }                        \
+  PB_ROW(number, key, property, type)
+
+#define PB_OBJECT(number, key, property, Property, type)                   \
+ public:                                                                   \
+  type::Value property() const noexcept { return type::get(_##property); } \
+  void set##Property(type::Value value) {                                  \
+    noteOwnedMemory();                                                     \
+    type::set(_##property, std::move(value), block());                     \
+  }                                                                        \
+  void set##Property(std::nullptr_t) noexcept { _##property.clear(); }     \
+  bool has##Property() const noexcept { return _##property.isPresent(); }  \
+  PB_ROW(number, key, property, type)
+
+#define PB_LIST(number, key, property, Property, single, Single, type)                                    \
+ public:                                                                                                  \
+  type::View property() const noexcept { return {_##property.elements(), _##property.count()}; }          \
+  void set##Property(type::View elements) { type::set(_##property, *this, elements); }                    \
+  void set##Property(std::span<const type::Handle> elements) { type::set(_##property, *this, elements); } \
+  void clear##Property() noexcept { _##property.clear(); }                                                \
+  void add##Single(type::Handle element) { type::add(_##property, *this, std::move(element)); }           \
+  type::Element& add##Single() {                                                                          \
+    auto element = type::Handle::make();                                                                  \
+    type::Element& added = *element;                                                                      \
+    add##Single(std::move(element));                                                                      \
+    return added;                                                                                         \
+  }                                                                                                       \
+  std::size_t property##Count() const noexcept { return _##property.count(); }                            \
+  type::Handle single##AtIndex(std::size_t index) const { return type::at(_##property, index); }          \
+  PB_ROW(number, key, property, type)
+
+#define PB_VALUES(number, key, property, Property, single, Single, type)                                \
+ public:                                                                                                \
+  const type::Number* property() const noexcept { return _##property.data(); }                          \
+  std::size_t property##Count() const noexcept { return _##property.count(); }                          \
+  void clear##Property() noexcept { _##property.clear(); }                                              \
+  void add##Single(type::Number value) {                                                                \
+    noteOwnedMemory();                                                                                  \
+    _##property.add(value);                                                                             \
+  }                                                                                                     \
+  type::Number single##AtIndex(std::size_t index) const { return _##property.at(index); }               \
+  void set##Property(std::span<const type::Number> values) {                                            \
+    noteOwnedMemory();                                                                                  \
+    _##property.set(values);                                                                            \
+  }                                                                                                     \
+  void set##Property(const type::Number* values, std::size_t count) { set##Property({values, count}); } \
+  PB_ROW(number, key, property, type)
+
+}  // namespace probeview

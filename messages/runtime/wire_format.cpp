@@ -1,0 +1,48 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "messages/runtime/wire_format.h"
+
+namespace probeview::wire {
+
+const std::uint8_t* readLongVarint(const std::uint8_t* position, const std::uint8_t* limit,
+                                   std::uint64_t& value) noexcept {
+  const std::ptrdiff_t available = limit - position;
+  const int readable = available < static_cast<std::ptrdiff_t>(longestVarint) ? static_cast<int>(available)
+                                                                              : static_cast<int>(longestVarint);
+  std::uint64_t result = 0;
+  for (int index = 0; index < readable; ++index) {
+    const std::uint64_t byte = position[index];
+    result |= (byte & 0x7F) << (7 * index);
+    if (byte < 0x80) {
+      value = result;
+      return position + index + 1;
+    }
+  }
+  value = 0;
+  return readable == static_cast<int>(longestVarint) ? position + longestVarint : nullptr;
+}
+
+const std::uint8_t* skipValue(const std::uint8_t* position, const std::uint8_t* limit, std::uint32_t type) noexcept {
+  std::uint64_t size = 0;
+  switch (static_cast<WireType>(type)) {
+    case WireType::Varint:
+      return readVarint(position, limit, size);
+    case WireType::LengthDelimited:
+      position = readVarint(position, limit, size);
+      if (position == nullptr) return nullptr;
+      break;
+    case WireType::Fixed64:
+      size = 8;
+      break;
+    case WireType::Fixed32:
+      size = 4;
+      break;
+    case WireType::StartGroup:
+    case WireType::EndGroup:
+      return nullptr;
+  }
+  // The two types that have no name, 6 and 7, come here with nothing to skip.
+  if (type > static_cast<std::uint32_t>(WireType::Fixed32)) return nullptr;
+  return size <= static_cast<std::uint64_t>(limit - position) ? position + size : nullptr;
+}
+
+}  // namespace probeview::wire
