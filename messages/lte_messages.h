@@ -7,193 +7,219 @@
 
 namespace probeview {
 
-// clang-format off: these are tables.
+// Tables read best in columns.
+// clang-format off
 
 // State of the RRC connection, 3GPP TS 36.331, 4.2.1, with the cause of the last change and the time (ms) spent in the
 // state before.
 class KCellularLteRrcState final : public PBCodable {
  public:
-  PB_ENUMERATION(State, KLTE_RRC_STATE_NULL = 0, KLTE_RRC_STATE_IDLE = 1, KLTE_RRC_STATE_ATMPT_CONNECTION = 2,
-                 KLTE_RRC_STATE_CONNECTED = 3, KLTE_RRC_STATE_ENDING = 4, KLTE_RRC_STATE_ATMPT_OUTBND_MOBILITY = 5,
-                 KLTE_RRC_STATE_ATMPT_INBND_MOBILITY = 6);
+  PB_ENUMERATION(State,
+    KLTE_RRC_STATE_NULL = 0,
+    KLTE_RRC_STATE_IDLE = 1,
+    KLTE_RRC_STATE_ATMPT_CONNECTION = 2,
+    KLTE_RRC_STATE_CONNECTED = 3,
+    KLTE_RRC_STATE_ENDING = 4,
+    KLTE_RRC_STATE_ATMPT_OUTBND_MOBILITY = 5,
+    KLTE_RRC_STATE_ATMPT_INBND_MOBILITY = 6);
 
-  PB_ENUMERATION(Cause, KLTE_RRC_CAUSE_EST_EMERGENCY = 0, KLTE_RRC_CAUSE_EST_HIGH_PRIO_ACC = 1,
-                 KLTE_RRC_CAUSE_EST_MT_ACC = 2, KLTE_RRC_CAUSE_EST_MO_SIGNAL = 3, KLTE_RRC_CAUSE_EST_MO_DATA = 4,
-                 KLTE_RRC_CAUSE_EST_DELAY_TOL_ACC = 5, KLTE_RRC_CAUSE_REEST_RECFG_FAIL = 6,
-                 KLTE_RRC_CAUSE_REEST_HO_FAIL = 7, KLTE_RRC_CAUSE_REEST_OTHER_FAIL = 8,
-                 KLTE_RRC_CAUSE_REL_OTHER_RECFG_FAIL = 9, KLTE_RRC_CAUSE_REL_CONN_FAIL_IRAT_RESEL = 10,
-                 KLTE_RRC_CAUSE_REL_CONN_FAIL_T311_EXP = 11, KLTE_RRC_CAUSE_REL_CONN_FAIL_CELL_NOT_SUIT = 12,
-                 KLTE_RRC_CAUSE_REL_CONN_FAIL_REEST_REJ = 13, KLTE_RRC_CAUSE_REL_LOAD_BAL_TAU_REQD = 14,
-                 KLTE_RRC_CAUSE_REL_OTHER = 15, KLTE_RRC_CAUSE_REL_CSFB_HIGH_PRIO = 16,
-                 KLTE_RRC_CAUSE_REL_T310_EXP = 17, KLTE_RRC_CAUSE_REL_RND_ACC = 18,
-                 KLTE_RRC_CAUSE_REL_MAX_RLC_RETRANS = 19, KLTE_RRC_CAUSE_REL_SUCC_MOB_FROM_EUTRAN = 20,
-                 KLTE_RRC_CAUSE_EST_SUCC_MOB_TO_EUTRAN = 21, KLTE_RRC_CAUSE_EST_FAIL_NO_RESP_FROM_CELL = 22,
-                 KLTE_RRC_CAUSE_EST_FAIL_REJ = 23, KLTE_RRC_CAUSE_EST_FAIL_CELL_RESEL = 24,
-                 KLTE_RRC_CAUSE_EST_FAIL_ABORTED = 25, KLTE_RRC_CAUSE_EST_FAIL_CELL_BARRED = 26,
-                 KLTE_RRC_CAUSE_REEST_OTHER_FAIL_T310_EXP = 27, KLTE_RRC_CAUSE_REEST_OTHER_FAIL_RND_ACC = 28,
-                 KLTE_RRC_CAUSE_REEST_OTHER_FAIL_MAX_RLC_RETX = 29, KLTE_RRC_CAUSE_REEST_OTHER_FAIL_INTEG_CHECK = 30,
-                 KLTE_RRC_CAUSE_NO_SERVICE = 254, KLTE_RRC_CAUSE_NA = 255);
+  PB_ENUMERATION(Cause,
+    KLTE_RRC_CAUSE_EST_EMERGENCY = 0,
+    KLTE_RRC_CAUSE_EST_HIGH_PRIO_ACC = 1,
+    KLTE_RRC_CAUSE_EST_MT_ACC = 2,
+    KLTE_RRC_CAUSE_EST_MO_SIGNAL = 3,
+    KLTE_RRC_CAUSE_EST_MO_DATA = 4,
+    KLTE_RRC_CAUSE_EST_DELAY_TOL_ACC = 5,
+    KLTE_RRC_CAUSE_REEST_RECFG_FAIL = 6,
+    KLTE_RRC_CAUSE_REEST_HO_FAIL = 7,
+    KLTE_RRC_CAUSE_REEST_OTHER_FAIL = 8,
+    KLTE_RRC_CAUSE_REL_OTHER_RECFG_FAIL = 9,
+    KLTE_RRC_CAUSE_REL_CONN_FAIL_IRAT_RESEL = 10,
+    KLTE_RRC_CAUSE_REL_CONN_FAIL_T311_EXP = 11,
+    KLTE_RRC_CAUSE_REL_CONN_FAIL_CELL_NOT_SUIT = 12,
+    KLTE_RRC_CAUSE_REL_CONN_FAIL_REEST_REJ = 13,
+    KLTE_RRC_CAUSE_REL_LOAD_BAL_TAU_REQD = 14,
+    KLTE_RRC_CAUSE_REL_OTHER = 15,
+    KLTE_RRC_CAUSE_REL_CSFB_HIGH_PRIO = 16,
+    KLTE_RRC_CAUSE_REL_T310_EXP = 17,
+    KLTE_RRC_CAUSE_REL_RND_ACC = 18,
+    KLTE_RRC_CAUSE_REL_MAX_RLC_RETRANS = 19,
+    KLTE_RRC_CAUSE_REL_SUCC_MOB_FROM_EUTRAN = 20,
+    KLTE_RRC_CAUSE_EST_SUCC_MOB_TO_EUTRAN = 21,
+    KLTE_RRC_CAUSE_EST_FAIL_NO_RESP_FROM_CELL = 22,
+    KLTE_RRC_CAUSE_EST_FAIL_REJ = 23,
+    KLTE_RRC_CAUSE_EST_FAIL_CELL_RESEL = 24,
+    KLTE_RRC_CAUSE_EST_FAIL_ABORTED = 25,
+    KLTE_RRC_CAUSE_EST_FAIL_CELL_BARRED = 26,
+    KLTE_RRC_CAUSE_REEST_OTHER_FAIL_T310_EXP = 27,
+    KLTE_RRC_CAUSE_REEST_OTHER_FAIL_RND_ACC = 28,
+    KLTE_RRC_CAUSE_REEST_OTHER_FAIL_MAX_RLC_RETX = 29,
+    KLTE_RRC_CAUSE_REEST_OTHER_FAIL_INTEG_CHECK = 30,
+    KLTE_RRC_CAUSE_NO_SERVICE = 254,
+    KLTE_RRC_CAUSE_NA = 255);
 
   PB_MESSAGE(KCellularLteRrcState)
-  PB_FIELD(1, "timestamp", timestamp, Timestamp, uint64);
-  PB_FIELD(2, "state", state, State, enumeration<State>);
-  PB_FIELD(3, "prev_state", prevState, PrevState, enumeration<State>);
+  PB_FIELD(1, "timestamp",         timestamp,      Timestamp,      uint64);
+  PB_FIELD(2, "state",             state,          State,          enumeration<State>);
+  PB_FIELD(3, "prev_state",        prevState,      PrevState,      enumeration<State>);
   PB_FIELD(4, "prev_state_dur_ms", prevStateDurMs, PrevStateDurMs, uint32);
-  PB_FIELD(5, "cause", cause, Cause, enumeration<Cause>);
+  PB_FIELD(5, "cause",             cause,          Cause,          enumeration<Cause>);
 };
 
 // Connected-mode DRX as configured by the network, 3GPP TS 36.321, 5.7; times in ms.
 class KCellularLteCdrxConfig final : public PBCodable {
   PB_MESSAGE(KCellularLteCdrxConfig)
-  PB_FIELD(1, "timestamp", timestamp, Timestamp, uint64);
-  PB_FIELD(2, "cell_status", cellStatus, CellStatus, uint32);
-  PB_FIELD(3, "on_duration_ms", onDurationMs, OnDurationMs, uint32);
-  PB_FIELD(4, "drx_inactivity_ms", drxInactivityMs, DrxInactivityMs, uint32);
-  PB_FIELD(5, "drx_retx_timer_ms", drxRetxTimerMs, DrxRetxTimerMs, uint32);
-  PB_FIELD(7, "long_drx_cycle_ms", longDrxCycleMs, LongDrxCycleMs, uint32);
-  PB_FIELD(10, "short_drx_cycle_ms", shortDrxCycleMs, ShortDrxCycleMs, uint32);
+  PB_FIELD( 1, "timestamp",           timestamp,        Timestamp,        uint64);
+  PB_FIELD( 2, "cell_status",         cellStatus,       CellStatus,       uint32);
+  PB_FIELD( 3, "on_duration_ms",      onDurationMs,     OnDurationMs,     uint32);
+  PB_FIELD( 4, "drx_inactivity_ms",   drxInactivityMs,  DrxInactivityMs,  uint32);
+  PB_FIELD( 5, "drx_retx_timer_ms",   drxRetxTimerMs,   DrxRetxTimerMs,   uint32);
+  PB_FIELD( 7, "long_drx_cycle_ms",   longDrxCycleMs,   LongDrxCycleMs,   uint32);
+  PB_FIELD(10, "short_drx_cycle_ms",  shortDrxCycleMs,  ShortDrxCycleMs,  uint32);
   PB_FIELD(11, "drx_short_cycle_num", drxShortCycleNum, DrxShortCycleNum, uint32);
-  PB_FIELD(12, "rrc_state", rrcState, RrcState, enumeration<KCellularLteRrcState::State>);
-  PB_FIELD(13, "cdrx_config_status", cdrxConfigStatus, CdrxConfigStatus, uint32);
-  PB_FIELD(14, "transmission_mode", transmissionMode, TransmissionMode, uint32);
+  PB_FIELD(12, "rrc_state",           rrcState,         RrcState,         enumeration<KCellularLteRrcState::State>);
+  PB_FIELD(13, "cdrx_config_status",  cdrxConfigStatus, CdrxConfigStatus, uint32);
+  PB_FIELD(14, "transmission_mode",   transmissionMode, TransmissionMode, uint32);
 };
 
 // The serving cell: PCI, EARFCNs (3GPP TS 36.101, 5.7.3), bandwidths (dl_bw in quarter MHz, ul_bw in MHz), 28-bit cell
 // identity, band, TAC and PLMN, TDD configuration (3GPP TS 36.211, 4.2).
 class KCellularLteScellInfo final : public PBCodable {
   PB_MESSAGE(KCellularLteScellInfo)
-  PB_FIELD(1, "timestamp", timestamp, Timestamp, uint64);
-  PB_FIELD(2, "phy_cell_id", phyCellId, PhyCellId, uint32);
-  PB_FIELD(3, "dl_freq", dlFreq, DlFreq, uint32);
-  PB_FIELD(4, "ul_freq", ulFreq, UlFreq, uint32);
-  PB_FIELD(5, "dl_bw", dlBw, DlBw, uint32);
-  PB_FIELD(6, "ul_bw", ulBw, UlBw, uint32);
-  PB_FIELD(7, "cell_id", cellId, CellId, uint32);
-  PB_FIELD(8, "freq_band_ind", freqBandInd, FreqBandInd, uint32);
-  PB_FIELD(9, "tracking_area_code", trackingAreaCode, TrackingAreaCode, uint32);
-  PB_FIELD(10, "num_mnc_digits", numMncDigits, NumMncDigits, uint32);
-  PB_FIELD(11, "sel_plmn_mcc", selPlmnMcc, SelPlmnMcc, uint32);
-  PB_FIELD(12, "sel_plmn_mnc", selPlmnMnc, SelPlmnMnc, uint32);
-  PB_FIELD(14, "tdd_sf_assignment", tddSfAssignment, TddSfAssignment, uint32);
-  PB_FIELD(15, "tdd_ssf_patterns", tddSsfPatterns, TddSsfPatterns, uint32);
+  PB_FIELD( 1, "timestamp",          timestamp,        Timestamp,        uint64);
+  PB_FIELD( 2, "phy_cell_id",        phyCellId,        PhyCellId,        uint32);
+  PB_FIELD( 3, "dl_freq",            dlFreq,           DlFreq,           uint32);
+  PB_FIELD( 4, "ul_freq",            ulFreq,           UlFreq,           uint32);
+  PB_FIELD( 5, "dl_bw",              dlBw,             DlBw,             uint32);
+  PB_FIELD( 6, "ul_bw",              ulBw,             UlBw,             uint32);
+  PB_FIELD( 7, "cell_id",            cellId,           CellId,           uint32);
+  PB_FIELD( 8, "freq_band_ind",      freqBandInd,      FreqBandInd,      uint32);
+  PB_FIELD( 9, "tracking_area_code", trackingAreaCode, TrackingAreaCode, uint32);
+  PB_FIELD(10, "num_mnc_digits",     numMncDigits,     NumMncDigits,     uint32);
+  PB_FIELD(11, "sel_plmn_mcc",       selPlmnMcc,       SelPlmnMcc,       uint32);
+  PB_FIELD(12, "sel_plmn_mnc",       selPlmnMnc,       SelPlmnMnc,       uint32);
+  PB_FIELD(14, "tdd_sf_assignment",  tddSfAssignment,  TddSfAssignment,  uint32);
+  PB_FIELD(15, "tdd_ssf_patterns",   tddSsfPatterns,   TddSsfPatterns,   uint32);
 };
 
 // A neighbour frequency for reselection, 3GPP TS 36.331, SystemInformationBlockType5; dl_bw is an index, 0 to 5 for
 // 1.4 to 20 MHz.
 class NbrEutra final : public PBCodable {
  public:
-  PB_ENUMERATION(FrameType, FDD = 0, TDD = 1, INVALID = 2);
+  PB_ENUMERATION(FrameType,
+    FDD = 0,
+    TDD = 1,
+    INVALID = 2);
 
   PB_MESSAGE(NbrEutra)
-  PB_FIELD(1, "earfcn", earfcn, Earfcn, uint32);
-  PB_FIELD(2, "Q_rxlev_min", qRxlevMin, QRxlevMin, sint32);
-  PB_FIELD(3, "Q_qual_min", qQualMin, QQualMin, sint32);
-  PB_FIELD(4, "Q_offset", qOffset, QOffset, sint32);
-  PB_FIELD(5, "Pmax", pmax, Pmax, sint32);
-  PB_FIELD(6, "dl_bw", dlBw, DlBw, uint32);
-  PB_FIELD(7, "Thres_X_highP", thresXHighP, ThresXHighP, uint32);
-  PB_FIELD(8, "Thres_X_lowP", thresXLowP, ThresXLowP, uint32);
-  PB_FIELD(9, "Thres_X_highQ", thresXHighQ, ThresXHighQ, uint32);
-  PB_FIELD(10, "Thres_X_lowQ", thresXLowQ, ThresXLowQ, uint32);
-  PB_FIELD(11, "priority", priority, Priority, uint32);
-  PB_FIELD(12, "frame_type", frameType, FrameType, enumeration<FrameType>);
-  PB_FIELD(13, "band", band, Band, uint32);
+  PB_FIELD( 1, "earfcn",        earfcn,      Earfcn,      uint32);
+  PB_FIELD( 2, "Q_rxlev_min",   qRxlevMin,   QRxlevMin,   sint32);
+  PB_FIELD( 3, "Q_qual_min",    qQualMin,    QQualMin,    sint32);
+  PB_FIELD( 4, "Q_offset",      qOffset,     QOffset,     sint32);
+  PB_FIELD( 5, "Pmax",          pmax,        Pmax,        sint32);
+  PB_FIELD( 6, "dl_bw",         dlBw,        DlBw,        uint32);
+  PB_FIELD( 7, "Thres_X_highP", thresXHighP, ThresXHighP, uint32);
+  PB_FIELD( 8, "Thres_X_lowP",  thresXLowP,  ThresXLowP,  uint32);
+  PB_FIELD( 9, "Thres_X_highQ", thresXHighQ, ThresXHighQ, uint32);
+  PB_FIELD(10, "Thres_X_lowQ",  thresXLowQ,  ThresXLowQ,  uint32);
+  PB_FIELD(11, "priority",      priority,    Priority,    uint32);
+  PB_FIELD(12, "frame_type",    frameType,   FrameType,   enumeration<FrameType>);
+  PB_FIELD(13, "band",          band,        Band,        uint32);
 };
 
 // What the serving cell broadcasts for cell selection and reselection, 3GPP TS 36.304, 5.2 and TS 36.331, 6.3.1:
 // access barring, thresholds (dB), priorities, and the E-UTRA neighbour frequencies.
 class KCellularLteSelReselCellInfo final : public PBCodable {
   PB_MESSAGE(KCellularLteSelReselCellInfo)
-  PB_FIELD(1, "timestamp", timestamp, Timestamp, uint64);
-  PB_VALUES(2, "multi_band_info", multiBandInfos, MultiBandInfos, multiBandInfo, MultiBandInfo, repeated<uint32>);
-  PB_FIELD(3, "ims_emergency_support", imsEmergencySupport, ImsEmergencySupport, uint32);
-  PB_FIELD(4, "ac_barring_for_emergency", acBarringForEmergency, AcBarringForEmergency, uint32);
-  PB_FIELD(5, "mo_signalling_ac_barring_factor", moSignallingAcBarringFactor, MoSignallingAcBarringFactor, uint32);
-  PB_FIELD(6, "mo_signalling_ac_barring_time", moSignallingAcBarringTime, MoSignallingAcBarringTime, uint32);
-  PB_FIELD(7, "mo_signalling_ac_barring_for_special_ac", moSignallingAcBarringForSpecialAc,
-           MoSignallingAcBarringForSpecialAc, uint32);
-  PB_FIELD(8, "mo_data_ac_barring_factor", moDataAcBarringFactor, MoDataAcBarringFactor, uint32);
-  PB_FIELD(9, "mo_data_ac_barring_time", moDataAcBarringTime, MoDataAcBarringTime, uint32);
-  PB_FIELD(10, "mo_data_ac_barring_for_special_ac", moDataAcBarringForSpecialAc, MoDataAcBarringForSpecialAc, uint32);
-  PB_FIELD(11, "QRxLevMin", qRxLevMin, QRxLevMin, sint32);
-  PB_FIELD(12, "QQualMin", qQualMin, QQualMin, sint32);
-  PB_FIELD(13, "Q_hyst", qHyst, QHyst, uint32);
-  PB_FIELD(14, "S_non_intra_search_P", sNonIntraSearchP, SNonIntraSearchP, uint32);
-  PB_FIELD(15, "S_non_intra_search_Q", sNonIntraSearchQ, SNonIntraSearchQ, uint32);
-  PB_FIELD(16, "S_intra_search_P", sIntraSearchP, SIntraSearchP, uint32);
-  PB_FIELD(17, "S_intra_search_Q", sIntraSearchQ, SIntraSearchQ, uint32);
-  PB_FIELD(18, "Thresh_serving_lowP", threshServingLowP, ThreshServingLowP, uint32);
-  PB_FIELD(19, "Thresh_serving_lowQ", threshServingLowQ, ThreshServingLowQ, uint32);
-  PB_FIELD(20, "priority_operating_freq", priorityOperatingFreq, PriorityOperatingFreq, uint32);
-  PB_LIST(21, "nbr_eutra", nbrEutras, NbrEutras, nbrEutra, NbrEutra, repeated<message<NbrEutra>>);
+  PB_FIELD ( 1, "timestamp",                               timestamp,                         Timestamp,                         uint64);
+  PB_VALUES( 2, "multi_band_info",                         multiBandInfos,                    MultiBandInfos, multiBandInfo, MultiBandInfo, repeated<uint32>);
+  PB_FIELD ( 3, "ims_emergency_support",                   imsEmergencySupport,               ImsEmergencySupport,               uint32);
+  PB_FIELD ( 4, "ac_barring_for_emergency",                acBarringForEmergency,             AcBarringForEmergency,             uint32);
+  PB_FIELD ( 5, "mo_signalling_ac_barring_factor",         moSignallingAcBarringFactor,       MoSignallingAcBarringFactor,       uint32);
+  PB_FIELD ( 6, "mo_signalling_ac_barring_time",           moSignallingAcBarringTime,         MoSignallingAcBarringTime,         uint32);
+  PB_FIELD ( 7, "mo_signalling_ac_barring_for_special_ac", moSignallingAcBarringForSpecialAc, MoSignallingAcBarringForSpecialAc, uint32);
+  PB_FIELD ( 8, "mo_data_ac_barring_factor",               moDataAcBarringFactor,             MoDataAcBarringFactor,             uint32);
+  PB_FIELD ( 9, "mo_data_ac_barring_time",                 moDataAcBarringTime,               MoDataAcBarringTime,               uint32);
+  PB_FIELD (10, "mo_data_ac_barring_for_special_ac",       moDataAcBarringForSpecialAc,       MoDataAcBarringForSpecialAc,       uint32);
+  PB_FIELD (11, "QRxLevMin",                               qRxLevMin,                         QRxLevMin,                         sint32);
+  PB_FIELD (12, "QQualMin",                                qQualMin,                          QQualMin,                          sint32);
+  PB_FIELD (13, "Q_hyst",                                  qHyst,                             QHyst,                             uint32);
+  PB_FIELD (14, "S_non_intra_search_P",                    sNonIntraSearchP,                  SNonIntraSearchP,                  uint32);
+  PB_FIELD (15, "S_non_intra_search_Q",                    sNonIntraSearchQ,                  SNonIntraSearchQ,                  uint32);
+  PB_FIELD (16, "S_intra_search_P",                        sIntraSearchP,                     SIntraSearchP,                     uint32);
+  PB_FIELD (17, "S_intra_search_Q",                        sIntraSearchQ,                     SIntraSearchQ,                     uint32);
+  PB_FIELD (18, "Thresh_serving_lowP",                     threshServingLowP,                 ThreshServingLowP,                 uint32);
+  PB_FIELD (19, "Thresh_serving_lowQ",                     threshServingLowQ,                 ThreshServingLowQ,                 uint32);
+  PB_FIELD (20, "priority_operating_freq",                 priorityOperatingFreq,             PriorityOperatingFreq,             uint32);
+  PB_LIST  (21, "nbr_eutra",                               nbrEutras,                         NbrEutras, nbrEutra, NbrEutra, repeated<message<NbrEutra>>);
 };
 
 // One antenna's measurement; the ranges are those of 3GPP TS 36.133, 9.1: RSRP in dBm is rsrp_range - 140.
 class RxInfo final : public PBCodable {
   PB_MESSAGE(RxInfo)
-  PB_FIELD(1, "rssi", rssi, Rssi, sint32);
+  PB_FIELD(1, "rssi",       rssi,      Rssi,      sint32);
   PB_FIELD(2, "rsrp_range", rsrpRange, RsrpRange, uint32);
   PB_FIELD(3, "rsrq_range", rsrqRange, RsrqRange, uint32);
-  PB_FIELD(4, "snr", snr, Snr, sint32);
+  PB_FIELD(4, "snr",        snr,       Snr,       sint32);
 };
 
 // Measurement of the serving cell, per antenna.
 class KCellularLteServingCellMeasurement final : public PBCodable {
   PB_MESSAGE(KCellularLteServingCellMeasurement)
-  PB_FIELD(1, "timestamp", timestamp, Timestamp, uint64);
+  PB_FIELD(1, "timestamp",         timestamp,       Timestamp,       uint64);
   PB_FIELD(2, "is_connected_mode", isConnectedMode, IsConnectedMode, boolean);
-  PB_LIST(3, "rx_info", rxInfos, RxInfos, rxInfo, RxInfo, repeated<message<RxInfo>>);
+  PB_LIST (3, "rx_info",           rxInfos,         RxInfos, rxInfo, RxInfo, repeated<message<RxInfo>>);
 };
 
 // Transmit power of PUCCH and PUSCH in one subframe, in dBm.
 class TxPowerInfo final : public PBCodable {
   PB_MESSAGE(TxPowerInfo)
-  PB_FIELD(1, "pucch_tx_power", pucchTxPower, PucchTxPower, sint32);
-  PB_FIELD(2, "pusch_tx_power", puschTxPower, PuschTxPower, sint32);
+  PB_FIELD(1, "pucch_tx_power", pucchTxPower,  PucchTxPower,  sint32);
+  PB_FIELD(2, "pusch_tx_power", puschTxPower,  PuschTxPower,  sint32);
   PB_FIELD(3, "subframe_index", subframeIndex, SubframeIndex, uint32);
 };
 
 // Uplink transmit power, per subframe.
 class KCellularLteTxPower final : public PBCodable {
   PB_MESSAGE(KCellularLteTxPower)
-  PB_FIELD(1, "timestamp", timestamp, Timestamp, uint64);
-  PB_LIST(2, "tx_power_info", txPowerInfos, TxPowerInfos, txPowerInfo, TxPowerInfo, repeated<message<TxPowerInfo>>);
+  PB_FIELD(1, "timestamp",     timestamp,    Timestamp,    uint64);
+  PB_LIST (2, "tx_power_info", txPowerInfos, TxPowerInfos, txPowerInfo, TxPowerInfo, repeated<message<TxPowerInfo>>);
 };
 
 // RSRP in dBm, RSRQ in dB and SINR in half dB of one cell, per receive antenna.
 class RsrpRsrqSinr final : public PBCodable {
   PB_MESSAGE(RsrpRsrqSinr)
-  PB_FIELD(1, "phy_cell_id", phyCellId, PhyCellId, uint32);
-  PB_FIELD(4, "rsrp0", rsrp0, Rsrp0, sint32);
-  PB_FIELD(5, "rsrp1", rsrp1, Rsrp1, sint32);
-  PB_FIELD(7, "rsrq0", rsrq0, Rsrq0, sint32);
-  PB_FIELD(8, "rsrq1", rsrq1, Rsrq1, sint32);
-  PB_FIELD(10, "sinr0", sinr0, Sinr0, sint32);
-  PB_FIELD(11, "sinr1", sinr1, Sinr1, sint32);
+  PB_FIELD( 1, "phy_cell_id", phyCellId, PhyCellId, uint32);
+  PB_FIELD( 4, "rsrp0",       rsrp0,     Rsrp0,     sint32);
+  PB_FIELD( 5, "rsrp1",       rsrp1,     Rsrp1,     sint32);
+  PB_FIELD( 7, "rsrq0",       rsrq0,     Rsrq0,     sint32);
+  PB_FIELD( 8, "rsrq1",       rsrq1,     Rsrq1,     sint32);
+  PB_FIELD(10, "sinr0",       sinr0,     Sinr0,     sint32);
+  PB_FIELD(11, "sinr1",       sinr1,     Sinr1,     sint32);
 };
 
 // Measurement statistics of the serving cell: averages over the last seconds and the single samples.
 class KCellularLteRsrpRsrqSinr final : public PBCodable {
   PB_MESSAGE(KCellularLteRsrpRsrqSinr)
-  PB_FIELD(1, "timestamp", timestamp, Timestamp, uint64);
-  PB_OBJECT(3, "call_id", callId, CallId, string);
-  PB_FIELD(6, "last_x_seconds", lastXSeconds, LastXSeconds, uint32);
-  PB_FIELD(7, "last_y_samples", lastYSamples, LastYSamples, uint32);
-  PB_FIELD(8, "sample_period_ms", samplePeriodMs, SamplePeriodMs, uint32);
-  PB_FIELD(10, "duration_ms", durationMs, DurationMs, uint32);
-  PB_FIELD(11, "num_samples", numSamples, NumSamples, uint32);
-  PB_OBJECT(14, "avg_values", avgValues, AvgValues, message<RsrpRsrqSinr>);
-  PB_LIST(15, "inst_values", instValues, InstValues, instValues, InstValues, repeated<message<RsrpRsrqSinr>>);
+  PB_FIELD ( 1, "timestamp",        timestamp,      Timestamp,      uint64);
+  PB_OBJECT( 3, "call_id",          callId,         CallId,         string);
+  PB_FIELD ( 6, "last_x_seconds",   lastXSeconds,   LastXSeconds,   uint32);
+  PB_FIELD ( 7, "last_y_samples",   lastYSamples,   LastYSamples,   uint32);
+  PB_FIELD ( 8, "sample_period_ms", samplePeriodMs, SamplePeriodMs, uint32);
+  PB_FIELD (10, "duration_ms",      durationMs,     DurationMs,     uint32);
+  PB_FIELD (11, "num_samples",      numSamples,     NumSamples,     uint32);
+  PB_OBJECT(14, "avg_values",       avgValues,      AvgValues,      message<RsrpRsrqSinr>);
+  PB_LIST  (15, "inst_values",      instValues,     InstValues, instValues, InstValues, repeated<message<RsrpRsrqSinr>>);
 };
 
 // EARFCN and bandwidth (index, 0 to 5 for 1.4 to 20 MHz) of the primary and up to two secondary carriers.
 class KCellularLteComponentCarrierInfo final : public PBCodable {
   PB_MESSAGE(KCellularLteComponentCarrierInfo)
-  PB_FIELD(1, "timestamp", timestamp, Timestamp, uint64);
-  PB_FIELD(2, "pcc_earfcn", pccEarfcn, PccEarfcn, uint32);
-  PB_FIELD(3, "scc0_earfcn", scc0Earfcn, Scc0Earfcn, uint32);
-  PB_FIELD(4, "scc1_earfcn", scc1Earfcn, Scc1Earfcn, uint32);
-  PB_FIELD(5, "pcc_bandwidth", pccBandwidth, PccBandwidth, uint32);
+  PB_FIELD(1, "timestamp",      timestamp,     Timestamp,     uint64);
+  PB_FIELD(2, "pcc_earfcn",     pccEarfcn,     PccEarfcn,     uint32);
+  PB_FIELD(3, "scc0_earfcn",    scc0Earfcn,    Scc0Earfcn,    uint32);
+  PB_FIELD(4, "scc1_earfcn",    scc1Earfcn,    Scc1Earfcn,    uint32);
+  PB_FIELD(5, "pcc_bandwidth",  pccBandwidth,  PccBandwidth,  uint32);
   PB_FIELD(6, "scc0_bandwidth", scc0Bandwidth, Scc0Bandwidth, uint32);
   PB_FIELD(7, "scc1_bandwidth", scc1Bandwidth, Scc1Bandwidth, uint32);
 };
@@ -201,76 +227,76 @@ class KCellularLteComponentCarrierInfo final : public PBCodable {
 // One secondary carrier; RSRP and RSSI in hundredths of a dBm, RSRQ in hundredths of a dB, bandwidths are indexes.
 class SecondaryComponentCarrier final : public PBCodable {
  public:
-  PB_ENUMERATION(State, SCC_STATE_DECONFIGURED = 0, SCC_STATE_CONFIGURED_DEACTIVATED = 1, SCC_STATE_ACTIVATED = 2);
+  PB_ENUMERATION(State,
+    SCC_STATE_DECONFIGURED = 0,
+    SCC_STATE_CONFIGURED_DEACTIVATED = 1,
+    SCC_STATE_ACTIVATED = 2);
 
   PB_MESSAGE(SecondaryComponentCarrier)
-  PB_FIELD(1, "index", index, Index, uint32);
-  PB_FIELD(2, "state", state, State, enumeration<State>);
-  PB_FIELD(3, "pci", pci, Pci, uint32);
-  PB_FIELD(4, "dl_earfcn", dlEarfcn, DlEarfcn, uint32);
-  PB_FIELD(5, "dl_rf_band", dlRfBand, DlRfBand, uint32);
-  PB_FIELD(6, "dl_bandwidth", dlBandwidth, DlBandwidth, uint32);
-  PB_FIELD(7, "has_uplink", hasUplink, HasUplink, boolean);
-  PB_FIELD(8, "ul_earfcn", ulEarfcn, UlEarfcn, uint32);
-  PB_FIELD(9, "ul_rf_band", ulRfBand, UlRfBand, uint32);
+  PB_FIELD( 1, "index",        index,       Index,       uint32);
+  PB_FIELD( 2, "state",        state,       State,       enumeration<State>);
+  PB_FIELD( 3, "pci",          pci,         Pci,         uint32);
+  PB_FIELD( 4, "dl_earfcn",    dlEarfcn,    DlEarfcn,    uint32);
+  PB_FIELD( 5, "dl_rf_band",   dlRfBand,    DlRfBand,    uint32);
+  PB_FIELD( 6, "dl_bandwidth", dlBandwidth, DlBandwidth, uint32);
+  PB_FIELD( 7, "has_uplink",   hasUplink,   HasUplink,   boolean);
+  PB_FIELD( 8, "ul_earfcn",    ulEarfcn,    UlEarfcn,    uint32);
+  PB_FIELD( 9, "ul_rf_band",   ulRfBand,    UlRfBand,    uint32);
   PB_FIELD(10, "ul_bandwidth", ulBandwidth, UlBandwidth, uint32);
-  PB_FIELD(11, "rsrp", rsrp, Rsrp, sint32);
-  PB_FIELD(12, "rsrq", rsrq, Rsrq, sint32);
-  PB_FIELD(13, "snr", snr, Snr, sint32);
-  PB_FIELD(14, "rssi", rssi, Rssi, sint32);
+  PB_FIELD(11, "rsrp",         rsrp,        Rsrp,        sint32);
+  PB_FIELD(12, "rsrq",         rsrq,        Rsrq,        sint32);
+  PB_FIELD(13, "snr",          snr,         Snr,         sint32);
+  PB_FIELD(14, "rssi",         rssi,        Rssi,        sint32);
 };
 
 // State of the secondary component carriers, 3GPP TS 36.321, 5.13.
 class KCellularLteCarrierAggregationStatus final : public PBCodable {
   PB_MESSAGE(KCellularLteCarrierAggregationStatus)
   PB_FIELD(1, "timestamp", timestamp, Timestamp, uint64);
-  PB_LIST(2, "scc_list", sccLists, SccLists, sccList, SccList, repeated<message<SecondaryComponentCarrier>>);
+  PB_LIST (2, "scc_list",  sccLists,  SccLists, sccList, SccList, repeated<message<SecondaryComponentCarrier>>);
 };
 
 // One LTE neighbour; RSRP in dBm is nbr_rsrp - 140, RSRQ in dB is nbr_rsrq / 2 - 19.5 (3GPP TS 36.133, 9.1.4 and
 // 9.1.7).
 class EgwErrcNbrEutraMeas final : public PBCodable {
   PB_MESSAGE(EgwErrcNbrEutraMeas)
-  PB_FIELD(1, "nbr_earfcn", nbrEarfcn, NbrEarfcn, uint32);
+  PB_FIELD(1, "nbr_earfcn",       nbrEarfcn,     NbrEarfcn,     uint32);
   PB_FIELD(2, "nbr_phys_cell_id", nbrPhysCellId, NbrPhysCellId, uint32);
-  PB_FIELD(3, "freq_band_ind", freqBandInd, FreqBandInd, uint32);
-  PB_FIELD(4, "nbr_rsrp", nbrRsrp, NbrRsrp, sint32);
-  PB_FIELD(5, "nbr_rsrq", nbrRsrq, NbrRsrq, sint32);
+  PB_FIELD(3, "freq_band_ind",    freqBandInd,   FreqBandInd,   uint32);
+  PB_FIELD(4, "nbr_rsrp",         nbrRsrp,       NbrRsrp,       sint32);
+  PB_FIELD(5, "nbr_rsrq",         nbrRsrq,       NbrRsrq,       sint32);
 };
 
 // Measured LTE neighbour cells.
 class KCellularLteNbrEutraCellMeas final : public PBCodable {
   PB_MESSAGE(KCellularLteNbrEutraCellMeas)
-  PB_FIELD(1, "timestamp", timestamp, Timestamp, uint64);
-  PB_LIST(2, "meas_nbr_eutra", measNbrEutras, MeasNbrEutras, measNbrEutra, MeasNbrEutra,
-          repeated<message<EgwErrcNbrEutraMeas>>);
+  PB_FIELD(1, "timestamp",      timestamp,     Timestamp,     uint64);
+  PB_LIST (2, "meas_nbr_eutra", measNbrEutras, MeasNbrEutras, measNbrEutra, MeasNbrEutra, repeated<message<EgwErrcNbrEutraMeas>>);
 };
 
 // One UMTS neighbour; RSCP in dBm is rscp - 116, Ec/No in dB is ecno / 2 - 24.5 (3GPP TS 25.133, 9.1).
 class EgwErrcNbrUtraMeas final : public PBCodable {
   PB_MESSAGE(EgwErrcNbrUtraMeas)
   PB_FIELD(1, "uarfcn", uarfcn, Uarfcn, uint32);
-  PB_FIELD(2, "psc", psc, Psc, uint32);
-  PB_FIELD(3, "rscp", rscp, Rscp, sint32);
-  PB_FIELD(4, "ecno", ecno, Ecno, uint32);
+  PB_FIELD(2, "psc",    psc,    Psc,    uint32);
+  PB_FIELD(3, "rscp",   rscp,   Rscp,   sint32);
+  PB_FIELD(4, "ecno",   ecno,   Ecno,   uint32);
 };
 
 // One GSM neighbour; the level in dBm is rxlev - 110 (3GPP TS 45.008, 8.1.4).
 class EgwErrcNbrGeranMeas final : public PBCodable {
   PB_MESSAGE(EgwErrcNbrGeranMeas)
   PB_FIELD(1, "arfcn", arfcn, Arfcn, uint32);
-  PB_FIELD(2, "bsic", bsic, Bsic, uint32);
+  PB_FIELD(2, "bsic",  bsic,  Bsic,  uint32);
   PB_FIELD(3, "rxlev", rxlev, Rxlev, uint32);
 };
 
 // Measured UMTS and GSM neighbour cells of an LTE cell.
 class KCellularLteNbrInterRatCellMeas final : public PBCodable {
   PB_MESSAGE(KCellularLteNbrInterRatCellMeas)
-  PB_FIELD(1, "timestamp", timestamp, Timestamp, uint64);
-  PB_LIST(2, "meas_nbr_utra", measNbrUtras, MeasNbrUtras, measNbrUtra, MeasNbrUtra,
-          repeated<message<EgwErrcNbrUtraMeas>>);
-  PB_LIST(3, "meas_nbr_geran", measNbrGerans, MeasNbrGerans, measNbrGeran, MeasNbrGeran,
-          repeated<message<EgwErrcNbrGeranMeas>>);
+  PB_FIELD(1, "timestamp",      timestamp,     Timestamp,     uint64);
+  PB_LIST (2, "meas_nbr_utra",  measNbrUtras,  MeasNbrUtras, measNbrUtra, MeasNbrUtra, repeated<message<EgwErrcNbrUtraMeas>>);
+  PB_LIST (3, "meas_nbr_geran", measNbrGerans, MeasNbrGerans, measNbrGeran, MeasNbrGeran, repeated<message<EgwErrcNbrGeranMeas>>);
 };
 
 // clang-format on
