@@ -21,7 +21,7 @@ std::atomic<LineSink*>& chosenSink() {
 
 }  // namespace
 
-SystemLog::SystemLog(const char* identity) {
+SystemLog::SystemLog(const char* identity, Echo echo) : echo_(echo) {
   ::openlog(identity, LOG_PID, LOG_USER);
   // A closed standard error must not end the process.
   std::signal(SIGPIPE, SIG_IGN);
@@ -30,6 +30,7 @@ SystemLog::SystemLog(const char* identity) {
 void SystemLog::line(std::string_view text) {
   const int size = static_cast<int>(std::min<std::size_t>(text.size(), INT_MAX));
   ::syslog(LOG_NOTICE, "%.*s", size, text.data());
+  if (echo_ == Echo::None) return;
   char lineEnd = '\n';
   const iovec parts[] = {{const_cast<char*>(text.data()), text.size()}, {&lineEnd, 1}};
   // Nothing can be done about a standard error that nobody reads.

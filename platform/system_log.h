@@ -7,14 +7,18 @@
 
 namespace probeview {
 
-// The system's log (syslog, as a notice of a user's program), each line echoed to standard error with one write. Lines
-// may come from any thread.
+// The system's log (syslog, as a notice of a user's program), each line echoed to standard error with one write, unless
+// standard error belongs to somebody else. Lines may come from any thread.
 class SystemLog final : public LineSink {
  public:
+  enum class Echo : bool { None, StandardError };
   // The name that the lines bear in the system's log, which has one for the whole process; the last one made counts. It
   // must live as long as the process.
-  explicit SystemLog(const char* identity);
+  explicit SystemLog(const char* identity, Echo echo = Echo::StandardError);
   void line(std::string_view text) override;
+
+ private:
+  const Echo echo_;
 };
 
 // Where the client wrapper and the message decoder write their lines: the system's log under "probeview", unless a

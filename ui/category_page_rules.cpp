@@ -55,67 +55,68 @@ constexpr auto Field = CellRule::Field;
 constexpr auto ComeBackLater = CellRule::ComeBackLater;
 
 // What looks uneven is meant so; the reason stands above each such row.
-// clang-format off: a table reads by its columns.
+// A table reads by its columns.
+// clang-format off
 constexpr CategoryPageRule rules[] = {
-    // key                            source                                          sections  title prefix rows cells
+    // key                             source                                       sections  title prefix          rows      cells
     // Nothing reports these two yet.
-    {"Device Info IMSI", none, One, "", OneRow, ComeBackLater},
-    {"Device Info IMEISV", none, One, "", OneRow, ComeBackLater},
-    {"Device Info SIM Files", entries<&Common::simContents>, PerEntry, "SIM Content ", PerField, Field},
+    {"Device Info IMSI",               none,                                        One,      "",                   OneRow,   ComeBackLater},
+    {"Device Info IMEISV",             none,                                        One,      "",                   OneRow,   ComeBackLater},
+    {"Device Info SIM Files",          entries<&Common::simContents>,               PerEntry, "SIM Content ",       PerField, Field},
 
-    {"LTE NAS", dictionary<&Store::myLTEEMMContextDict>, One, "", PerField, Field},
-    {"LTE RRC State", dictionary<&Store::myLTERRCStateDict>, One, "", PerField, Field},
+    {"LTE NAS",                        dictionary<&Store::myLTEEMMContextDict>,     One,      "",                   PerField, Field},
+    {"LTE RRC State",                  dictionary<&Store::myLTERRCStateDict>,       One,      "",                   PerField, Field},
     // The one page that complains while its dictionary is absent, and shows a blank row instead of none.
-    {"LTE Serving Cell Info", dictionary<&Store::myLTESCellInfoDict>, One, "", PerFieldElseComplaint, Field},
+    {"LTE Serving Cell Info",          dictionary<&Store::myLTESCellInfoDict>,      One,      "",                   PerFieldElseComplaint, Field},
     // Entries without a section rule: the first one alone is shown, without a header.
-    {"LTE Serving Cell Meas", entries<&LTE::RsrpRsrqSinr>, One, "", PerField, Field},
-    {"LTE Tx Power", entries<&LTE::TxPower>, PerEntry, "TxPowerInfo ", PerField, Field},
-    {"LTE Sel Resel Parameters", entry<&LTE::SelReselCellInfo>, One, "", PerField, Field},
-    {"LTE EUTRA Neighbor Info", entries<&LTE::EutraNbrs>, PerEntry, "EUTRA Neighbor ", PerField, Field},
-    {"LTE C-DRX", dictionary<&Store::myLTECDRXConfigDict>, One, "", PerField, Field},
-    {"LTE LTE Neighbor Cell Meas", entries<&LTE::EutraNbrsMeas>, PerEntry, "LTE Neighbor ", PerField, Field},
-    {"LTE UMTS Neighbor Cell Meas", entries<&LTE::UtraNbrsMeas>, PerEntry, "UMTS Neighbor ", PerField, Field},
-    {"LTE GSM Neighbor Cell Meas", entries<&LTE::GeraNbrsMeas>, PerEntry, "GSM Neighbor ", PerField, Field},
-    {"LTE CA Status", entries<&LTE::CAStatusList>, PerEntry, "Component Carrier ", PerField, Field},
-    {"LTE Active Bearers", entries<&Common::activeBearer>, PerEntry, "PDP ", PerField, Field},
+    {"LTE Serving Cell Meas",          entries<&LTE::RsrpRsrqSinr>,                 One,      "",                   PerField, Field},
+    {"LTE Tx Power",                   entries<&LTE::TxPower>,                      PerEntry, "TxPowerInfo ",       PerField, Field},
+    {"LTE Sel Resel Parameters",       entry<&LTE::SelReselCellInfo>,               One,      "",                   PerField, Field},
+    {"LTE EUTRA Neighbor Info",        entries<&LTE::EutraNbrs>,                    PerEntry, "EUTRA Neighbor ",    PerField, Field},
+    {"LTE C-DRX",                      dictionary<&Store::myLTECDRXConfigDict>,     One,      "",                   PerField, Field},
+    {"LTE LTE Neighbor Cell Meas",     entries<&LTE::EutraNbrsMeas>,                PerEntry, "LTE Neighbor ",      PerField, Field},
+    {"LTE UMTS Neighbor Cell Meas",    entries<&LTE::UtraNbrsMeas>,                 PerEntry, "UMTS Neighbor ",     PerField, Field},
+    {"LTE GSM Neighbor Cell Meas",     entries<&LTE::GeraNbrsMeas>,                 PerEntry, "GSM Neighbor ",      PerField, Field},
+    {"LTE CA Status",                  entries<&LTE::CAStatusList>,                 PerEntry, "Component Carrier ", PerField, Field},
+    {"LTE Active Bearers",             entries<&Common::activeBearer>,              PerEntry, "PDP ",               PerField, Field},
 
-    {"UMTS NAS GMM", dictionary<&Store::myGMMContextDict>, One, "", PerField, Field},
-    {"UMTS NAS MM", dictionary<&Store::myMMContextDict>, One, "", PerField, Field},
-    {"UMTS RRC State", dictionary<&Store::myUMTSRRCStateDict>, One, "", PerField, Field},
-    {"UMTS RRC Configuration", dictionary<&Store::myUMTSRRCConfigDict>, One, "", PerField, Field},
-    {"UMTS Serving Cell Info", dictionary<&Store::myUMTSCellInfoDict>, One, "", PerField, Field},
+    {"UMTS NAS GMM",                   dictionary<&Store::myGMMContextDict>,        One,      "",                   PerField, Field},
+    {"UMTS NAS MM",                    dictionary<&Store::myMMContextDict>,         One,      "",                   PerField, Field},
+    {"UMTS RRC State",                 dictionary<&Store::myUMTSRRCStateDict>,      One,      "",                   PerField, Field},
+    {"UMTS RRC Configuration",         dictionary<&Store::myUMTSRRCConfigDict>,     One,      "",                   PerField, Field},
+    {"UMTS Serving Cell Info",         dictionary<&Store::myUMTSCellInfoDict>,      One,      "",                   PerField, Field},
     // Counted, never drawn: the cells of these entries stand under "UMTS Serving Cell Measurement", below.
-    {"UMTS Serving Cell Meas", entries<&UMTS::rXInfo>, PerEntry, "RxInfo ", PerField, ComeBackLater},
-    {"UMTS Tx Power", entries<&UMTS::TxPower>, PerEntry, "TxPowerInfo ", PerField, Field},
-    {"UMTS Sel Resel Parameters", entry<&UMTS::SelReselCellInfo>, One, "", PerField, Field},
-    {"UMTS EUTRA Neighbor Info", entries<&UMTS::eUtraNbrs>, PerEntry, "EUTRA Neighbor ", PerField, Field},
-    {"UMTS UTRA Neighbor Info", entries<&UMTS::utraNbrs>, PerEntry, "UTRA Neighbor ", PerField, Field},
-    {"UMTS GSM Neighbor Info", entries<&UMTS::geraNbrs>, PerEntry, "GSM Neighbor ", PerField, Field},
-    {"UMTS LTE Neighbor Cell Meas", entries<&UMTS::eUtraNbrMeas>, PerEntry, "LTE Neighbor ", PerField, Field},
-    {"UMTS UMTS Neighbor Cell Meas", entries<&UMTS::utraNbrMeas>, PerEntry, "UMTS Neighbor ", PerField, Field},
-    {"UMTS GSM Neighbor Cell Meas", entries<&UMTS::geraNbrMeas>, PerEntry, "GSM Neighbor ", PerField, Field},
-    {"UMTS Active Bearers", entries<&Common::activeBearer>, PerEntry, "PDP ", PerField, Field},
+    {"UMTS Serving Cell Meas",         entries<&UMTS::rXInfo>,                      PerEntry, "RxInfo ",            PerField, ComeBackLater},
+    {"UMTS Tx Power",                  entries<&UMTS::TxPower>,                     PerEntry, "TxPowerInfo ",       PerField, Field},
+    {"UMTS Sel Resel Parameters",      entry<&UMTS::SelReselCellInfo>,              One,      "",                   PerField, Field},
+    {"UMTS EUTRA Neighbor Info",       entries<&UMTS::eUtraNbrs>,                   PerEntry, "EUTRA Neighbor ",    PerField, Field},
+    {"UMTS UTRA Neighbor Info",        entries<&UMTS::utraNbrs>,                    PerEntry, "UTRA Neighbor ",     PerField, Field},
+    {"UMTS GSM Neighbor Info",         entries<&UMTS::geraNbrs>,                    PerEntry, "GSM Neighbor ",      PerField, Field},
+    {"UMTS LTE Neighbor Cell Meas",    entries<&UMTS::eUtraNbrMeas>,                PerEntry, "LTE Neighbor ",      PerField, Field},
+    {"UMTS UMTS Neighbor Cell Meas",   entries<&UMTS::utraNbrMeas>,                 PerEntry, "UMTS Neighbor ",     PerField, Field},
+    {"UMTS GSM Neighbor Cell Meas",    entries<&UMTS::geraNbrMeas>,                 PerEntry, "GSM Neighbor ",      PerField, Field},
+    {"UMTS Active Bearers",            entries<&Common::activeBearer>,              PerEntry, "PDP ",               PerField, Field},
 
-    {"GSM NAS GMM", dictionary<&Store::myGMMContextDict>, One, "", PerField, Field},
-    {"GSM NAS MM", dictionary<&Store::myMMContextDict>, One, "", PerField, Field},
+    {"GSM NAS GMM",                    dictionary<&Store::myGMMContextDict>,        One,      "",                   PerField, Field},
+    {"GSM NAS MM",                     dictionary<&Store::myMMContextDict>,         One,      "",                   PerField, Field},
     // The dictionaries of GSM have cells but no row rule: the first pair alone is shown.
-    {"GSM Serving Cell Info", dictionary<&Store::myGSMScellInfoDict>, One, "", OneRow, Field},
-    {"GSM Idle Config", dictionary<&Store::myGSMIdleConfigInfoDict>, One, "", OneRow, Field},
-    {"GSM Idle Serv Cell Meas", dictionary<&Store::myGSMIdleScellMeasDict>, One, "", OneRow, Field},
+    {"GSM Serving Cell Info",          dictionary<&Store::myGSMScellInfoDict>,      One,      "",                   OneRow,   Field},
+    {"GSM Idle Config",                dictionary<&Store::myGSMIdleConfigInfoDict>, One,      "",                   OneRow,   Field},
+    {"GSM Idle Serv Cell Meas",        dictionary<&Store::myGSMIdleScellMeasDict>,  One,      "",                   OneRow,   Field},
     // Its cells stand under a key without the technology, "Connected Serv Cell Meas", below.
-    {"GSM Connected Serv Cell Meas", none, One, "", OneRow, ComeBackLater},
+    {"GSM Connected Serv Cell Meas",   none,                                        One,      "",                   OneRow,   ComeBackLater},
     // "GSM" and "GSM GPRS Config" join to this; the cells stand under "GSM GPRS Config", below.
-    {"GSM GSM GPRS Config", none, One, "", OneRow, ComeBackLater},
-    {"GSM LTE Neighbor Cell Meas", entries<&GSM::eUtraNbrMeas>, PerEntry, "LTE Neighbor ", PerField, Field},
-    {"GSM UMTS Neighbor Cell Meas", entries<&GSM::utraNbrMeas>, PerEntry, "UMTS Neighbor ", PerField, Field},
-    {"GSM GSM Neighbor Cell Meas", entries<&GSM::geraNbrMeas>, PerEntry, "GSM Neighbor ", PerField, Field},
-    {"GSM Active Bearers", entries<&Common::activeBearer>, PerEntry, "PDP ", PerField, Field},
+    {"GSM GSM GPRS Config",            none,                                        One,      "",                   OneRow,   ComeBackLater},
+    {"GSM LTE Neighbor Cell Meas",     entries<&GSM::eUtraNbrMeas>,                 PerEntry, "LTE Neighbor ",      PerField, Field},
+    {"GSM UMTS Neighbor Cell Meas",    entries<&GSM::utraNbrMeas>,                  PerEntry, "UMTS Neighbor ",     PerField, Field},
+    {"GSM GSM Neighbor Cell Meas",     entries<&GSM::geraNbrMeas>,                  PerEntry, "GSM Neighbor ",      PerField, Field},
+    {"GSM Active Bearers",             entries<&Common::activeBearer>,              PerEntry, "PDP ",               PerField, Field},
 
     // Keys that the lists never join to. Cells alone are known of them, so each has one section, no header and one row.
-    {"UMTS Serving Cell Measurement", entries<&UMTS::rXInfo>, One, "", OneRow, Field},
-    {"Connected Serv Cell Meas", dictionary<&Store::myGSMConnRfMeasDict>, One, "", OneRow, Field},
-    {"LTE Component Carrier Info", dictionary<&Store::myLTECompCarrDict>, One, "", OneRow, Field},
-    {"GSM GPRS Config", dictionary<&Store::myGSMGPRSConfigDict>, One, "", OneRow, Field},
+    {"UMTS Serving Cell Measurement",  entries<&UMTS::rXInfo>,                      One,      "",                   OneRow,   Field},
+    {"Connected Serv Cell Meas",       dictionary<&Store::myGSMConnRfMeasDict>,     One,      "",                   OneRow,   Field},
+    {"LTE Component Carrier Info",     dictionary<&Store::myLTECompCarrDict>,       One,      "",                   OneRow,   Field},
+    {"GSM GPRS Config",                dictionary<&Store::myGSMGPRSConfigDict>,     One,      "",                   OneRow,   Field},
 };
 constexpr CategoryPageRule fallback = {"", none, One, "", OneRow, ComeBackLater};
 // clang-format on

@@ -18,6 +18,10 @@ NavigationStack::~NavigationStack() {
   while (!pages_.empty()) pages_.pop_back();
 }
 
+void NavigationStack::didReceiveMemoryWarning() {
+  for (const auto& page : pages_) page->didReceiveMemoryWarning();
+}
+
 bool NavigationStack::tap(const ListCell& cell) {
   auto destination = description_.makeDestination(cell.identifier);
   if (!destination) return false;
@@ -42,6 +46,15 @@ void NavigationStack::push(std::unique_ptr<ListPage> page) {
   pages_.push_back(std::move(page));
   topPage().viewDidLoad();
   if (observer_) observer_->didPush(topPage());
+}
+
+std::string navigationPath(const NavigationStack& navigation) {
+  std::string path;
+  for (std::size_t index = 0; index < navigation.depth(); ++index) {
+    if (index > 0) path += " › ";
+    path += navigation.page(index).title();
+  }
+  return path;
 }
 
 }  // namespace probeview

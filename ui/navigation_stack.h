@@ -3,6 +3,7 @@
 
 #include <cstddef>
 #include <memory>
+#include <string>
 #include <vector>
 
 #include "ui/interface_description.h"
@@ -31,6 +32,11 @@ class NavigationStack {
   NavigationStack& operator=(const NavigationStack&) = delete;
   virtual ~NavigationStack();
 
+  // Called once, when a front is about to show the stack.
+  virtual void viewDidLoad() {}
+  // Passes the warning to every page.
+  virtual void didReceiveMemoryWarning();
+
   // At least 1.
   std::size_t depth() const { return pages_.size(); }
   // 0 is the root; the index must be below depth().
@@ -40,6 +46,8 @@ class NavigationStack {
   // Follows the wire of the tapped cell of the top page: makes the destination, lets the top page fill it, pushes it.
   // False when the cell leads nowhere.
   bool tap(const ListCell& cell);
+  // Pushes a page that no tap leads to, its properties set.
+  void push(std::unique_ptr<ListPage> page);
   // Goes back one page; false at the root, which stays.
   bool pop();
   void popToRoot();
@@ -48,11 +56,12 @@ class NavigationStack {
   void setObserver(NavigationObserver* observer) { observer_ = observer; }
 
  private:
-  void push(std::unique_ptr<ListPage> page);
-
   InterfaceDescription description_;
   std::vector<std::unique_ptr<ListPage>> pages_;
   NavigationObserver* observer_ = nullptr;
 };
+
+// The titles of the stack's pages, from the root to the top, as "probeview › LTE › Tx Power".
+std::string navigationPath(const NavigationStack& navigation);
 
 }  // namespace probeview

@@ -165,4 +165,31 @@ void applyEdit(PageSnapshot& shown, const SnapshotEdit& edit, const PageSnapshot
   }
 }
 
+std::optional<RowPlace> followRow(RowPlace place, const std::vector<SnapshotEdit>& edits) {
+  for (const auto& edit : edits) {
+    switch (edit.kind) {
+      case Kind::RemoveRows:
+        if (edit.section != place.section || place.row < edit.first) break;
+        if (place.row < edit.first + edit.count) return std::nullopt;
+        place.row -= edit.count;
+        break;
+      case Kind::InsertRows:
+        if (edit.section == place.section && edit.first <= place.row) place.row += edit.count;
+        break;
+      case Kind::RemoveSections:
+        if (place.section < edit.section) break;
+        if (place.section < edit.section + edit.count) return std::nullopt;
+        place.section -= edit.count;
+        break;
+      case Kind::InsertSections:
+        if (edit.section <= place.section) place.section += edit.count;
+        break;
+      case Kind::ChangeRows:
+      case Kind::ChangeTitle:
+        break;
+    }
+  }
+  return place;
+}
+
 }  // namespace probeview

@@ -6,6 +6,7 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <optional>
 #include <vector>
 
 #include "ui/page_snapshot.h"
@@ -36,5 +37,16 @@ std::vector<SnapshotEdit> snapshotDifference(const PageSnapshot& before, const P
 
 // Applies one edit of a difference; the rows and sections that come are taken from the after-snapshot.
 void applyEdit(PageSnapshot& shown, const SnapshotEdit& edit, const PageSnapshot& after);
+
+// Where a row is.
+struct RowPlace {
+  std::size_t section = 0;
+  std::size_t row = 0;
+
+  friend auto operator<=>(const RowPlace&, const RowPlace&) = default;
+};
+
+// Where a row of the one snapshot is in the other; absent when it is gone.
+std::optional<RowPlace> followRow(RowPlace place, const std::vector<SnapshotEdit>& edits);
 
 }  // namespace probeview

@@ -3,7 +3,6 @@
 
 namespace probeview {
 
-// clang-format off: one category a line, as they stand in the lists.
 VarnetViewItems::VarnetViewItems()
     : launchViewItemNames{"Device Info", "LTE", "UMTS", "GSM"},
       firstLevelViewItems{
@@ -62,7 +61,6 @@ VarnetViewItems::VarnetViewItems()
                "Active Bearers",
            }},
       } {}
-// clang-format on
 
 const VarnetViewItems& launchViewItems() {
   static const auto* items = new VarnetViewItems;

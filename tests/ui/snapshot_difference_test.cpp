@@ -129,6 +129,32 @@ TEST_P(RandomPages, FieldsThatComeAndGoNeverRemoveAFieldThatStays) {
   }
 }
 
+TEST_P(RandomPages, ARowIsFollowedToWhereItsLabelIsOrIsGone) {
+  for (int turn = 0; turn < 500; ++turn) {
+    auto before = randomPage();
+    const auto after = randomPage();
+    auto shown = before;
+    const auto edits = snapshotDifference(before, after);
+    // Marks each row of the page before, follows the marks through the edits by hand, and compares.
+    for (std::size_t section = 0; section < shown.sections.size(); ++section) {
+      for (std::size_t index = 0; index < shown.sections[section].rows.size(); ++index) {
+        auto marked = before;
+        marked.sections[section].rows[index].identifier = "marked";
+        std::optional<RowPlace> expected;
+        for (const auto& edit : edits) {
+          if (edit.kind != Kind::ChangeRows) applyEdit(marked, edit, after);
+        }
+        for (std::size_t at = 0; at < marked.sections.size(); ++at) {
+          for (std::size_t place = 0; place < marked.sections[at].rows.size(); ++place) {
+            if (marked.sections[at].rows[place].identifier == "marked") expected = {at, place};
+          }
+        }
+        ASSERT_EQ(followRow({section, index}, edits), expected);
+      }
+    }
+  }
+}
+
 INSTANTIATE_TEST_SUITE_P(Seeds, RandomPages, testing::Range(1u, 5u));
 
 }  // namespace

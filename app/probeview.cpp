@@ -1,0 +1,47 @@
+// SPDX-License-Identifier: Apache-2.0
+#include <CLI/CLI.hpp>
+#include <ostream>
+
+#include "app/viewer.h"
+
+namespace probeview {
+
+int runProbeview(int argc, char** argv, std::ostream& output, std::ostream& errors) {
+  CLI::App program(
+      "Shows the live state of the phone's cellular radio: LTE, UMTS and GSM cells, measurements, connection states,\n"
+      "mobility contexts, bearers and SIM files, as the baseband service radixd reports them.",
+      "probeview");
+  program.set_version_flag("--version", "probeview " PROBEVIEW_VERSION);
+  ViewerOptions options;
+  auto* window = program.add_flag_callback(
+      "--window", [&] { options.front = FrontKind::Window; },
+      "Show the pages in a window (default where there is a display)");
+  auto* terminal = program.add_flag_callback(
+      "--terminal", [&] { options.front = FrontKind::Terminal; },
+      "Show the pages in the terminal (default where there is no display)");
+  auto* print = program.add_flag_callback(
+      "--print", [&] { options.front = FrontKind::Print; },
+      "Wait until every metric has come once, at most 15 s, then print every page as plain text and end");
+  window->excludes(terminal)->excludes(print);
+  terminal->excludes(print);
+  program
+      .add_option("--log", options.logFile,
+                  "Write the console log of every metric to this file (default: standard output, and nowhere in "
+                  "the terminal)")
+      ->type_name("FILE");
+  program.footer(
+      "Environment:\n"
+      "  RADIXD_SOCKET    the service's socket (default: the user's service, else the system's)\n\n"
+      "Exit status: 0 when all went well, 1 when the pages could not be shown, 2 when the command line was not "
+      "understood.");
+  try {
+    program.parse(argc, argv);
+  } catch (const CLI::ParseError& error) {
+    return program.exit(error, output, errors) == 0 ? 0 : 2;
+  }
+  // What is left is the program's name: the window has options of its own, which are not offered here.
+  int windowArguments = 1;
+  return runViewer(options, windowArguments, argv, errors);
+}
+
+}  // namespace probeview

@@ -1,0 +1,31 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include "app/fill_watch.h"
+#include "app/root_navigation_controller.h"
+#include "ui/front.h"
+#include "ui/status_line.h"
+
+namespace probeview {
+
+// A metric session of this process, whatever shows it: the wrapper, the store and the root controller, made on the
+// front's main queue. One per process, because wrapper and store are. Another console or system log is named before.
+// Main thread.
+class Session {
+ public:
+  // Names the front's queue as the program's main queue; the front must outlive the session.
+  explicit Session(Front& front);
+
+  RootNavigationController& navigation() { return navigation_; }
+  // Why the pages move or stand still. The session must outlive it.
+  StatusText statusText() const;
+  // Whether the store has got what there is to get; to be asked often.
+  bool isFilled() { return fillWatch_.isFilled(); }
+
+ private:
+  RootNavigationController navigation_;
+  StatusLine statusLine_;
+  FillWatch fillWatch_;
+};
+
+}  // namespace probeview

@@ -1,0 +1,81 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "app/viewer.h"
+
+#include <fcntl.h>
+#include <unistd.h>
+
+#include <cerrno>
+#include <csignal>
+#include <cstring>
+#include <memory>
+#include <ostream>
+
+#include "app/application.h"
+#include "app/window_front.h"
+#include "platform/console_log.h"
+#include "platform/system_log.h"
+#include "ui/open_page.h"
+#include "ui/print_front.h"
+#include "ui/terminal/terminal_front.h"
+
+namespace probeview {
+
+namespace {
+
+class NoLines final : public LineSink {
+ public:
+  void line(std::string_view) override {}
+};
+
+// The logs live as long as the process: wrapper and store keep referring to them.
+bool chooseLogs(const ViewerOptions& options, FrontKind front, std::ostream& errors) {
+  const bool pagesOnly = options.pagesOnly || front == FrontKind::Terminal;
+  if (options.logFile) {
+    const int file = ::open(options.logFile->c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0600);
+    if (file < 0) {
+      errors << "the log file " << *options.logFile << " cannot be written: " << std::strerror(errno)
+             << "; name another with --log\n";
+      return false;
+    }
+    setConsoleLog(*new ConsoleLog(file));
+  } else if (pagesOnly) {
+    setConsoleLog(*new NoLines);
+  }
+  if (pagesOnly) setSystemLog(*new SystemLog("probeview", SystemLog::Echo::None));
+  return true;
+}
+
+std::unique_ptr<Front> makeFront(FrontKind kind, int& argc, char** argv, std::string& error) {
+  switch (kind) {
+    case FrontKind::Window:
+      return makeWindowFront(argc, argv, error);
+    case FrontKind::Terminal:
+      return terminal::TerminalFront::make(error);
+    case FrontKind::Print:
+      return std::make_unique<PrintFront>(STDOUT_FILENO);
+  }
+  return nullptr;
+}
+
+}  // namespace
+
+int runViewer(const ViewerOptions& options, int& argc, char** argv, std::ostream& errors) {
+  // A reader that goes away is an end, not an accident.
+  std::signal(SIGPIPE, SIG_IGN);
+  const auto kind = chooseFront(frontCircumstances(options.front, hasWindowFront));
+  if (!chooseLogs(options, kind, errors)) return 1;
+  std::string error;
+  const auto front = makeFront(kind, argc, argv, error);
+  if (!front) {
+    errors << error << "\n";
+    return 1;
+  }
+  return applicationMain("AppDelegate", *front, [&](Session& session) {
+    if (options.pageKey) openPage(session.navigation(), *options.pageKey);
+    if (auto* print = dynamic_cast<PrintFront*>(front.get())) {
+      print->waitUntil([&session] { return session.isFilled(); });
+    }
+  });
+}
+
+}  // namespace probeview

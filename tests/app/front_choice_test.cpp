@@ -1,0 +1,76 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "app/front_choice.h"
+
+#include <gtest/gtest.h>
+
+#include <sstream>
+
+#include "app/viewer.h"
+
+namespace probeview {
+namespace {
+
+TEST(FrontChoice, WhatIsAskedForIsTakenWhateverTheCircumstances) {
+  for (const auto asked : {FrontKind::Window, FrontKind::Terminal, FrontKind::Print}) {
+    EXPECT_EQ(chooseFront({asked, true, true, true}), asked);
+    EXPECT_EQ(chooseFront({asked, false, false, false}), asked);
+  }
+}
+
+TEST(FrontChoice, AWindowNeedsADisplayAndABuildThatHasIt) {
+  EXPECT_EQ(chooseFront({std::nullopt, true, true, true}), FrontKind::Window);
+  EXPECT_EQ(chooseFront({std::nullopt, true, false, true}), FrontKind::Terminal);
+  EXPECT_EQ(chooseFront({std::nullopt, false, true, true}), FrontKind::Terminal);
+}
+
+TEST(FrontChoice, WithNeitherDisplayNorTerminalThePagesArePrinted) {
+  EXPECT_EQ(chooseFront({std::nullopt, true, false, false}), FrontKind::Print);
+}
+
+struct Answer {
+  int status;
+  std::string output;
+  std::string errors;
+};
+
+Answer run(std::vector<std::string> arguments) {
+  arguments.insert(arguments.begin(), "probeview");
+  std::vector<char*> pointers;
+  for (auto& argument : arguments) pointers.push_back(argument.data());
+  pointers.push_back(nullptr);
+  std::ostringstream output;
+  std::ostringstream errors;
+  const int status = runProbeview(static_cast<int>(arguments.size()), pointers.data(), output, errors);
+  return {status, output.str(), errors.str()};
+}
+
+TEST(CommandLine, TheVersionIsTheOneOfTheProject) {
+  const auto answer = run({"--version"});
+  EXPECT_EQ(answer.status, 0);
+  EXPECT_EQ(answer.output, "probeview " PROBEVIEW_VERSION "\n");
+}
+
+TEST(CommandLine, HelpNamesEveryFrontAndTheEnvironment) {
+  const auto answer = run({"--help"});
+  EXPECT_EQ(answer.status, 0);
+  for (const std::string word : {"--window", "--terminal", "--print", "--log", "RADIXD_SOCKET", "--version"}) {
+    EXPECT_NE(answer.output.find(word), std::string::npos) << word;
+  }
+}
+
+TEST(CommandLine, WhatIsNotUnderstoodIsAUsageError) {
+  EXPECT_EQ(run({"--windw"}).status, 2);
+  EXPECT_EQ(run({"--window", "--print"}).status, 2);
+  EXPECT_EQ(run({"--log"}).status, 2);
+  EXPECT_NE(run({"--windw"}).errors.find("--windw"), std::string::npos);
+}
+
+TEST(CommandLine, ALogFileThatCannotBeWrittenIsNamed) {
+  const auto answer = run({"--print", "--log", "/nonexistent/log"});
+  EXPECT_EQ(answer.status, 1);
+  EXPECT_EQ(answer.errors,
+            "the log file /nonexistent/log cannot be written: No such file or directory; name another with --log\n");
+}
+
+}  // namespace
+}  // namespace probeview

@@ -1,0 +1,114 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "ui/print_front.h"
+
+#include <fcntl.h>
+
+#include <csignal>
+
+#include "platform/file_descriptor.h"
+#include "tests/ui/testing.h"
+#include "ui/open_page.h"
+#include "ui/varnet_view_items.h"
+
+namespace probeview {
+namespace {
+
+using namespace std::chrono_literals;
+
+struct Pipe {
+  Pipe() {
+    int ends[2] = {};
+    EXPECT_EQ(::pipe2(ends, O_CLOEXEC), 0);
+    reading = FileDescriptor(ends[0]);
+    writing = FileDescriptor(ends[1]);
+    // All pages fit, so that nobody needs to read meanwhile.
+    ::fcntl(writing.number(), F_SETPIPE_SZ, 1 << 18);
+  }
+  FileDescriptor reading;
+  FileDescriptor writing;
+};
+
+class Printing : public testing_ui::PagesTest {
+ protected:
+  std::string printed() {
+    pipe.writing.close();
+    std::string text;
+    char buffer[4096];
+    for (ssize_t count = 0; (count = ::read(pipe.reading.number(), buffer, sizeof buffer)) > 0;) {
+      text.append(buffer, static_cast<std::size_t>(count));
+    }
+    return text;
+  }
+
+  Pipe pipe;
+  PrintFront front{pipe.writing.number()};
+  NavigationStack stack{InterfaceDescription(PageEnvironment{front.mainQueue(), front.scheduler(), console, store})};
+  const StatusText status = [] { return "the status"; };
+};
+
+TEST_F(Printing, EveryPageIsPrintedOnceInTheOrderOfTheListsAndThenTheStatus) {
+  EXPECT_EQ(front.run(stack, status), 0);
+  EXPECT_EQ(stack.depth(), 1u);
+  const auto text = printed();
+  std::size_t at = 0;
+  std::size_t headings = 0;
+  for (const auto& technology : launchViewItems().launchViewItemNames) {
+    for (const auto& category : launchViewItems().firstLevelViewItems.at(technology)) {
+      at = text.find("probeview › " + technology + " › " + category + "\n", at);
+      ASSERT_NE(at, std::string::npos) << technology << " " << category;
+      ++at;
+    }
+  }
+  for (std::size_t place = text.find("probeview › "); place != std::string::npos;
+       place = text.find("probeview › ", place + 1)) {
+    ++headings;
+  }
+  EXPECT_EQ(headings, 42u);
+  EXPECT_NE(text.find("probeview › LTE › Tx Power\n"
+                      "TxPowerInfo 0\n"
+                      "  Waiting for Update  Waiting for Update\n\n"),
+            std::string::npos);
+  EXPECT_TRUE(text.ends_with("\n\nthe status\n"));
+}
+
+TEST_F(Printing, AStackThatStandsOnAPagePrintsThatPageAlone) {
+  store.filled[DisplayDictionary::myLTERRCStateDict] = Dictionary{{"state", Value::text("IDLE")}};
+  ASSERT_TRUE(openPage(stack, "LTE RRC State"));
+  EXPECT_EQ(front.run(stack, status), 0);
+  EXPECT_EQ(printed(),
+            "probeview › LTE › RRC State\n"
+            "  state  IDLE\n\n"
+            "the status\n");
+}
+
+TEST_F(Printing, NothingIsPrintedBeforeTheStoreIsFilled) {
+  ASSERT_TRUE(openPage(stack, "LTE RRC State"));
+  front.mainQueue().post([this] {
+    store.filled[DisplayDictionary::myLTERRCStateDict] = Dictionary{{"came", Value::text("late")}};
+  });
+  front.waitUntil([this] { return store.myLTERRCStateDict().has_value(); });
+  EXPECT_EQ(front.run(stack, status), 0);
+  EXPECT_NE(printed().find("came  late"), std::string::npos);
+}
+
+TEST_F(Printing, AReaderThatWentAwayEndsThePrintingInPeace) {
+  std::signal(SIGPIPE, SIG_IGN);
+  pipe.reading.close();
+  EXPECT_EQ(front.run(stack, status), 0);
+  EXPECT_EQ(stack.depth(), 1u);
+  std::signal(SIGPIPE, SIG_DFL);
+}
+
+TEST_F(Printing, AKeyThatNoRowsJoinToOpensNothing) {
+  EXPECT_FALSE(openPage(stack, "LTE"));
+  EXPECT_FALSE(openPage(stack, "Connected Serv Cell Meas"));
+  EXPECT_FALSE(openPage(stack, "lte tx power"));
+  EXPECT_EQ(stack.depth(), 1u);
+  for (const auto& key : navigablePageKeys()) {
+    EXPECT_TRUE(openPage(stack, key)) << key;
+    EXPECT_EQ(stack.depth(), 3u);
+  }
+}
+
+}  // namespace
+}  // namespace probeview

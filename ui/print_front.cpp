@@ -1,0 +1,55 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "ui/print_front.h"
+
+#include <unistd.h>
+
+#include <cerrno>
+
+#include "ui/page_snapshot.h"
+
+namespace probeview {
+
+int PrintFront::run(NavigationStack& navigation, const StatusText& status) {
+  if (isFilled_) {
+    // Nothing else may wake the loop when the last that is waited for is silence.
+    const auto wake = loop_.every(std::chrono::milliseconds(200), [] {});
+    loop_.runUntil(isFilled_, patience);
+  }
+  const bool onePage = navigation.depth() > 1;
+  if (onePage ? printTopPage(navigation) : printBelow(navigation)) write(status() + "\n");
+  return 0;
+}
+
+bool PrintFront::printTopPage(const NavigationStack& navigation) {
+  return write(navigationPath(navigation) + "\n" + plainText(takeSnapshot(navigation.topPage())) + "\n");
+}
+
+bool PrintFront::printBelow(NavigationStack& navigation) {
+  const auto technologies = takeSnapshot(navigation.topPage());
+  bool isRead = true;
+  for (const auto& technology : technologies.sections.front().rows) {
+    navigation.tap(technology);
+    const auto categories = takeSnapshot(navigation.topPage());
+    for (const auto& category : categories.sections.front().rows) {
+      navigation.tap(category);
+      isRead = printTopPage(navigation);
+      navigation.pop();
+      if (!isRead) break;
+    }
+    navigation.pop();
+    if (!isRead) break;
+  }
+  return isRead;
+}
+
+bool PrintFront::write(std::string_view text) {
+  while (!text.empty()) {
+    const auto written = ::write(fileDescriptor_, text.data(), text.size());
+    if (written < 0 && errno == EINTR) continue;
+    if (written < 0) return false;
+    text.remove_prefix(static_cast<std::size_t>(written));
+  }
+  return true;
+}
+
+}  // namespace probeview

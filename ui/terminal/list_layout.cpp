@@ -1,0 +1,133 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "ui/terminal/list_layout.h"
+
+#include <wchar.h>
+
+#include <algorithm>
+
+#include "ui/interface_description.h"
+#include "values/printer.h"
+
+namespace probeview::terminal {
+
+namespace {
+
+constexpr wchar_t replacement = L'\ufffd';
+constexpr wchar_t ellipsis = L'…';
+constexpr int gap = 2;  // between label and value
+
+int columnsOf(wchar_t character) { return std::max(::wcwidth(character), 0); }
+
+// The next character of well-formed UTF-8.
+char32_t nextCharacter(std::string_view text, std::size_t& at) {
+  const auto lead = static_cast<unsigned char>(text[at++]);
+  if (lead < 0x80) return lead;
+  const int following = lead >= 0xf0 ? 3 : lead >= 0xe0 ? 2 : 1;
+  char32_t character = lead & (0x3fu >> following);
+  for (int byte = 0; byte < following; ++byte) character = (character << 6) | (text[at++] & 0x3f);
+  return character;
+}
+
+// How many characters of the text fit into the width; at least one, so that there is always a way on.
+std::size_t fitting(std::wstring_view text, int width) {
+  int used = 0;
+  std::size_t count = 0;
+  while (count < text.size() && used + columnsOf(text[count]) <= width) used += columnsOf(text[count++]);
+  return std::max<std::size_t>(count, 1);
+}
+
+}  // namespace
+
+std::wstring characters(std::string_view text) {
+  std::string valid;
+  appendValidUtf8(text, valid);
+  std::wstring out;
+  for (std::size_t at = 0; at < valid.size();) {
+    const auto character = static_cast<wchar_t>(nextCharacter(valid, at));
+    const bool isShown = character == L'\n' || ::wcwidth(character) >= 0;
+    out += isShown ? character : replacement;
+  }
+  return out;
+}
+
+int columns(std::wstring_view text) {
+  int count = 0;
+  for (const auto character : text) count += columnsOf(character);
+  return count;
+}
+
+std::vector<std::wstring> wrapped(std::wstring_view text, int width) {
+  std::vector<std::wstring> lines;
+  while (true) {
+    const auto lineEnd = std::min(text.find(L'\n'), text.size());
+    auto line = text.substr(0, lineEnd);
+    while (columns(line) > width) {
+      std::size_t count = fitting(line, width);
+      // A blank just past the end is as good a place as one before it.
+      const auto blank = line.substr(0, count + 1).rfind(L' ');
+      if (blank != std::wstring_view::npos && blank > 0) count = blank;
+      lines.emplace_back(line.substr(0, count));
+      line.remove_prefix(count);
+      if (!line.empty() && line.front() == L' ') line.remove_prefix(1);
+    }
+    if (!line.empty() || lineEnd == 0) lines.emplace_back(line);
+    if (lineEnd == text.size()) return lines;
+    text.remove_prefix(lineEnd + 1);
+  }
+}
+
+std::wstring shortened(std::wstring_view text, int width) {
+  if (columns(text) <= width) return std::wstring(text);
+  if (width < 1) return {};
+  std::wstring cut(width == 1 ? std::wstring_view{} : text.substr(0, fitting(text, width - 1)));
+  cut += ellipsis;
+  return cut;
+}
+
+ListLayout::Extent ListLayout::extentOf(RowPlace place) const {
+  const auto isOfRow = [&](const LaidOutLine& line) {
+    return line.kind == LaidOutLine::Kind::Row && line.place == place;
+  };
+  const auto first = std::find_if(lines.begin(), lines.end(), isOfRow);
+  const auto end = std::find_if_not(first, lines.end(), isOfRow);
+  return {static_cast<std::size_t>(first - lines.begin()), static_cast<std::size_t>(end - lines.begin())};
+}
+
+ListLayout layOut(const PageSnapshot& snapshot, int width) {
+  const int room = std::max(width - 4, 8);
+  int labelWidth = 0;
+  for (const auto& section : snapshot.sections) {
+    for (const auto& row : section.rows) {
+      if (row.text && row.detail) labelWidth = std::max(labelWidth, columns(characters(*row.text)));
+    }
+  }
+  // A value gets at least half of the line.
+  labelWidth = std::min(labelWidth, std::max(room / 2 - gap, 1));
+
+  ListLayout layout;
+  layout.detailColumn = labelWidth > 0 ? labelWidth + gap : 0;
+  for (std::size_t section = 0; section < snapshot.sections.size(); ++section) {
+    const auto& [title, rows] = snapshot.sections[section];
+    if (section > 0) layout.lines.emplace_back();
+    if (title) {
+      for (auto& line : wrapped(characters(*title), room)) {
+        layout.lines.push_back({LaidOutLine::Kind::Header, {}, std::move(line), {}, false});
+      }
+    }
+    for (std::size_t row = 0; row < rows.size(); ++row) {
+      const auto& cell = rows[row];
+      const auto label = wrapped(characters(cell.text.value_or("")), cell.detail ? labelWidth : room);
+      const auto detail = wrapped(characters(cell.detail.value_or("")), room - layout.detailColumn);
+      for (std::size_t line = 0; line < std::max(label.size(), detail.size()); ++line) {
+        layout.lines.push_back({LaidOutLine::Kind::Row,
+                                {section, row},
+                                line < label.size() ? label[line] : L"",
+                                line < detail.size() ? detail[line] : L"",
+                                line == 0 && showsDisclosure(cell.identifier)});
+      }
+    }
+  }
+  return layout;
+}
+
+}  // namespace probeview::terminal
