@@ -1,12 +1,16 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "store/metric_validator.h"
 
-#include <charconv>
-
 #include "client/radix_wrapper.h"
+#include "messages/runtime/codable.h"
+#include "messages/runtime/data_reader.h"
 #include "platform/fatal_error.h"
+#include "store/handler_turn.h"
+#include "store/handlers.h"
 
 namespace probeview {
+
+static_assert(handledMetricCount == 29, "the store keeps one message of each");
 
 namespace {
 
@@ -61,8 +65,29 @@ bool MetricValidator::handleMetric(const Dictionary& event) {
   line_ = "Metric ID in Hex = ";
   appendIdentifier(*metricID_, line_);
   surroundings_.console.line(line_);
-  surroundings_.console.line("I dont care for this Metric");
-  return false;
+  const HandledMetric* metric = handledMetric(*metricID_);
+  if (metric == nullptr) {
+    surroundings_.console.line("I dont care for this Metric");
+    return false;
+  }
+  HandlerTurn turn(*this, metric->handler.dictionary, metric->handler.prefix);
+  turn.store(decode(*metric, event));
+  metric->handler.rewrite(turn);
+  return true;
+}
+
+Dictionary MetricValidator::decode(const HandledMetric& metric, const Dictionary& event) {
+  const Value* payload = event.find(payloadKey);
+  const auto bytes = payload == nullptr ? std::nullopt : payload->bytes();
+  if (!bytes) fatalError("a metric event carries no payload for " + std::string(metric.message->name));
+  std::unique_ptr<PBCodable>& message = messages_[metric.index];
+  if (message == nullptr) message = metric.message->make();
+  PBDataReader reader(*bytes, &surroundings_.systemLog);
+  const bool decoded = message->readFrom(reader);
+  Dictionary content = message->dictionaryRepresentation();
+  message->reset();
+  if (!decoded) fatalError("a payload does not decode as " + std::string(metric.message->name));
+  return content;
 }
 
 const std::optional<Dictionary>& MetricValidator::displayDictionary(DisplayDictionary which) const {

@@ -27,7 +27,9 @@
 namespace probeview {
 
 class HandlerTurn;
+class PBCodable;
 class RadixWrapper;
+struct HandledMetric;
 
 class MetricValidator : public RadixWrapperDelegate {
  public:
@@ -181,6 +183,8 @@ class MetricValidator : public RadixWrapperDelegate {
  private:
   friend class HandlerTurn;
 
+  Dictionary decode(const HandledMetric& metric, const Dictionary& event);
+
   Surroundings surroundings_;
   std::optional<std::int64_t> metricID_;
   LTE lte_;
@@ -189,7 +193,9 @@ class MetricValidator : public RadixWrapperDelegate {
   Common common_;
   std::array<std::optional<Dictionary>, displayDictionaryCount> displayDictionaries_;
   TimestampFormatter timestampFormatter_;
-  // The line being built; kept between events for its memory.
+  // One message of each handled metric, empty between events; kept for its memory.
+  std::array<std::unique_ptr<PBCodable>, 29> messages_;
+  // The line being built; kept for its memory, too.
   std::string line_;
   // What the wrapper holds weakly, and what ends when the store does. It owns nothing.
   std::shared_ptr<RadixWrapperDelegate> self_;

@@ -1,0 +1,110 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// What the handler of a metric works with. Each algorithm of the handlers is written here once; a handler is a few of
+// them in its order, and its adjustments are tables.
+#pragma once
+
+#include <cstdint>
+#include <span>
+#include <string_view>
+#include <utility>
+
+#include "store/metric_validator.h"
+#include "values/dictionary.h"
+
+namespace probeview {
+
+// What becomes of one entry of an element. An entry that is absent, or not of the kind named, stays as it is.
+struct Adjustment {
+  enum class Kind : std::uint8_t {
+    SubtractInteger,  // integer − whole, in 32 bits; leaving them stops the program
+    DivideInteger,    // integer / whole, truncated toward zero
+    ScaleReal,        // real × factor + offset, as a double
+    DivideReal,       // real / factor, as a double
+    LookUpBandwidth,  // index → MHz as a 32-bit float; an index that the table lacks stays
+  };
+
+  std::string_view key;
+  Kind kind;
+  std::int32_t whole = 0;
+  double factor = 1.0;
+  double offset = 0.0;
+};
+
+constexpr Adjustment subtractInteger(std::string_view key, std::int32_t whole) {
+  return {key, Adjustment::Kind::SubtractInteger, whole};
+}
+constexpr Adjustment divideInteger(std::string_view key, std::int32_t divisor) {
+  return {key, Adjustment::Kind::DivideInteger, divisor};
+}
+constexpr Adjustment scaleReal(std::string_view key, double factor, double offset = 0.0) {
+  return {key, Adjustment::Kind::ScaleReal, 0, factor, offset};
+}
+constexpr Adjustment divideReal(std::string_view key, double divisor) {
+  return {key, Adjustment::Kind::DivideReal, 0, divisor};
+}
+constexpr Adjustment lookUpBandwidth(std::string_view key) { return {key, Adjustment::Kind::LookUpBandwidth}; }
+
+// The service sends measurements as indices of the reported ranges; shown is one edge of the interval.
+// 3GPP TS 36.133, 9.1.4 (RSRP, in dBm) and 9.1.7 (RSRQ, in half dB).
+constexpr Adjustment rsrpToDbm(std::string_view key) { return subtractInteger(key, 140); }
+constexpr Adjustment rsrqToDb(std::string_view key) { return scaleReal(key, 0.5, -19.5); }
+// 3GPP TS 25.133, 9.1.1.3 (RSCP, in dBm) and 9.1.2.3 (Ec/No, in half dB).
+constexpr Adjustment rscpToDbm(std::string_view key) { return subtractInteger(key, 116); }
+constexpr Adjustment ecnoToDb(std::string_view key) { return scaleReal(key, 0.5, -24.5); }
+// 3GPP TS 45.008, 8.1.4 (RxLev, in dBm).
+constexpr Adjustment rxlevToDbm(std::string_view key) { return subtractInteger(key, 110); }
+
+using Adjustments = std::span<const Adjustment>;
+using KeyNames = std::span<const std::string_view>;
+
+// One call of a handler. All goes through the store's overridable dictionary: what is read back is what it gives, and
+// one that is absent then stops the program.
+class HandlerTurn {
+ public:
+  HandlerTurn(MetricValidator& store, DisplayDictionary which, std::string_view prefix)
+      : store_(store), which_(which), prefix_(prefix) {}
+
+  // Replaces the whole display dictionary.
+  void store(Dictionary&& content) { store_.mutableDisplayDictionary(which_) = std::move(content); }
+  // Replaces the milliseconds under "timestamp", if there are any, by their text.
+  void formatTimestamp();
+  // Writes the handler's line: its prefix and the dictionary as it is now.
+  void log();
+
+  // Replaces a 32-bit integer by its half, truncated toward zero.
+  void halveInteger(std::string_view key);
+  // Replaces a list of integers by its printed form and writes that on a line of its own.
+  void flattenIntegers(std::string_view key);
+  // Replaces a dictionary, or a list of dictionaries, by its printed form.
+  void flattenDictionary(std::string_view key);
+  void flattenDictionaries(std::string_view key);
+
+  // Adjusts the elements of a list of dictionaries where they lie and gives each the parent's timestamp.
+  void rewriteList(std::string_view key, Adjustments adjustments = {});
+
+  // Replaces a record's list by the elements of a list of dictionaries, each adjusted in a copy and then given the
+  // parent's entries under the inherited names, as far as the parent has them. Without such a list the record's list
+  // stays as it was.
+  void collect(std::string_view key, List& record, Adjustments adjustments = {}, KeyNames inherited = timestampOnly);
+  static constexpr std::string_view timestampOnly[] = {"timestamp"};
+
+  // Gives each key of the record's entry the dictionary's value, or an empty text where the dictionary has none.
+  void mergeInto(Dictionary& record);
+
+  LTE& lte() { return store_.lte_; }
+  UMTS& umts() { return store_.umts_; }
+  GSM& gsm() { return store_.gsm_; }
+  Common& common() { return store_.common_; }
+
+ private:
+  Dictionary& dictionary();
+  void adjust(Dictionary& element, Adjustments adjustments) const;
+  [[noreturn]] void stop(std::string_view reason) const;
+
+  MetricValidator& store_;
+  DisplayDictionary which_;
+  std::string_view prefix_;
+};
+
+}  // namespace probeview

@@ -1,0 +1,51 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "store/handlers.h"
+
+#include <algorithm>
+#include <array>
+
+#include "messages/metric_identifiers.h"
+#include "platform/fatal_error.h"
+
+namespace probeview {
+
+namespace {
+
+using HandledMetrics = std::array<HandledMetric, handledMetricCount>;
+
+// In ascending order of the identifiers, so that the choice takes five comparisons.
+HandledMetrics handledMetricsInOrder() {
+  HandledMetrics metrics{};
+  std::size_t count = 0;
+  for (const auto family : {lteHandlers(), umtsHandlers(), gsmHandlers(), nasHandlers()}) {
+    for (const MetricHandler& handler : family) {
+      const MetricIdentifier* metric = metricWithId(handler.metricID);
+      if (count == metrics.size() || metric == nullptr || metric->message == nullptr) {
+        fatalError("a handler's metric is not among those that carry a message");
+      }
+      metrics[count++] = {handler, metric->message, 0};
+    }
+  }
+  if (count != metrics.size()) fatalError("a metric lacks its handler");
+  std::sort(metrics.begin(), metrics.end(),
+            [](const auto& left, const auto& right) { return left.handler.metricID < right.handler.metricID; });
+  for (std::size_t index = 0; index < metrics.size(); ++index) metrics[index].index = index;
+  return metrics;
+}
+
+}  // namespace
+
+const HandledMetric* handledMetric(std::int64_t metricID) {
+  static const HandledMetrics metrics = handledMetricsInOrder();
+  const auto found =
+      std::lower_bound(metrics.begin(), metrics.end(), metricID,
+                       [](const HandledMetric& metric, std::int64_t id) { return metric.handler.metricID < id; });
+  return found != metrics.end() && found->handler.metricID == metricID ? &*found : nullptr;
+}
+
+void formatTimestampAndLog(HandlerTurn& turn) {
+  turn.formatTimestamp();
+  turn.log();
+}
+
+}  // namespace probeview

@@ -1,0 +1,45 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// Handlers of the metrics that belong to no single radio technology: mobility management, bearers and SIM files.
+#include "messages/metric_identifiers.h"
+#include "store/handlers.h"
+
+namespace probeview {
+
+namespace {
+
+void emmContext(HandlerTurn& turn) {
+  turn.formatTimestamp();
+  turn.flattenDictionary("guti");
+  turn.flattenDictionaries("tai_list");
+  // The line shows the flattened texts.
+  turn.log();
+}
+
+void activeBearers(HandlerTurn& turn) {
+  formatTimestampAndLog(turn);
+  turn.collect("bearer_contexts", turn.common().activeBearer);
+}
+
+void simFiles(HandlerTurn& turn) {
+  formatTimestampAndLog(turn);
+  // Files are shown as they stand, without a timestamp.
+  turn.collect("ef_list", turn.common().simContents, {}, {});
+}
+
+constexpr MetricHandler handlers[] = {
+    {K_CELLULAR_MM_INFO, DisplayDictionary::myCellularMMCommonInfoDict,
+     "Received MM Common Info Dict is : ", formatTimestampAndLog},
+    {K_CELLULAR_MM_CTXT, DisplayDictionary::myMMContextDict, "Received MM Context Info is ", formatTimestampAndLog},
+    {K_CELLULAR_GMM_CTXT, DisplayDictionary::myGMMContextDict, "Received GMM Context Info is ", formatTimestampAndLog},
+    {K_LTE_EMM_CTXT, DisplayDictionary::myLTEEMMContextDict, "Received EMM Context is ", emmContext},
+    {K_CELLULAR_ACTIVE_BEARER, DisplayDictionary::myCellularActiveBearerDict, "Received Bearer Context Info is ",
+     activeBearers},
+    {K_SIM_FILE_INFO, DisplayDictionary::mySIMFileInfoDict, "Received SIM Card File Info is ", simFiles},
+};
+
+}  // namespace
+
+std::span<const MetricHandler> nasHandlers() { return handlers; }
+
+}  // namespace probeview

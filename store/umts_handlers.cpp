@@ -1,0 +1,60 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// Handlers of the UMTS metrics. The record's lists hold adjusted copies; the display dictionaries keep what came.
+#include "messages/metric_identifiers.h"
+#include "store/handlers.h"
+
+namespace probeview {
+
+namespace {
+
+void servingCellMeasurement(HandlerTurn& turn) {
+  static constexpr std::string_view inherited[] = {"timestamp", "connected_mode"};
+  formatTimestampAndLog(turn);
+  turn.collect("rx_info", turn.umts().rXInfo, {}, inherited);
+}
+
+void txPower(HandlerTurn& turn) {
+  formatTimestampAndLog(turn);
+  turn.collect("tx_power_info", turn.umts().TxPower);
+}
+
+void reselection(HandlerTurn& turn) {
+  formatTimestampAndLog(turn);
+  turn.flattenIntegers("multi_band_info");
+  turn.mergeInto(turn.umts().SelReselCellInfo);
+  turn.collect("eutra_prio_info", turn.umts().eUtraNbrs);
+  turn.collect("utra_prio_info", turn.umts().utraNbrs);
+  turn.collect("gsm_prio_info", turn.umts().geraNbrs);
+}
+
+void neighbourMeasurement(HandlerTurn& turn) {
+  static constexpr Adjustment utra[] = {rscpToDbm("rscp"), ecnoToDb("ecno")};
+  static constexpr Adjustment gsm[] = {rxlevToDbm("rxlev")};
+  static constexpr Adjustment lte[] = {rsrpToDbm("rsrp"), rsrqToDb("rsrq")};
+  formatTimestampAndLog(turn);
+  turn.collect("meas_utra_result", turn.umts().utraNbrMeas, utra);
+  turn.collect("meas_gsm_result", turn.umts().geraNbrMeas, gsm);
+  turn.collect("meas_lte_result", turn.umts().eUtraNbrMeas, lte);
+}
+
+constexpr MetricHandler handlers[] = {
+    {K_UMTS_SCELL_MEAS, DisplayDictionary::myUMTSCellMeasDict, "Received UMTS Serving Cell Meas is ",
+     servingCellMeasurement},
+    {K_UMTS_TX_POWER, DisplayDictionary::myUMTSTxPowerDict, "Received Tx Power is ", txPower},
+    {K_UMTS_SEL_RESEL_INFO, DisplayDictionary::myUMTSSelReselDict, "Received UMTS Cell Resel Info is ", reselection},
+    {K_UMTS_NCELL_MEAS, DisplayDictionary::myUMTSNbrMeasDict, "Received UMTS InterRat Meas Info is ",
+     neighbourMeasurement},
+    {K_UMTS_RRC_STATE, DisplayDictionary::myUMTSRRCStateDict, "Received UMTS RRC Connection State is ",
+     formatTimestampAndLog},
+    {K_UMTS_RRC_CONFIG, DisplayDictionary::myUMTSRRCConfigDict, "Received UMTS RRC Configuration is ",
+     formatTimestampAndLog},
+    {K_UMTS_SCELL_INFO, DisplayDictionary::myUMTSCellInfoDict, "Received UMTS Serving Cell Info is ",
+     formatTimestampAndLog},
+};
+
+}  // namespace
+
+std::span<const MetricHandler> umtsHandlers() { return handlers; }
+
+}  // namespace probeview
