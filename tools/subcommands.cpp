@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/subcommand.h"
 
+#include "tools/decode_command.h"
 #include "tools/store_command.h"
 
 namespace probeview {
@@ -9,6 +10,7 @@ namespace {
 
 // One line for each file; nothing else knows which subcommands there are.
 constexpr AddSubcommand subcommands[] = {
+    addDecodeCommand,
     addStoreCommand,
 };
 

@@ -1,0 +1,231 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "service/configuration.h"
+
+#include <algorithm>
+#include <charconv>
+#include <utility>
+
+#include "messages/metric_identifiers.h"
+#include "values/printer.h"
+
+namespace probeview {
+namespace {
+
+// Thrown where the TOML library finds one of its own assertions broken.
+struct BrokenAssertion {};
+
+// Version 3.3.0 asserts that a key's first character can begin a key before it looks whether it can: "[%" would stop
+// the service. What follows that assertion reports the character as it should, so it is let pass; any other would be
+// news to us, and refuses the file.
+inline void tomlAssertionBroken(std::string_view expression) {
+  if (expression.find("is_bare_key_character") == std::string_view::npos) throw BrokenAssertion{};
+}
+
+}  // namespace
+}  // namespace probeview
+
+// Assertions must stay assertions: without them the library takes their truth for granted.
+#undef NDEBUG
+#define TOML_ASSERT(expression) \
+  (static_cast<bool>(expression) ? static_cast<void>(0) : ::probeview::tomlAssertionBroken(#expression))
+// The library's compiled form throws; its header form, asked so, returns its errors.
+#define TOML_HEADER_ONLY 1
+#define TOML_EXCEPTIONS 0
+#include <toml++/toml.h>
+
+namespace probeview {
+
+namespace {
+
+constexpr std::int64_t longestPeriod = 86'400'000;  // a day, in milliseconds
+constexpr std::string_view onChange = "on change";
+// Dots nest one table in another, and the library takes tables apart by recursion; no file that is meant has so many.
+constexpr std::ptrdiff_t mostDots = 4000;
+constexpr std::size_t mostNotes = 100;
+
+// A text of the file as it may stand in a message: on one line, and not endless.
+std::string shown(std::string_view text) {
+  constexpr std::size_t longest = 60;
+  std::string out = printed(Value::text(text.substr(0, longest)));
+  if (text.size() > longest) out += "…";
+  return out;
+}
+
+std::optional<std::int64_t> parsedInteger(std::string_view text) {
+  int base = 10;
+  if (text.starts_with("0x") || text.starts_with("0X")) {
+    base = 16;
+    text.remove_prefix(2);
+  }
+  // A sign after 0x is no number either.
+  if (text.empty() || (base == 16 && text[0] == '-')) return std::nullopt;
+  std::int64_t number = 0;
+  const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), number, base);
+  if (error != std::errc() || end != text.data() + text.size()) return std::nullopt;
+  return number;
+}
+
+std::string hexText(std::int64_t number) {
+  char digits[24];
+  const auto [end, error] = std::to_chars(digits, digits + sizeof digits, static_cast<std::uint64_t>(number), 16);
+  std::string text(digits, end);
+  std::ranges::transform(text, text.begin(),
+                         [](char digit) { return digit >= 'a' ? static_cast<char>(digit - 32) : digit; });
+  return "0x" + text;
+}
+
+// The metric of that name or identifier; absent when nobody knows it.
+std::optional<std::int64_t> metricOf(std::string_view reference) {
+  if (const std::optional<std::int64_t> number = parsedInteger(reference)) {
+    return metricWithId(*number) != nullptr ? number : std::nullopt;
+  }
+  const MetricIdentifier* const metric = metricNamed(reference);
+  return metric != nullptr ? std::optional(metric->id) : std::nullopt;
+}
+
+class Parser {
+ public:
+  ConfigurationResult parse(std::string_view text) {
+    if (std::ranges::count(text, '.') > mostDots) {
+      return refusal(1, 1, "more than " + std::to_string(mostDots) + " dots: this is no metric configuration");
+    }
+    toml::parse_result parsed = toml::parse(text);
+    if (parsed.failed()) {
+      const toml::parse_error& error = parsed.error();
+      return refusal(error.source().begin.line, error.source().begin.column, oneLine(error.description()));
+    }
+    for (const auto& [key, node] : inFileOrder(parsed.table())) {
+      if (key->str() == "metrics") {
+        readSection(*key, *node, &Parser::readMetric);
+      } else if (key->str() == "triggers") {
+        readSection(*key, *node, &Parser::readTrigger);
+      } else {
+        note(key->source(), shown(key->str()) + " is neither [metrics] nor [triggers], ignored");
+      }
+      if (refused_) return std::move(*refused_);
+    }
+    if (notesLeftOut_ > 0) configuration_.notes.push_back("and " + std::to_string(notesLeftOut_) + " more like these");
+    return {std::move(configuration_), {}, 0, 0};
+  }
+
+ private:
+  using Entry = std::pair<const toml::key*, const toml::node*>;
+  // The library sorts by key; messages are to come in the order of the lines.
+  static std::vector<Entry> inFileOrder(const toml::table& table) {
+    std::vector<Entry> entries;
+    for (const auto& [key, node] : table) entries.emplace_back(&key, &node);
+    std::ranges::stable_sort(entries, [](const Entry& left, const Entry& right) {
+      return left.first->source().begin < right.first->source().begin;
+    });
+    return entries;
+  }
+
+  using ReadEntry = void (Parser::*)(const toml::key& key, const toml::node& node);
+
+  void readSection(const toml::key& name, const toml::node& node, ReadEntry readEntry) {
+    const toml::table* const section = node.as_table();
+    if (section == nullptr)
+      return refuse(node.source(), std::string(name.str()) + " is to be a section: [" + std::string(name.str()) + "]");
+    for (const auto& [key, entry] : inFileOrder(*section)) {
+      (this->*readEntry)(*key, *entry);
+      if (refused_) return;
+    }
+  }
+
+  void readMetric(const toml::key& key, const toml::node& node) {
+    const std::optional<std::int64_t> metric = metricOf(key.str());
+    std::optional<std::chrono::milliseconds> period;
+    if (const auto text = node.value_exact<std::string_view>()) {
+      if (*text != onChange) return refusePeriod(key, node, shown(*text));
+    } else if (const auto number = node.value_exact<std::int64_t>()) {
+      if (*number < 1 || *number > longestPeriod) return refusePeriod(key, node, std::to_string(*number));
+      period = std::chrono::milliseconds(*number);
+    } else {
+      return refusePeriod(key, node, "of another kind");
+    }
+    if (!metric) return note(key.source(), "the metric " + shown(key.str()) + " is not known, ignored");
+    if (!configuration_.plan.metrics.emplace(*metric, period).second) {
+      refuse(key.source(), std::string(key.str()) + " is the metric " + std::string(metricWithId(*metric)->name) +
+                               ", which has a period already");
+    }
+  }
+
+  void readTrigger(const toml::key& key, const toml::node& node) {
+    const std::optional<std::int64_t> trigger = parsedInteger(key.str());
+    if (!trigger)
+      return refuse(key.source(), "a trigger is named by its number, such as 0x7F0013, not " + shown(key.str()));
+    const toml::array* const array = node.as_array();
+    if (array == nullptr) {
+      return refuse(node.source(), "a trigger takes a list of metrics, such as [\"K_SIM_FILE_INFO\"]");
+    }
+    if (configuration_.triggers.contains(*trigger)) {
+      return refuse(key.source(), "the trigger " + hexText(*trigger) + " is there twice");
+    }
+    std::vector<std::int64_t> metrics;
+    for (const toml::node& element : *array) {
+      std::optional<std::int64_t> metric;
+      std::string reference;
+      if (const auto text = element.value_exact<std::string_view>()) {
+        reference = shown(*text);
+        metric = metricOf(*text);
+      } else if (const auto number = element.value_exact<std::int64_t>()) {
+        reference = hexText(*number);
+        metric = metricWithId(*number) != nullptr ? number : std::nullopt;
+      } else {
+        return refuse(element.source(),
+                      "a metric is a name, such as \"K_SIM_FILE_INFO\", or a number, such as 0x3C0013");
+      }
+      if (!metric) {
+        note(element.source(), "the metric " + reference + " is not known, ignored");
+      } else if (std::ranges::find(metrics, *metric) == metrics.end()) {
+        metrics.push_back(*metric);
+      }
+    }
+    configuration_.triggers.emplace(*trigger, std::move(metrics));
+  }
+
+  void refusePeriod(const toml::key& key, const toml::node& node, const std::string& what) {
+    refuse(node.source(), "the period of " + shown(key.str()) + " is " + what +
+                              "; a period is a number of milliseconds, 1 to " + std::to_string(longestPeriod) +
+                              ", or \"on change\"");
+  }
+
+  void refuse(const toml::source_region& where, const std::string& what) {
+    refused_ = refusal(where.begin.line, where.begin.column, what);
+  }
+  static ConfigurationResult refusal(std::uint32_t line, std::uint32_t column, const std::string& what) {
+    return {std::nullopt, "line " + std::to_string(line) + ", column " + std::to_string(column) + ": " + what, line,
+            column};
+  }
+  void note(const toml::source_region& where, const std::string& what) {
+    if (configuration_.notes.size() == mostNotes) {
+      ++notesLeftOut_;
+      return;
+    }
+    configuration_.notes.push_back("line " + std::to_string(where.begin.line) + ": " + what);
+  }
+  // The library's descriptions may quote what stands in the file.
+  static std::string oneLine(std::string_view description) {
+    std::string text;
+    appendValidUtf8(description, text);
+    std::ranges::replace_if(
+        text, [](char character) { return static_cast<unsigned char>(character) < 32; }, ' ');
+    return text;
+  }
+
+  Configuration configuration_;
+  std::optional<ConfigurationResult> refused_;
+  std::size_t notesLeftOut_ = 0;
+};
+
+}  // namespace
+
+ConfigurationResult parseConfiguration(std::string_view text) {
+  try {
+    return Parser().parse(text);
+  } catch (const BrokenAssertion&) {
+    return {std::nullopt, "line 1, column 1: somewhere below, the text is no TOML in a way that cannot be told", 1, 1};
+  }
+}
+
+}  // namespace probeview

@@ -1,0 +1,65 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "service/sources/metric_pacer.h"
+
+#include <utility>
+
+namespace probeview {
+
+namespace {
+
+// A source that reports at the same pace has a newer value at the very moment at which the period ends; it gets this
+// long to come first.
+constexpr std::chrono::milliseconds grace(1);
+
+}  // namespace
+
+MetricPacer::MetricPacer(const SourceContext& context, MetricSink& sink)
+    : scheduler_(context.scheduler), clock_(context.clock), sink_(sink) {}
+
+void MetricPacer::offer(MetricRecord record) {
+  const std::int64_t metricId = record.metricId;
+  Entry& entry = entries_[metricId];
+  entry.latest = std::move(record);
+  entry.waiting = true;
+  passOrWait(metricId, entry);
+}
+
+void MetricPacer::setPlan(std::optional<MetricPlan> plan) {
+  plan_ = std::move(plan);
+  for (auto& [metricId, entry] : entries_) {
+    entry.timer.reset();
+    if (entry.waiting) passOrWait(metricId, entry);
+  }
+}
+
+bool MetricPacer::resend(std::int64_t metricId) {
+  const auto found = entries_.find(metricId);
+  if (found == entries_.end()) return false;
+  pass(found->second);
+  return true;
+}
+
+void MetricPacer::passOrWait(std::int64_t metricId, Entry& entry) {
+  if (plan_) {
+    const auto wanted = plan_->metrics.find(metricId);
+    // Kept for the day on which somebody wants it: a serving cell that has not changed since is news to him.
+    if (wanted == plan_->metrics.end()) return;
+    if (wanted->second && entry.passedAt) {
+      const std::chrono::nanoseconds left = *entry.passedAt + *wanted->second - clock_.monotonicTime();
+      if (left > std::chrono::nanoseconds(0)) {
+        if (!entry.timer) entry.timer = scheduler_.after(left + grace, [this, &entry] { pass(entry); });
+        return;
+      }
+    }
+  }
+  pass(entry);
+}
+
+void MetricPacer::pass(Entry& entry) {
+  entry.waiting = false;
+  entry.passedAt = clock_.monotonicTime();
+  entry.timer.reset();
+  sink_.emit(entry.latest);
+}
+
+}  // namespace probeview

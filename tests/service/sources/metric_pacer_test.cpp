@@ -1,0 +1,124 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "service/sources/metric_pacer.h"
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include "platform/manual_loop.h"
+
+namespace probeview {
+namespace {
+
+using std::chrono::milliseconds;
+using ::testing::ElementsAre;
+using ::testing::IsEmpty;
+
+constexpr std::int64_t metric = 0x3C4E04;
+constexpr std::int64_t otherMetric = 0x3C40C2;
+
+// Keeps the first byte of each payload, which the tests use as the value.
+class Sink final : public MetricSink {
+ public:
+  void emit(MetricRecord record) override { values.push_back(record.payload.at(0)); }
+  std::vector<int> values;
+};
+
+class MetricPacerTest : public ::testing::Test {
+ protected:
+  void offer(std::uint8_t value, std::int64_t id = metric) { pacer.offer({id, {value}, milliseconds(0), "test"}); }
+  void planPeriod(std::optional<milliseconds> period) {
+    MetricPlan plan;
+    plan.metrics[metric] = period;
+    pacer.setPlan(plan);
+  }
+
+  ManualLoop loop;
+  DiscardingSink log;
+  Sink sink;
+  MetricPacer pacer{SourceContext{loop, loop, log}, sink};
+};
+
+TEST_F(MetricPacerTest, WithoutAPlanEverythingPassesAtOnce) {
+  offer(1);
+  offer(2);
+  offer(3, otherMetric);
+  EXPECT_THAT(sink.values, ElementsAre(1, 2, 3));
+}
+
+TEST_F(MetricPacerTest, AMetricWithoutAPeriodPassesAtOnce) {
+  planPeriod(std::nullopt);
+  offer(1);
+  offer(2);
+  EXPECT_THAT(sink.values, ElementsAre(1, 2));
+}
+
+TEST_F(MetricPacerTest, AMetricThatIsNotInThePlanDoesNotPassUntilItIs) {
+  pacer.setPlan(MetricPlan{});
+  offer(1);
+  offer(2);
+  EXPECT_THAT(sink.values, IsEmpty());
+  planPeriod(std::nullopt);
+  EXPECT_THAT(sink.values, ElementsAre(2));
+}
+
+TEST_F(MetricPacerTest, APeriodPassesTheFirstAtOnceAndThenTheLatestOfEachPeriod) {
+  planPeriod(milliseconds(1000));
+  offer(1);
+  for (std::uint8_t value = 2; value <= 4; ++value) {
+    loop.advance(milliseconds(300));
+    offer(value);
+  }
+  loop.advance(milliseconds(100));
+  EXPECT_THAT(sink.values, ElementsAre(1));
+  loop.advance(milliseconds(1));
+  EXPECT_THAT(sink.values, ElementsAre(1, 4));
+  loop.advance(milliseconds(5000));
+  EXPECT_THAT(sink.values, ElementsAre(1, 4)) << "nothing new, nothing to pass";
+  offer(5);
+  EXPECT_THAT(sink.values, ElementsAre(1, 4, 5));
+}
+
+TEST_F(MetricPacerTest, AShorterPeriodHoldsAtOnce) {
+  planPeriod(milliseconds(10'000));
+  offer(1);
+  offer(2);
+  loop.advance(milliseconds(500));
+  planPeriod(milliseconds(400));
+  EXPECT_THAT(sink.values, ElementsAre(1, 2));
+}
+
+TEST_F(MetricPacerTest, ALongerPeriodPostponesWhatWaits) {
+  planPeriod(milliseconds(400));
+  offer(1);
+  offer(2);
+  planPeriod(milliseconds(1000));
+  loop.advance(milliseconds(1000));
+  EXPECT_THAT(sink.values, ElementsAre(1));
+  loop.advance(milliseconds(1));
+  EXPECT_THAT(sink.values, ElementsAre(1, 2));
+}
+
+TEST_F(MetricPacerTest, AValueThatComesJustWhenThePeriodEndsIsTheOneThatPasses) {
+  planPeriod(milliseconds(1000));
+  offer(1);
+  loop.advance(milliseconds(500));
+  offer(2);
+  loop.advance(milliseconds(500));
+  offer(3);
+  EXPECT_THAT(sink.values, ElementsAre(1, 3));
+  loop.advance(milliseconds(5000));
+  EXPECT_THAT(sink.values, ElementsAre(1, 3));
+}
+
+TEST_F(MetricPacerTest, ResendPassesTheLatestOnAgainWhateverThePlan) {
+  EXPECT_FALSE(pacer.resend(metric));
+  pacer.setPlan(MetricPlan{});
+  offer(7);
+  EXPECT_TRUE(pacer.resend(metric));
+  EXPECT_TRUE(pacer.resend(metric));
+  EXPECT_FALSE(pacer.resend(otherMetric));
+  EXPECT_THAT(sink.values, ElementsAre(7, 7));
+}
+
+}  // namespace
+}  // namespace probeview

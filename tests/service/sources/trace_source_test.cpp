@@ -1,0 +1,290 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "service/sources/trace_source.h"
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+#include <unistd.h>
+
+#include <filesystem>
+#include <fstream>
+
+#include "messages/metric_identifiers.h"
+#include "platform/manual_loop.h"
+#include "tests/service/sources/trace_rows.h"
+
+namespace probeview {
+namespace {
+
+using std::chrono::milliseconds;
+using std::chrono::seconds;
+using ::testing::ElementsAre;
+using ::testing::HasSubstr;
+using ::testing::IsEmpty;
+using ::testing::SizeIs;
+
+class Sink final : public MetricSink {
+ public:
+  void emit(MetricRecord record) override { records.push_back(std::move(record)); }
+  std::vector<MetricRecord> records;
+};
+
+class Lines final : public LineSink {
+ public:
+  void line(std::string_view text) override { lines.emplace_back(text); }
+  std::vector<std::string> lines;
+};
+
+class TraceSourceTest : public ::testing::Test {
+ protected:
+  void SetUp() override {
+    folder = std::filesystem::path(::testing::TempDir()) / ("trace_source_test." + std::to_string(getpid()));
+    std::filesystem::create_directories(folder);
+  }
+  void TearDown() override {
+    source.reset();
+    std::filesystem::remove_all(folder);
+  }
+
+  std::string write(const std::string& content, const std::string& name = "drive.csv") {
+    std::ofstream(folder / name, std::ios::binary) << content;
+    return (folder / name).string();
+  }
+  // Starts a source on rows of our own.
+  void start(const std::string& rows, const std::string& options = "") {
+    SourceResult result = makeTraceSource(write(traceHeader + rows) + options);
+    ASSERT_EQ(result.error, "");
+    source = std::move(result.source);
+    source->start(SourceContext{loop, loop, log}, sink);
+  }
+  void listen() {
+    source->setListening(true);
+    loop.advance(milliseconds(0));
+  }
+  static std::string measurement(const std::string& time, int level) {
+    return TraceLine{.time = "2024.03.05_" + time, .mode = "LTE", .level = std::to_string(level)}.text();
+  }
+
+  std::filesystem::path folder;
+  ManualLoop loop;
+  Sink sink;
+  Lines log;
+  std::unique_ptr<MetricSource> source;
+};
+
+TEST_F(TraceSourceTest, IsNamedAfterItsFile) {
+  start(measurement("12.00.00", -90));
+  EXPECT_EQ(source->origin(), "trace:drive.csv");
+}
+
+TEST_F(TraceSourceTest, FillsTheMetricsThatItsRowsCanFillAndNoOthers) {
+  start(measurement("12.00.00", -90));
+  EXPECT_THAT(source->metrics(), ElementsAre(K_LTE_RSRP_RSRQ_SINR));
+  start(measurement("12.00.00", -90) + TraceLine{.mode = "EDGE", .level = "-80", .state = "I"}.text());
+  EXPECT_THAT(source->metrics(), ElementsAre(K_GSM_SCELL_INFO, K_LTE_RSRP_RSRQ_SINR, K_GSM_IDLE_SCELL_MEAS));
+}
+
+TEST_F(TraceSourceTest, PlaysFromTheStartWhenSomebodyFirstListens) {
+  start(measurement("12.00.00", -90) + measurement("12.00.01", -91));
+  loop.advance(seconds(100));
+  EXPECT_THAT(sink.records, IsEmpty());
+  EXPECT_EQ(loop.untilNextTimer(), std::nullopt) << "nothing to wake up for while nobody listens";
+  listen();
+  EXPECT_THAT(sink.records, SizeIs(1));
+}
+
+TEST_F(TraceSourceTest, KeepsTheRowsOwnPace) {
+  start(measurement("12.00.00", -90) + measurement("12.00.02", -91) + measurement("12.05.00", -92));
+  listen();
+  loop.advance(milliseconds(1999));
+  EXPECT_THAT(sink.records, SizeIs(1));
+  loop.advance(milliseconds(1));
+  EXPECT_THAT(sink.records, SizeIs(2));
+  loop.advance(seconds(297));
+  EXPECT_THAT(sink.records, SizeIs(2)) << "a gap of minutes is waited for";
+  loop.advance(seconds(1));
+  EXPECT_THAT(sink.records, SizeIs(3));
+}
+
+TEST_F(TraceSourceTest, PlaysFasterBySpeed) {
+  start(measurement("12.00.00", -90) + measurement("12.00.20", -91), ",speed=20");
+  listen();
+  loop.advance(milliseconds(999));
+  EXPECT_THAT(sink.records, SizeIs(1));
+  loop.advance(milliseconds(1));
+  EXPECT_THAT(sink.records, SizeIs(2));
+}
+
+TEST_F(TraceSourceTest, RowsOfOneSecondComeTogetherAndInTheirOrder) {
+  start(measurement("12.00.00", -90) + measurement("12.00.00", -91) + measurement("12.00.00", -92));
+  listen();
+  EXPECT_THAT(sink.records, SizeIs(3));
+}
+
+TEST_F(TraceSourceTest, AClockThatGoesBackCostsNoTime) {
+  start(measurement("12.00.10", -90) + measurement("12.00.00", -91) + measurement("12.00.01", -92));
+  listen();
+  EXPECT_THAT(sink.records, SizeIs(2));
+  EXPECT_EQ(sink.records[1].time, sink.records[0].time - seconds(10));
+  loop.advance(seconds(1));
+  EXPECT_THAT(sink.records, SizeIs(3));
+}
+
+TEST_F(TraceSourceTest, DatesThatAreMillenniaApartAreWaitedForWithoutHarm) {
+  start(TraceLine{.time = "0001.01.01_00.00.00", .level = "-90"}.text() +
+            TraceLine{.time = "9999.12.31_23.59.59", .level = "-91"}.text() +
+            TraceLine{.time = "0001.01.01_00.00.00", .level = "-92"}.text() +
+            TraceLine{.time = "9999.12.31_23.59.59", .level = "-93"}.text(),
+        ",speed=0.001,loop");
+  listen();
+  loop.advance(std::chrono::hours(24 * 365));
+  EXPECT_THAT(sink.records, SizeIs(1));
+}
+
+TEST_F(TraceSourceTest, RecordsCarryTheRowsOwnTimeAndTheirOrigin) {
+  start(TraceLine{.time = "2024.03.05_12.34.56", .level = "-90"}.text());
+  listen();
+  ASSERT_THAT(sink.records, SizeIs(1));
+  EXPECT_EQ(sink.records[0].time, milliseconds(1709642096000));
+  EXPECT_EQ(sink.records[0].origin, "trace:drive.csv");
+  EXPECT_EQ(sink.records[0].metricId, K_LTE_RSRP_RSRQ_SINR);
+}
+
+TEST_F(TraceSourceTest, RestsWhileNobodyListensAndGoesOnFromThere) {
+  start(measurement("12.00.00", -90) + measurement("12.00.10", -91));
+  listen();
+  loop.advance(seconds(4));
+  source->setListening(false);
+  EXPECT_EQ(loop.untilNextTimer(), std::nullopt);
+  loop.advance(std::chrono::hours(1));
+  EXPECT_THAT(sink.records, SizeIs(1));
+  source->setListening(true);
+  loop.advance(milliseconds(5999));
+  EXPECT_THAT(sink.records, SizeIs(1));
+  loop.advance(milliseconds(1));
+  EXPECT_THAT(sink.records, SizeIs(2));
+}
+
+TEST_F(TraceSourceTest, ItsEndIsToldOnceAndWhatWasLastKnownCanStillBeAskedFor) {
+  start(measurement("12.00.00", -90) + measurement("12.00.01", -91));
+  listen();
+  loop.advance(seconds(100));
+  EXPECT_THAT(log.lines, ElementsAre("trace:drive.csv: played to its end, line 3"));
+  EXPECT_EQ(loop.untilNextTimer(), std::nullopt);
+  EXPECT_TRUE(source->query(K_LTE_RSRP_RSRQ_SINR));
+  ASSERT_THAT(sink.records, SizeIs(3));
+  EXPECT_EQ(sink.records[2].payload, sink.records[1].payload);
+  EXPECT_EQ(sink.records[2].time, sink.records[1].time);
+}
+
+TEST_F(TraceSourceTest, AQueryForWhatIsNotKnownIsRefused) {
+  start(measurement("12.00.00", -90));
+  EXPECT_FALSE(source->query(K_LTE_RSRP_RSRQ_SINR)) << "nothing has been played yet";
+  listen();
+  EXPECT_FALSE(source->query(K_SIM_FILE_INFO));
+}
+
+TEST_F(TraceSourceTest, LoopStartsOverASecondOfTheDriveLater) {
+  const std::string rows = TraceLine{.time = "2024.03.05_12.00.00", .state = "I"}.text() +
+                           TraceLine{.time = "2024.03.05_12.00.01", .state = "D"}.text();
+  start(rows, ",loop,speed=2");
+  listen();
+  loop.advance(milliseconds(500));
+  ASSERT_THAT(sink.records, SizeIs(2));
+  loop.advance(milliseconds(499));
+  EXPECT_THAT(sink.records, SizeIs(2));
+  loop.advance(milliseconds(1));
+  ASSERT_THAT(sink.records, SizeIs(3));
+  EXPECT_EQ(sink.records[2].payload, sink.records[0].payload) << "a new drive knows nothing of the one before";
+  loop.advance(seconds(10));
+  EXPECT_THAT(sink.records, SizeIs(23));
+  EXPECT_THAT(log.lines, IsEmpty());
+}
+
+TEST_F(TraceSourceTest, MetricsThatNobodyWantsAreNotSent) {
+  start(TraceLine{.level = "-90", .state = "I"}.text());
+  MetricPlan plan;
+  plan.metrics[K_LTE_RRC_STATE] = std::nullopt;
+  source->setPlan(plan);
+  listen();
+  ASSERT_THAT(sink.records, SizeIs(1));
+  EXPECT_EQ(sink.records[0].metricId, K_LTE_RRC_STATE);
+}
+
+TEST_F(TraceSourceTest, APeriodIsTheShortestTimeBetweenTwoRecords) {
+  std::string rows;
+  for (int second = 0; second < 10; ++second) rows += measurement("12.00.0" + std::to_string(second), -90 - second);
+  start(rows);
+  MetricPlan plan;
+  plan.metrics[K_LTE_RSRP_RSRQ_SINR] = milliseconds(3000);
+  source->setPlan(plan);
+  listen();
+  loop.advance(seconds(60));
+  std::vector<std::int64_t> secondsOfRecords;
+  for (const MetricRecord& record : sink.records) secondsOfRecords.push_back(record.time.count() / 1000 % 60);
+  EXPECT_THAT(secondsOfRecords, ElementsAre(0, 3, 6, 9));
+}
+
+TEST_F(TraceSourceTest, ManyRowsThatAreDueTogetherLeaveTheLoopToItsOtherWork) {
+  // Counts the turns that are asked for.
+  struct CountingScheduler final : Scheduler {
+    explicit CountingScheduler(Scheduler& scheduler) : real(scheduler) {}
+    ScheduledTaskHandle after(std::chrono::nanoseconds delay, Task task) override {
+      ++turns;
+      return real.after(delay, std::move(task));
+    }
+    ScheduledTaskHandle every(std::chrono::nanoseconds interval, Task task) override {
+      return real.every(interval, std::move(task));
+    }
+    Scheduler& real;
+    int turns = 0;
+  };
+  std::string rows;
+  for (int count = 0; count < 640; ++count) rows += measurement("12.00.00", -90);
+  source = makeTraceSource(write(traceHeader + rows)).source;
+  CountingScheduler scheduler(loop);
+  source->start(SourceContext{scheduler, loop, log}, sink);
+  listen();
+  EXPECT_THAT(sink.records, SizeIs(640));
+  EXPECT_EQ(scheduler.turns, 10);
+}
+
+TEST_F(TraceSourceTest, BadRowsAreToldWithTheirLinesWhenTheSourceStarts) {
+  start("bad\n" + measurement("12.00.00", -90));
+  EXPECT_THAT(log.lines, ElementsAre("trace:drive.csv: line 2: has 1 fields, not 26; row skipped"));
+}
+
+TEST_F(TraceSourceTest, ManyBadRowsAreToldInFewLines) {
+  std::string rows = measurement("12.00.00", -90);
+  for (int count = 0; count < 100; ++count) rows += "bad\n";
+  start(rows);
+  ASSERT_THAT(log.lines, SizeIs(21));
+  EXPECT_EQ(log.lines.back(), "trace:drive.csv: and 80 more problems like these");
+}
+
+TEST_F(TraceSourceTest, AFileThatIsNoSuchLogIsRefusedWithWhatIsWrong) {
+  const std::string path = write("hello\n");
+  const SourceResult result = makeTraceSource(path);
+  EXPECT_EQ(result.source, nullptr);
+  EXPECT_THAT(result.error, HasSubstr("trace file " + path + " is no drive-test log: line 1 must name the columns"));
+  EXPECT_THAT(makeTraceSource("/no/such/file.csv").error,
+              "trace file /no/such/file.csv cannot be read: No such file or directory");
+}
+
+TEST_F(TraceSourceTest, ArgumentsThatAreNotUnderstoodAreRefused) {
+  const std::string path = write(traceHeader + measurement("12.00.00", -90));
+  for (const char* speed : {"0", "-1", "", "fast", "1x", "nan", "inf", "1e9"}) {
+    const SourceResult result = makeTraceSource(path + ",speed=" + speed);
+    EXPECT_EQ(result.source, nullptr);
+    EXPECT_THAT(result.error, HasSubstr("a speed is a number from 0.001 to 100000")) << speed;
+  }
+  EXPECT_THAT(makeTraceSource("").error, HasSubstr("it names no file"));
+  EXPECT_THAT(makeTraceSource("loop").error, HasSubstr("trace file loop cannot be read"));
+}
+
+TEST_F(TraceSourceTest, AFilesNameMayHaveCommas) {
+  const std::string path = write(traceHeader + measurement("12.00.00", -90), "a,b.csv");
+  EXPECT_EQ(makeTraceSource(path + ",speed=2,loop").error, "");
+}
+
+}  // namespace
+}  // namespace probeview

@@ -1,0 +1,134 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "tools/decode_command.h"
+
+#include <algorithm>
+#include <ostream>
+
+#include "tools/batch.h"
+#include "tools/payload_decoder.h"
+#include "values/json.h"
+#include "values/printer.h"
+
+namespace probeview {
+
+namespace {
+
+struct Options {
+  bool batch = false;
+  std::string reference;
+  std::string hex;
+};
+
+std::string_view asText(const std::vector<std::uint8_t>& bytes) {
+  return {reinterpret_cast<const char*>(bytes.data()), bytes.size()};
+}
+
+// A text stands bare unless it holds what would break the line or steer a terminal.
+std::string valueForAPerson(const Value& value) {
+  const std::string bare = bareText(value);
+  const bool plain = std::ranges::none_of(bare, [](char character) {
+    const auto code = static_cast<unsigned char>(character);
+    return code < 32 || code == 127;
+  });
+  return plain ? bare : printed(value);
+}
+
+ExitStatus decodeForAPerson(const Options& options, Tool& tool) {
+  const std::optional<std::vector<std::uint8_t>> bytes = parseHex(options.hex);
+  if (!bytes) {
+    tool.errors << "probectl: " << quotedExcerpt(options.hex)
+                << " is no payload: pairs of hexadecimal digits, or - for an empty one\n";
+    return ExitStatus::UsageError;
+  }
+  DecodeResult result = decodePayload(options.reference, *bytes);
+  if (!result.payload) {
+    tool.errors << "probectl: " << result.error << '\n';
+    return ExitStatus::UsageError;
+  }
+  std::string text;
+  for (const Dictionary::Entry& entry : result.payload->dictionary) {
+    appendValidUtf8(entry.key.text(), text);
+    text += ": ";
+    text += valueForAPerson(entry.value);
+    text += '\n';
+  }
+  tool.output << text;
+  tool.output.flush();
+  for (const std::string& line : result.payload->log.lines()) tool.errors << line << '\n';
+  if (result.payload->ok) return ExitStatus::Success;
+  tool.errors << "probectl: the payload does not decode as " << result.payload->className
+              << "; above is what came before the fault\n";
+  return ExitStatus::Failure;
+}
+
+void answerLine(std::string_view line, BatchOutput& output) {
+  const std::vector<std::string_view> words = splitWords(line);
+  if (words.size() != 2) return output.error("expected: CLASS|METRIC HEX");
+  const std::optional<std::vector<std::uint8_t>> bytes = parseHex(words[1]);
+  if (!bytes) {
+    return output.error(quotedExcerpt(words[1]) + " is no payload: pairs of hexadecimal digits, or - for an empty one");
+  }
+  const DecodeResult result = decodePayload(words[0], *bytes);
+  if (!result.payload) return output.error(result.error);
+  std::string json = "{\"class\":";
+  appendJsonString(result.payload->className, json);
+  json += ",\"ok\":";
+  json += result.payload->ok ? "true" : "false";
+  json += ",\"dict\":";
+  appendJson(result.payload->dictionary, json);
+  json += ",\"reencoded\":\"";
+  appendHex(asText(result.payload->reencoded), json);
+  json += "\",\"log\":";
+  appendJson(result.payload->log, json);
+  json += '}';
+  output.line(json);
+}
+
+ExitStatus runBatch(Tool& tool) {
+  BatchInput input(tool.input);
+  BatchOutput output(tool.output);
+  while (input.next()) {
+    if (input.tooLong()) {
+      output.error("the line is longer than " + std::to_string(batchLineLengthLimit) + " bytes");
+    } else {
+      answerLine(input.line(), output);
+    }
+    if (output.closed()) return ExitStatus::Failure;
+  }
+  return ExitStatus::Success;
+}
+
+}  // namespace
+
+void addDecodeCommand(CLI::App& program, Tool& tool) {
+  CLI::App* command = program.add_subcommand("decode", "Decode payloads by hand");
+  auto options = std::make_shared<Options>();
+  CLI::Option* reference = command->add_option("CLASS|METRIC", options->reference,
+                                               "A message class, a metric, or a metric's identifier (decimal or 0x…)");
+  CLI::Option* hex = command->add_option("HEX", options->hex, "The payload in hexadecimal, - for an empty one");
+  command
+      ->add_flag("--batch", options->batch,
+                 "Read lines \"CLASS|METRIC HEX\" from standard input, answer each with a line of JSON")
+      ->excludes(reference)
+      ->excludes(hex);
+  command->footer(
+      "Prints a line \"key: value\" for each field; with --batch one JSON object a line:\n"
+      "  {\"class\":…,\"ok\":true|false,\"dict\":{…},\"reencoded\":\"hex\",\"log\":[…]}\n"
+      "or {\"error\":…} for a line that is not understood. Blank lines and lines that begin with # are ignored.\n"
+      "\n"
+      "Exit status: 0 decoded (with --batch: the end of the input was reached); 1 it does not decode, what came\n"
+      "before the fault is shown; 2 the class or the hexadecimal is not understood.\n"
+      "\n"
+      "Examples:\n"
+      "  probectl decode K_LTE_RRC_STATE 10031801\n"
+      "  probectl decode KCellularLteTxPower -\n"
+      "  echo '0x3C4E04 1003' | probectl decode --batch");
+  command->callback([options, &tool] {
+    if (!options->batch && (options->reference.empty() || options->hex.empty())) {
+      throw CLI::RequiredError("CLASS|METRIC and HEX, or --batch,");
+    }
+    tool.run = [options, &tool] { return options->batch ? runBatch(tool) : decodeForAPerson(*options, tool); };
+  });
+}
+
+}  // namespace probeview

@@ -1,0 +1,11 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include "tools/subcommand.h"
+
+namespace probeview {
+
+// probectl decode: payloads by hand, one for a person or many for a program.
+void addDecodeCommand(CLI::App& program, Tool& tool);
+
+}  // namespace probeview

@@ -1,0 +1,50 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "tools/payload_decoder.h"
+
+#include <memory>
+
+#include "messages/metric_identifiers.h"
+#include "messages/registry.h"
+#include "messages/runtime/codable.h"
+#include "messages/runtime/data_reader.h"
+#include "messages/runtime/data_writer.h"
+
+namespace probeview {
+
+namespace {
+
+// Null, with the reason, when the reference leads to no class.
+const MessageDescriptor* findClass(std::string_view reference, std::string& error) {
+  if (const MessageDescriptor* const message = messageClass(reference)) return message;
+  const MetricIdentifier* metric = metricNamed(reference);
+  if (metric == nullptr) {
+    const std::optional<std::int64_t> identifier = parseInteger64(reference);
+    if (identifier) metric = metricWithId(*identifier);
+  }
+  if (metric == nullptr) {
+    error = quotedExcerpt(reference) + " is no message class, no metric and no metric's identifier";
+    return nullptr;
+  }
+  if (metric->message == nullptr) error = std::string(metric->name) + " has no message class";
+  return metric->message;
+}
+
+}  // namespace
+
+DecodeResult decodePayload(std::string_view reference, std::span<const std::uint8_t> bytes) {
+  DecodeResult result;
+  const MessageDescriptor* const messageClass = findClass(reference, result.error);
+  if (messageClass == nullptr) return result;
+  DecodedPayload& payload = result.payload.emplace();
+  const std::unique_ptr<PBCodable> message = messageClass->make();
+  PBDataReader reader(bytes, &payload.log);
+  payload.className = message->className();
+  payload.ok = message->readFrom(reader);
+  payload.dictionary = message->dictionaryRepresentation();
+  PBDataWriter writer;
+  message->writeTo(writer);
+  payload.reencoded = writer.takeBytes();
+  return result;
+}
+
+}  // namespace probeview
