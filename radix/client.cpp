@@ -3,12 +3,18 @@
 
 #include "radix/manager.h"
 #include "radix/object.h"
+#include "radix/socket_manager.h"
+#include "radix/socket_path.h"
 
 namespace radix::client {
 
 probeview::Dictionary nativeDictionary(const Object& object) { return object.content(); }
 
 ObjectHandle makeObject(const probeview::Dictionary& dictionary) { return std::make_shared<Object>(dictionary); }
+
+ManagerHandle CreateManager(std::string clientName, std::shared_ptr<probeview::TaskQueue> queue) {
+  return makeSocketManager(std::move(clientName), std::move(queue), SocketSurroundings::ofThisProcess());
+}
 
 Result PerformCommand(const ManagerHandle& manager, std::string_view command, const probeview::Dictionary& arguments,
                       ObjectHandle& reply) {

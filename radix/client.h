@@ -75,6 +75,9 @@ struct ConnectionState {
   bool connected = false;
   std::chrono::milliseconds since{};  // wall time of the last change
   bool everConnected = false;
+  std::string serviceName{};     // what the service last called itself, such as "radixd 0.1.0"
+  std::string trouble{};         // why there is no connection, for people; empty while there is one
+  std::uint64_t lostEvents = 0;  // events that the service could not deliver because this client was too slow
 };
 ConnectionState Connection(const ManagerHandle& manager);
 

@@ -1,0 +1,188 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "radix/connection_manager.h"
+
+#include <atomic>
+#include <map>
+#include <utility>
+
+#include "platform/guarded.h"
+#include "radix/object.h"
+
+namespace radix::client {
+
+namespace {
+
+using probeview::Dictionary;
+using probeview::Task;
+using probeview::TaskQueue;
+using probeview::Value;
+using probeview::Worker;
+
+// Events that wait on the handlers' queue before no more are read, and before reading goes on. The rest waits in the
+// service, which then drops the oldest of each metric instead of letting the memory of this process grow.
+constexpr std::size_t mostEventsWaiting = 4096;
+constexpr std::size_t fewEventsWaiting = 1024;
+
+Value number(std::int64_t value) { return value; }
+
+ObjectHandle makeEventObject(const Event& event) {
+  Dictionary content;
+  if (event.kind == EventKind::Trigger) {
+    content.reserve(5);
+    content.append(kKeyTriggerID, number(event.triggerId));
+    content.append(kKeyTriggerRef, number(event.triggerRef));
+    content.append(kKeyTriggerType, number(event.triggerType));
+  } else {
+    content.reserve(5);
+    content.append(kKeyMetricID, number(event.metricId));
+    content.append(kKeyPayload, Value::bytes(event.payload));
+    content.append(kKeyProfileID, number(event.profileId));
+  }
+  content.append(kKeyTime, number(event.time));
+  content.append(kKeyOrigin, Value::text(event.origin));
+  return std::make_shared<Object>(std::move(content));
+}
+
+using Handlers = std::map<std::string, EventHandler, std::less<>>;
+
+// The way of the events from the connection to the handlers. Shared with the tasks on the handlers' queue, which may
+// run after the manager has gone.
+class EventRoad : public std::enable_shared_from_this<EventRoad> {
+ public:
+  EventRoad(std::shared_ptr<TaskQueue> queue, Worker& worker) : queue_(std::move(queue)), worker_(worker) {}
+
+  // Callers register one after the other; nobody registers for the same manager from two threads at once.
+  void setHandler(std::string_view event, EventHandler handler) {
+    auto handlers = handlers_.get();
+    auto changed = handlers ? std::make_shared<Handlers>(*handlers) : std::make_shared<Handlers>();
+    (*changed)[std::string(event)] = std::move(handler);
+    handlers_.set(std::move(changed));
+  }
+
+  void setOn(bool on) { on_ = on; }
+  void close() { closed_ = true; }
+
+  // On the worker.
+  void deliver(std::vector<Event> events, const std::shared_ptr<ServiceConnection>& connection) {
+    const std::size_t before = waiting_.fetch_add(events.size());
+    if (before + events.size() > mostEventsWaiting && !stopped_.exchange(true)) connection->setEventsWelcome(false);
+    queue_->post(
+        [self = shared_from_this(), batch = std::move(events),
+         weak = std::weak_ptr<ServiceConnection>(connection)]() mutable { self->handle(batch, std::move(weak)); });
+  }
+
+ private:
+  // On the handlers' queue.
+  void handle(const std::vector<Event>& batch, std::weak_ptr<ServiceConnection> connection) {
+    for (const Event& event : batch) {
+      if (closed_ || !on_) continue;
+      // Asked for each event: the handler before it may have registered another one.
+      const auto handlers = handlers_.get();
+      if (!handlers) continue;
+      const auto found = handlers->find(event.kind == EventKind::Trigger ? kEventTrigger : kEventMetric);
+      if (found == handlers->end() || !found->second) continue;
+      found->second(makeEventObject(event), event.group);
+    }
+    const std::size_t left = waiting_.fetch_sub(batch.size()) - batch.size();
+    if (left > fewEventsWaiting || closed_ || !stopped_.exchange(false)) return;
+    worker_.post([weak = std::move(connection)] {
+      if (const auto here = weak.lock()) here->setEventsWelcome(true);
+    });
+  }
+
+  std::shared_ptr<TaskQueue> queue_;
+  Worker& worker_;
+  probeview::Guarded<std::shared_ptr<const Handlers>> handlers_;
+  std::atomic<bool> on_ = false;
+  std::atomic<bool> closed_ = false;
+  std::atomic<std::size_t> waiting_ = 0;
+  std::atomic<bool> stopped_ = false;
+};
+
+class ConnectionManager final : public Manager {
+ public:
+  ConnectionManager(Worker& worker, std::unique_ptr<Connector> connector, ServiceConnection::Identity identity,
+                    std::shared_ptr<TaskQueue> queue)
+      : worker_(worker),
+        road_(std::make_shared<EventRoad>(std::move(queue), worker)),
+        state_(std::make_shared<probeview::Guarded<ConnectionState>>()) {
+    ConnectionState initial;
+    initial.since = worker.clock().wallTime();
+    state_->set(initial);
+    auto holder = std::make_shared<std::weak_ptr<ServiceConnection>>();
+    connection_ = std::make_shared<ServiceConnection>(
+        worker, std::move(connector), std::move(identity),
+        ServiceConnection::Events{.events =
+                                      [road = road_, holder](std::vector<Event> events) {
+                                        if (const auto here = holder->lock()) road->deliver(std::move(events), here);
+                                      },
+                                  .state = [state = state_](const ConnectionState& now) { state->set(now); }});
+    *holder = connection_;
+    worker_.post([connection = connection_] { connection->start(); });
+  }
+
+  ~ConnectionManager() override {
+    road_->close();
+    // The connection goes where it lived.
+    worker_.post([connection = std::move(connection_)]() mutable { connection.reset(); });
+  }
+
+  Result performCommand(std::string_view command, const Dictionary& arguments, ObjectHandle& reply) override {
+    auto pending = std::make_shared<PendingCommand>();
+    pending->name = command;
+    pending->arguments = encodeDictionary(arguments);
+    const std::size_t size =
+        encode(Command{.sequence = UINT32_MAX, .name = pending->name, .arguments = pending->arguments})->size();
+    if (size > longestFrame) {
+      const Value* payload = arguments.find(kKeyPayload);
+      const std::size_t given = payload != nullptr && payload->bytes() ? payload->bytes()->size() : size;
+      return {static_cast<std::int32_t>(Status::TooLarge),
+              (command == kCommandAddConfiguration ? "the configuration has " : "the command has ") +
+                  std::to_string(given) + " bytes; at most " + std::to_string(longestFrame - (size - given)) +
+                  " fit into one frame"};
+    }
+    pending->deadline = worker_.clock().monotonicTime() + commandDeadline;
+    pending->done = worker_.makeGate();
+    worker_.post([connection = connection_, pending] { connection->perform(pending); });
+    if (!pending->done->wait(commandDeadline + lateness)) {
+      return {static_cast<std::int32_t>(Status::TimedOut), "the baseband service did not answer in time"};
+    }
+    if (auto content = decodeDictionary(pending->reply)) reply = makeObject(*content);
+    return pending->result;
+  }
+
+  void registerEventHandler(std::string_view event, EventHandler handler) override {
+    road_->setHandler(event, std::move(handler));
+  }
+
+  void eventsOn() override {
+    road_->setOn(true);
+    worker_.post([connection = connection_] { connection->setDelivery(true); });
+  }
+
+  void eventsOff() override {
+    // Nothing is handed over from here on, whatever is still on its way.
+    road_->setOn(false);
+    worker_.post([connection = connection_] { connection->setDelivery(false); });
+  }
+
+  ConnectionState connection() const override { return state_->get(); }
+
+ private:
+  // The worker itself ends the command at its deadline and says why; this only stands behind it.
+  static constexpr std::chrono::nanoseconds lateness = std::chrono::milliseconds(100);
+
+  Worker& worker_;
+  std::shared_ptr<EventRoad> road_;
+  std::shared_ptr<probeview::Guarded<ConnectionState>> state_;
+  std::shared_ptr<ServiceConnection> connection_;
+};
+
+}  // namespace
+
+std::shared_ptr<Manager> makeConnectionManager(Worker& worker, std::unique_ptr<Connector> connector,
+                                               ServiceConnection::Identity identity, std::shared_ptr<TaskQueue> queue) {
+  return std::make_shared<ConnectionManager>(worker, std::move(connector), std::move(identity), std::move(queue));
+}
+
+}  // namespace radix::client

@@ -1,0 +1,337 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "radix/frames.h"
+
+#include <bit>
+#include <memory>
+#include <utility>
+
+#include "messages/runtime/data_reader.h"
+#include "messages/runtime/data_writer.h"
+#include "radix/frame_tables.h"
+
+namespace radix {
+
+namespace wire {
+
+PB_DEFINE(HelloFrame)
+PB_DEFINE(CommandFrame)
+PB_DEFINE(ReplyFrame)
+PB_DEFINE(DeliveryFrame)
+PB_DEFINE(EventFrame)
+PB_DEFINE(DroppedFrame)
+PB_DEFINE(PingFrame)
+PB_DEFINE(Frame)
+PB_DEFINE(Item)
+PB_DEFINE(Items)
+
+}  // namespace wire
+
+namespace {
+
+using probeview::Dictionary;
+using probeview::Key;
+using probeview::List;
+using probeview::PBDataReader;
+using probeview::PBDataWriter;
+using probeview::Shared;
+using probeview::Value;
+using probeview::ValueKind;
+using wire::ItemKind;
+
+// Deeper than any command or reply is nested.
+constexpr int deepestNesting = 16;
+
+FrameBytes bytesOf(const wire::Frame& frame) {
+  PBDataWriter writer;
+  frame.writeTo(writer);
+  return std::make_shared<const std::vector<std::uint8_t>>(writer.takeBytes());
+}
+
+std::uint64_t unsignedOf(std::int64_t number) { return static_cast<std::uint64_t>(number); }
+std::int64_t signedOf(std::uint64_t number) { return static_cast<std::int64_t>(number); }
+
+std::vector<std::uint8_t> copyOf(std::span<const std::uint8_t> bytes) { return {bytes.begin(), bytes.end()}; }
+
+std::span<const std::uint8_t> bytesOf(std::string_view text) {
+  return {reinterpret_cast<const std::uint8_t*>(text.data()), text.size()};
+}
+
+std::string_view textOf(std::span<const std::uint8_t> bytes) {
+  return {reinterpret_cast<const char*>(bytes.data()), bytes.size()};
+}
+
+std::vector<std::uint8_t> encodeItems(const wire::Items& items) {
+  PBDataWriter writer;
+  items.writeTo(writer);
+  return writer.takeBytes();
+}
+
+void fill(wire::Item& item, const Value& value);
+
+std::vector<std::uint8_t> encodeList(const List& list) {
+  wire::Items items;
+  for (const Value& value : list) fill(items.addItem(), value);
+  return encodeItems(items);
+}
+
+void setNumber(wire::Item& item, ItemKind kind, std::uint64_t number) {
+  item.setKind(static_cast<std::uint32_t>(kind));
+  item.setNumber(number);
+}
+
+void setContent(wire::Item& item, ItemKind kind, std::span<const std::uint8_t> content) {
+  item.setKind(static_cast<std::uint32_t>(kind));
+  item.setContent(content);
+}
+
+void fill(wire::Item& item, const Value& value) {
+  switch (value.kind()) {
+    case ValueKind::Int32:
+      return setNumber(item, ItemKind::Int32, unsignedOf(value.rawInt32()));
+    case ValueKind::UInt32:
+      return setNumber(item, ItemKind::UInt32, value.rawUInt32());
+    case ValueKind::Int64:
+      return setNumber(item, ItemKind::Int64, unsignedOf(value.rawInt64()));
+    case ValueKind::UInt64:
+      return setNumber(item, ItemKind::UInt64, value.rawUInt64());
+    case ValueKind::Bool:
+      return setNumber(item, ItemKind::Bool, value.rawBool() ? 1 : 0);
+    case ValueKind::Float:
+      return setNumber(item, ItemKind::Float, std::bit_cast<std::uint32_t>(value.rawFloat()));
+    case ValueKind::Double:
+      return setNumber(item, ItemKind::Double, std::bit_cast<std::uint64_t>(value.rawDouble()));
+    case ValueKind::Text:
+      return setContent(item, ItemKind::Text, bytesOf(value.rawText()));
+    case ValueKind::Bytes:
+      return setContent(item, ItemKind::Bytes, *value.bytes());
+    case ValueKind::List:
+      return setContent(item, ItemKind::List, encodeList(*value.list()));
+    case ValueKind::Dictionary:
+      return setContent(item, ItemKind::Dictionary, encodeDictionary(*value.dictionary()));
+  }
+}
+
+// False when the bytes are neither a list nor a dictionary.
+bool readItems(std::span<const std::uint8_t> bytes, wire::Items& items) {
+  PBDataReader reader(bytes);
+  return items.readFrom(reader);
+}
+
+enum class Reading { Understood, Unknown, Malformed };
+
+// Each takes so many levels below itself and no more.
+bool readList(std::span<const std::uint8_t> bytes, int depth, List& list);
+bool readDictionary(std::span<const std::uint8_t> bytes, int depth, Dictionary& dictionary);
+
+Reading read(const wire::Item& item, int depth, Value& value) {
+  const std::uint64_t number = item.number();
+  switch (static_cast<ItemKind>(item.kind())) {
+    case ItemKind::Int32:
+      value = static_cast<std::int32_t>(number);
+      return Reading::Understood;
+    case ItemKind::UInt32:
+      value = static_cast<std::uint32_t>(number);
+      return Reading::Understood;
+    case ItemKind::Int64:
+      value = signedOf(number);
+      return Reading::Understood;
+    case ItemKind::UInt64:
+      value = number;
+      return Reading::Understood;
+    case ItemKind::Bool:
+      value = number != 0;
+      return Reading::Understood;
+    case ItemKind::Float:
+      value = std::bit_cast<float>(static_cast<std::uint32_t>(number));
+      return Reading::Understood;
+    case ItemKind::Double:
+      value = std::bit_cast<double>(number);
+      return Reading::Understood;
+    case ItemKind::Text:
+      value = Value::text(textOf(item.content()));
+      return Reading::Understood;
+    case ItemKind::Bytes:
+      value = Value::bytes(item.content());
+      return Reading::Understood;
+    case ItemKind::List: {
+      List list;
+      if (depth == 0 || !readList(item.content(), depth - 1, list)) return Reading::Malformed;
+      value = std::move(list);
+      return Reading::Understood;
+    }
+    case ItemKind::Dictionary: {
+      Dictionary dictionary;
+      if (depth == 0 || !readDictionary(item.content(), depth - 1, dictionary)) return Reading::Malformed;
+      value = std::move(dictionary);
+      return Reading::Understood;
+    }
+  }
+  return Reading::Unknown;
+}
+
+bool readList(std::span<const std::uint8_t> bytes, int depth, List& list) {
+  wire::Items items;
+  if (!readItems(bytes, items)) return false;
+  for (const wire::Item& item : items.items()) {
+    Value value;
+    const Reading reading = read(item, depth, value);
+    if (reading == Reading::Malformed) return false;
+    if (reading == Reading::Understood) list.append(std::move(value));
+  }
+  return true;
+}
+
+bool readDictionary(std::span<const std::uint8_t> bytes, int depth, Dictionary& dictionary) {
+  wire::Items items;
+  if (!readItems(bytes, items)) return false;
+  for (const wire::Item& item : items.items()) {
+    Value value;
+    const Reading reading = read(item, depth, value);
+    if (reading == Reading::Malformed) return false;
+    if (reading == Reading::Understood) dictionary.append(Key::copy(item.key()), std::move(value));
+  }
+  return true;
+}
+
+}  // namespace
+
+FrameBytes encode(const Hello& hello) {
+  auto content = Shared<wire::HelloFrame>::make();
+  content->setVersion(hello.version);
+  content->setOldestVersion(hello.oldestVersion);
+  content->setName(hello.name);
+  if (hello.refusalStatus != 0) {
+    content->setRefusalStatus(hello.refusalStatus);
+    content->setRefusal(hello.refusal);
+  }
+  wire::Frame frame;
+  frame.setHello(std::move(content));
+  return bytesOf(frame);
+}
+
+FrameBytes encode(const Command& command) {
+  auto content = Shared<wire::CommandFrame>::make();
+  content->setSequence(command.sequence);
+  content->setName(command.name);
+  content->setArguments(command.arguments);
+  wire::Frame frame;
+  frame.setCommand(std::move(content));
+  return bytesOf(frame);
+}
+
+FrameBytes encode(const Reply& reply) {
+  auto content = Shared<wire::ReplyFrame>::make();
+  content->setSequence(reply.sequence);
+  content->setStatus(reply.status);
+  content->setMessage(reply.message);
+  content->setContent(reply.content);
+  wire::Frame frame;
+  frame.setReply(std::move(content));
+  return bytesOf(frame);
+}
+
+FrameBytes encode(const Delivery& delivery) {
+  auto content = Shared<wire::DeliveryFrame>::make();
+  content->setOn(delivery.on);
+  wire::Frame frame;
+  frame.setDelivery(std::move(content));
+  return bytesOf(frame);
+}
+
+FrameBytes encode(const Event& event) {
+  auto content = Shared<wire::EventFrame>::make();
+  content->setKind(static_cast<std::int32_t>(event.kind));
+  content->setPayload(event.payload);
+  content->setTime(unsignedOf(event.time));
+  content->setOrigin(event.origin);
+  // What is 0 reads as 0 when it is left out.
+  if (event.metricId != 0) content->setMetricId(unsignedOf(event.metricId));
+  if (event.profileId != 0) content->setProfileId(unsignedOf(event.profileId));
+  if (event.group != 0) content->setGroup(unsignedOf(event.group));
+  if (event.triggerId != 0) content->setTriggerId(unsignedOf(event.triggerId));
+  if (event.triggerRef != 0) content->setTriggerRef(unsignedOf(event.triggerRef));
+  if (event.triggerType != 0) content->setTriggerType(unsignedOf(event.triggerType));
+  wire::Frame frame;
+  frame.setEvent(std::move(content));
+  return bytesOf(frame);
+}
+
+FrameBytes encode(const Dropped& dropped) {
+  auto content = Shared<wire::DroppedFrame>::make();
+  content->setCount(dropped.count);
+  wire::Frame frame;
+  frame.setDropped(std::move(content));
+  return bytesOf(frame);
+}
+
+FrameBytes encode(const Ping& ping) {
+  auto content = Shared<wire::PingFrame>::make();
+  content->setNumber(ping.number);
+  content->setIsAnswer(ping.isAnswer);
+  wire::Frame frame;
+  frame.setPing(std::move(content));
+  return bytesOf(frame);
+}
+
+bool decodeFrame(std::span<const std::uint8_t> bytes, FrameHandler& handler) {
+  wire::Frame frame;
+  PBDataReader reader(bytes);
+  if (!frame.readFrom(reader)) return false;
+  if (const auto hello = frame.hello()) {
+    handler.onHello({.version = hello->version(),
+                     .oldestVersion = hello->oldestVersion(),
+                     .name = std::string(hello->name()),
+                     .refusalStatus = hello->refusalStatus(),
+                     .refusal = std::string(hello->refusal())});
+  } else if (const auto command = frame.command()) {
+    handler.onCommand({.sequence = command->sequence(),
+                       .name = std::string(command->name()),
+                       .arguments = copyOf(command->arguments())});
+  } else if (const auto reply = frame.reply()) {
+    handler.onReply({.sequence = reply->sequence(),
+                     .status = reply->status(),
+                     .message = std::string(reply->message()),
+                     .content = copyOf(reply->content())});
+  } else if (const auto delivery = frame.delivery()) {
+    handler.onDelivery({.on = delivery->on()});
+  } else if (const auto event = frame.event()) {
+    // A kind of event that is not known is passed over like any unknown frame.
+    if (event->kind() != static_cast<std::int32_t>(EventKind::Metric) &&
+        event->kind() != static_cast<std::int32_t>(EventKind::Trigger)) {
+      return true;
+    }
+    handler.onEvent({.kind = static_cast<EventKind>(event->kind()),
+                     .metricId = signedOf(event->metricId()),
+                     .payload = copyOf(event->payload()),
+                     .profileId = signedOf(event->profileId()),
+                     .time = signedOf(event->time()),
+                     .origin = std::string(event->origin()),
+                     .group = signedOf(event->group()),
+                     .triggerId = signedOf(event->triggerId()),
+                     .triggerRef = signedOf(event->triggerRef()),
+                     .triggerType = signedOf(event->triggerType())});
+  } else if (const auto dropped = frame.dropped()) {
+    handler.onDropped({.count = dropped->count()});
+  } else if (const auto ping = frame.ping()) {
+    handler.onPing({.number = ping->number(), .isAnswer = ping->isAnswer()});
+  }
+  return true;
+}
+
+std::vector<std::uint8_t> encodeDictionary(const Dictionary& dictionary) {
+  wire::Items items;
+  for (const auto& [key, value] : dictionary) {
+    wire::Item& item = items.addItem();
+    item.setKey(key.text());
+    fill(item, value);
+  }
+  return encodeItems(items);
+}
+
+std::optional<Dictionary> decodeDictionary(std::span<const std::uint8_t> bytes) {
+  std::optional<Dictionary> dictionary(std::in_place);
+  if (!readDictionary(bytes, deepestNesting, *dictionary)) dictionary.reset();
+  return dictionary;
+}
+
+}  // namespace radix

@@ -1,0 +1,111 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// What a client and the service say to each other, one frame for each sentence. How they look on the wire stands in
+// radix/frame_tables.h.
+//
+// The client opens with Hello and the service answers with its own. A Hello with a refusal says why there will be no
+// conversation. Then the client sends Command and Delivery, and the service Reply, Event and Dropped; either may send
+// Ping. Unknown frames and unknown fields are ignored, so that both sides can grow.
+//
+// Versions: each side says which version of the protocol it speaks and the oldest with which it can still work. Two
+// sides talk when neither is older than the oldest of the other; then both keep to what the older of the two knows.
+// Otherwise the service refuses, and the client that is newer than it likes goes away; both say which side to update.
+#pragma once
+
+#include <cstdint>
+#include <optional>
+#include <span>
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include "radix/link.h"
+#include "values/dictionary.h"
+
+namespace radix {
+
+inline constexpr std::uint32_t protocolVersion = 1;
+inline constexpr std::uint32_t oldestProtocolVersion = 1;
+
+struct Hello {
+  std::uint32_t version = protocolVersion;
+  std::uint32_t oldestVersion = oldestProtocolVersion;
+  std::string name{};              // the client's name, or the service's with its version
+  std::int32_t refusalStatus = 0;  // not 0: this side does not talk to the other
+  std::string refusal{};
+};
+
+struct Command {
+  std::uint32_t sequence = 0;  // chosen by the client; the reply bears it
+  std::string name{};
+  std::vector<std::uint8_t> arguments{};  // encoded by encodeDictionary()
+};
+
+struct Reply {
+  std::uint32_t sequence = 0;
+  std::int32_t status = 0;
+  std::string message{};
+  std::vector<std::uint8_t> content{};  // encoded by encodeDictionary()
+};
+
+// Whether the client takes events from now on.
+struct Delivery {
+  bool on = false;
+};
+
+enum class EventKind : std::int32_t { Metric = 0, Trigger = 1 };
+
+struct Event {
+  EventKind kind = EventKind::Metric;
+  std::int64_t metricId = 0;
+  std::vector<std::uint8_t> payload{};
+  std::int64_t profileId = 0;
+  std::int64_t time = 0;  // milliseconds since 1970-01-01 UTC
+  std::string origin{};
+  std::int64_t group = 0;
+  std::int64_t triggerId = 0;
+  std::int64_t triggerRef = 0;
+  std::int64_t triggerType = 0;
+};
+
+// So many records were not delivered because the client was too slow, counted since the last such frame.
+struct Dropped {
+  std::uint64_t count = 0;
+};
+
+// Asks whether the other side is alive; it sends the same number back as an answer.
+struct Ping {
+  std::uint64_t number = 0;
+  bool isAnswer = false;
+};
+
+FrameBytes encode(const Hello& hello);
+FrameBytes encode(const Command& command);
+FrameBytes encode(const Reply& reply);
+FrameBytes encode(const Delivery& delivery);
+FrameBytes encode(const Event& event);
+FrameBytes encode(const Dropped& dropped);
+FrameBytes encode(const Ping& ping);
+
+// Takes what a frame says. What a side has no ears for is ignored.
+class FrameHandler {
+ public:
+  virtual ~FrameHandler() = default;
+  virtual void onHello(Hello) {}
+  virtual void onCommand(Command) {}
+  virtual void onReply(Reply) {}
+  virtual void onDelivery(Delivery) {}
+  virtual void onEvent(Event) {}
+  virtual void onDropped(Dropped) {}
+  virtual void onPing(Ping) {}
+};
+
+// Hands the content to the handler. False when the bytes are no frame; nothing has been handed over then.
+bool decodeFrame(std::span<const std::uint8_t> bytes, FrameHandler& handler);
+
+// Dictionaries of commands and replies, with their order and the exact type of each value. Entries of types that the
+// reader does not know are left out. Absent when the bytes are no dictionary, or one nested deeper than anybody needs.
+std::vector<std::uint8_t> encodeDictionary(const probeview::Dictionary& dictionary);
+std::optional<probeview::Dictionary> decodeDictionary(std::span<const std::uint8_t> bytes);
+
+}  // namespace radix

@@ -1,0 +1,258 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "radix/service_connection.h"
+
+#include <algorithm>
+#include <utility>
+
+namespace radix::client {
+
+namespace {
+
+std::string versionTrouble(const ServiceConnection::Identity& own, const Hello& service) {
+  const bool clientIsTooOld = service.oldestVersion > own.version;
+  return "the baseband service speaks version " + std::to_string(service.version) + " of the protocol and needs " +
+         std::to_string(service.oldestVersion) + ", this client speaks " + std::to_string(own.version) + " and needs " +
+         std::to_string(own.oldestVersion) + ": update " + (clientIsTooOld ? "the client" : "the service");
+}
+
+}  // namespace
+
+ServiceConnection::ServiceConnection(probeview::Worker& worker, std::unique_ptr<Connector> connector, Identity identity,
+                                     Events events)
+    : worker_(worker), connector_(std::move(connector)), identity_(std::move(identity)), events_(std::move(events)) {
+  state_.since = worker_.clock().wallTime();
+}
+
+ServiceConnection::~ServiceConnection() { failAll(Status::NoService, "the manager was closed"); }
+
+void ServiceConnection::start() { attempt(); }
+
+void ServiceConnection::perform(std::shared_ptr<PendingCommand> command) {
+  Waiting waiting{.command = std::move(command), .deadline = {}};
+  if (waiting_.size() >= mostCommandsAtOnce) {
+    finish(std::move(waiting), Status::TooMany,
+           "more than " + std::to_string(mostCommandsAtOnce) + " commands wait for the baseband service");
+    return;
+  }
+  const PendingCommand* key = waiting.command.get();
+  waiting.deadline = worker_.after(waiting.command->deadline - worker_.clock().monotonicTime(), [this, key] {
+    const auto found =
+        std::find_if(waiting_.begin(), waiting_.end(), [key](const Waiting& one) { return one.command.get() == key; });
+    if (found == waiting_.end()) return;
+    Waiting late = std::move(*found);
+    waiting_.erase(found);
+    const bool wasSent = late.sequence != 0;
+    finish(std::move(late), Status::TimedOut,
+           wasSent || state_.trouble.empty() ? "the baseband service did not answer in time" : state_.trouble);
+    updateReading();
+  });
+  waiting_.push_back(std::move(waiting));
+  updateReading();
+  switch (phase_) {
+    case Phase::Ready:
+      sendWaiting();
+      break;
+    case Phase::Greeting:
+      break;
+    case Phase::Idle:
+      // Whoever asks now may have just started the service: no waiting for the next attempt in the row.
+      attempt();
+      break;
+  }
+}
+
+void ServiceConnection::setDelivery(bool on) {
+  // Also when it is on already: switching on asks for the last records of a configuration pushed in the meantime.
+  delivery_ = on;
+  if (phase_ == Phase::Ready) send(encode(Delivery{on}));
+}
+
+void ServiceConnection::setEventsWelcome(bool welcome) {
+  eventsWelcome_ = welcome;
+  updateReading();
+}
+
+void ServiceConnection::attempt() {
+  nextAttempt_.reset();
+  ConnectResult result = connector_->connect();
+  if (!result.link) {
+    state_.trouble = std::move(result.error);
+    if (result.busy) {
+      scheduleAttempt(waiting_.empty() ? reconnectDelay_ : busyRetryDelay);
+    } else {
+      failAll(Status::NoService, state_.trouble);
+      scheduleAttempt(reconnectDelay_);
+      reconnectDelay_ = std::min(reconnectDelay_ * 2, longestReconnectDelay);
+    }
+    publish();
+    return;
+  }
+  phase_ = Phase::Greeting;
+  link_ = std::move(result.link);
+  link_->start(*this);
+  updateReading();
+  greetingDeadline_ = worker_.after(commandDeadline, [this] {
+    lose(Status::TimedOut, "the baseband service accepted the connection and then did not greet");
+  });
+  send(encode(Hello{.version = identity_.version,
+                    .oldestVersion = identity_.oldestVersion,
+                    .name = identity_.clientName,
+                    .refusalStatus = 0,
+                    .refusal = {}}));
+}
+
+void ServiceConnection::scheduleAttempt(std::chrono::nanoseconds delay) {
+  nextAttempt_ = worker_.after(delay, [this] { attempt(); });
+}
+
+void ServiceConnection::lose(Status status, const std::string& reason) {
+  greetingDeadline_.reset();
+  link_.reset();
+  outgoing_.clear();
+  blocked_ = false;
+  phase_ = Phase::Idle;
+  if (state_.connected) {
+    state_.connected = false;
+    state_.since = worker_.clock().wallTime();
+  }
+  state_.trouble = reason;
+  // Events that came with the last batch were received in full.
+  onBatchEnd();
+  failAll(status, reason);
+  scheduleAttempt(reconnectDelay_);
+  reconnectDelay_ = std::min(reconnectDelay_ * 2, longestReconnectDelay);
+  publish();
+}
+
+void ServiceConnection::failAll(Status status, const std::string& reason) {
+  std::deque<Waiting> failed = std::move(waiting_);
+  waiting_.clear();
+  for (Waiting& one : failed) finish(std::move(one), status, reason);
+}
+
+void ServiceConnection::finish(Waiting waiting, Status status, std::string message) {
+  PendingCommand& command = *waiting.command;
+  command.result = {static_cast<std::int32_t>(status), std::move(message)};
+  if (command.name == kCommandAddConfiguration) {
+    if (status == Status::Ok) configuration_ = command.arguments;
+  } else if (command.name == kCommandClearConfiguration) {
+    // Wanted or not by the service: who clears a configuration does not want it back on the next connection.
+    configuration_.reset();
+  }
+  command.done->open();
+}
+
+void ServiceConnection::restore() {
+  if (configuration_) {
+    send(encode(Command{.sequence = ++lastSequence_, .name = kCommandAddConfiguration, .arguments = *configuration_}));
+  }
+  if (delivery_) send(encode(Delivery{true}));
+}
+
+void ServiceConnection::sendWaiting() {
+  for (Waiting& one : waiting_) {
+    if (one.sequence != 0) continue;
+    if (++lastSequence_ == 0) ++lastSequence_;
+    one.sequence = lastSequence_;
+    send(encode(Command{.sequence = one.sequence, .name = one.command->name, .arguments = one.command->arguments}));
+  }
+}
+
+void ServiceConnection::send(FrameBytes frame) {
+  outgoing_.push_back(std::move(frame));
+  flush();
+}
+
+void ServiceConnection::flush() {
+  while (!blocked_ && !outgoing_.empty() && link_) {
+    const FrameBytes next = outgoing_.front();
+    if (link_->send({&next, 1}) == 1) {
+      outgoing_.pop_front();
+    } else {
+      blocked_ = true;
+    }
+  }
+}
+
+void ServiceConnection::updateReading() {
+  if (link_) link_->setReading(eventsWelcome_ || !waiting_.empty());
+}
+
+void ServiceConnection::publish() { events_.state(state_); }
+
+void ServiceConnection::onFrame(std::span<const std::uint8_t> frame) {
+  const auto self = shared_from_this();
+  if (!decodeFrame(frame, *this)) lose(Status::MalformedFrame, "the baseband service sent what is no frame");
+}
+
+void ServiceConnection::onOverlongFrame(std::size_t size) {
+  lose(Status::MalformedFrame, "the baseband service sent a frame of " + std::to_string(size) + " bytes, more than " +
+                                   std::to_string(longestFrame));
+}
+
+void ServiceConnection::onBatchEnd() {
+  if (batch_.empty()) return;
+  std::vector<Event> batch;
+  batch.swap(batch_);
+  events_.events(std::move(batch));
+}
+
+void ServiceConnection::onWritable() {
+  blocked_ = false;
+  flush();
+}
+
+void ServiceConnection::onClosed() {
+  const auto self = shared_from_this();
+  lose(Status::NoService, phase_ == Phase::Ready ? "the baseband service went away before it answered"
+                                                 : "the baseband service closed the connection");
+}
+
+void ServiceConnection::onHello(Hello hello) {
+  if (phase_ != Phase::Greeting) return;
+  if (hello.refusalStatus != 0) {
+    lose(static_cast<Status>(hello.refusalStatus), hello.refusal);
+    return;
+  }
+  if (hello.oldestVersion > identity_.version || hello.version < identity_.oldestVersion) {
+    lose(Status::VersionMismatch, versionTrouble(identity_, hello));
+    return;
+  }
+  greetingDeadline_.reset();
+  phase_ = Phase::Ready;
+  reconnectDelay_ = firstReconnectDelay;
+  state_.connected = true;
+  state_.everConnected = true;
+  state_.since = worker_.clock().wallTime();
+  state_.serviceName = std::move(hello.name);
+  state_.trouble.clear();
+  publish();
+  restore();
+  sendWaiting();
+}
+
+void ServiceConnection::onReply(Reply reply) {
+  const auto found = std::find_if(waiting_.begin(), waiting_.end(), [&reply](const Waiting& one) {
+    return one.sequence != 0 && one.sequence == reply.sequence;
+  });
+  // Nobody waits for it any more, or it answers what was restored.
+  if (found == waiting_.end()) return;
+  Waiting answered = std::move(*found);
+  waiting_.erase(found);
+  answered.command->reply = std::move(reply.content);
+  finish(std::move(answered), static_cast<Status>(reply.status), std::move(reply.message));
+  updateReading();
+}
+
+void ServiceConnection::onEvent(Event event) { batch_.push_back(std::move(event)); }
+
+void ServiceConnection::onDropped(Dropped dropped) {
+  state_.lostEvents += dropped.count;
+  publish();
+}
+
+void ServiceConnection::onPing(Ping ping) {
+  if (!ping.isAnswer) send(encode(Ping{ping.number, true}));
+}
+
+}  // namespace radix::client

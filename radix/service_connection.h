@@ -1,0 +1,131 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include <chrono>
+#include <cstddef>
+#include <cstdint>
+#include <deque>
+#include <functional>
+#include <map>
+#include <memory>
+#include <optional>
+#include <string>
+#include <vector>
+
+#include "platform/worker.h"
+#include "radix/client.h"
+#include "radix/frames.h"
+#include "radix/link.h"
+#include "radix/status.h"
+
+namespace radix::client {
+
+inline constexpr std::chrono::nanoseconds commandDeadline = std::chrono::seconds(2);
+inline constexpr std::chrono::nanoseconds firstReconnectDelay = std::chrono::milliseconds(100);
+inline constexpr std::chrono::nanoseconds longestReconnectDelay = std::chrono::seconds(1);
+// How soon a service that takes no more connections at this moment is tried again while a command waits.
+inline constexpr std::chrono::nanoseconds busyRetryDelay = std::chrono::milliseconds(10);
+// Commands that wait for their replies at once; more than any caller has threads.
+inline constexpr std::size_t mostCommandsAtOnce = 256;
+
+// One command on its way. The worker fills in the result and then opens the gate.
+struct PendingCommand {
+  std::string name;
+  std::vector<std::uint8_t> arguments;
+  std::chrono::nanoseconds deadline{};  // on the worker's clock
+  std::shared_ptr<probeview::Gate> done;
+
+  Result result;
+  std::vector<std::uint8_t> reply;
+};
+
+// The connection of one manager: finds the service, keeps what is to be restored, matches replies with commands. A
+// state machine on one worker, where everything of it is called; it waits for nothing.
+class ServiceConnection final : public std::enable_shared_from_this<ServiceConnection>, LinkListener, FrameHandler {
+ public:
+  struct Events {
+    // The events of one batch, in order.
+    std::function<void(std::vector<Event>)> events;
+    // Something of it has changed.
+    std::function<void(const ConnectionState&)> state;
+  };
+
+  struct Identity {
+    std::string clientName;
+    std::uint32_t version = protocolVersion;
+    std::uint32_t oldestVersion = oldestProtocolVersion;
+  };
+
+  ServiceConnection(probeview::Worker& worker, std::unique_ptr<Connector> connector, Identity identity, Events events);
+  ~ServiceConnection() override;
+
+  // Looks for the service, now and for as long as this lives.
+  void start();
+  // Sends the command as soon as there is a service. Fails it when there is none, when the connection ends before the
+  // reply and at its deadline.
+  void perform(std::shared_ptr<PendingCommand> command);
+  // Whether events are to be delivered, on this connection and on those after it.
+  void setDelivery(bool on);
+  // Whether events may come in now. While a command waits they do in any case: its reply stands behind them.
+  void setEventsWelcome(bool welcome);
+
+ private:
+  enum class Phase { Idle, Greeting, Ready };
+  struct Waiting {
+    std::shared_ptr<PendingCommand> command;
+    probeview::ScheduledTaskHandle deadline;
+    std::uint32_t sequence = 0;  // 0: not sent yet
+  };
+
+  void onFrame(std::span<const std::uint8_t> frame) override;
+  void onOverlongFrame(std::size_t size) override;
+  void onBatchEnd() override;
+  void onWritable() override;
+  void onClosed() override;
+  void onHello(Hello hello) override;
+  void onReply(Reply reply) override;
+  void onEvent(Event event) override;
+  void onDropped(Dropped dropped) override;
+  void onPing(Ping ping) override;
+
+  void attempt();
+  void scheduleAttempt(std::chrono::nanoseconds delay);
+  // Ends the link, fails what waits for it and tries again later.
+  void lose(Status status, const std::string& reason);
+  void failAll(Status status, const std::string& reason);
+  void finish(Waiting waiting, Status status, std::string message);
+  void restore();
+  void sendWaiting();
+  void send(FrameBytes frame);
+  void flush();
+  void updateReading();
+  void publish();
+
+  probeview::Worker& worker_;
+  std::unique_ptr<Connector> connector_;
+  Identity identity_;
+  Events events_;
+
+  Phase phase_ = Phase::Idle;
+  std::unique_ptr<Link> link_;
+  std::deque<FrameBytes> outgoing_;
+  bool blocked_ = false;
+  probeview::ScheduledTaskHandle nextAttempt_;
+  probeview::ScheduledTaskHandle greetingDeadline_;
+  std::chrono::nanoseconds reconnectDelay_ = firstReconnectDelay;
+  std::string lastTrouble_;
+
+  // In the order in which they were asked for.
+  std::deque<Waiting> waiting_;
+  std::uint32_t lastSequence_ = 0;
+
+  // What is restored on a new connection.
+  std::optional<std::vector<std::uint8_t>> configuration_;
+  bool delivery_ = false;
+
+  std::vector<Event> batch_;
+  bool eventsWelcome_ = true;
+  ConnectionState state_;
+};
+
+}  // namespace radix::client

@@ -1,0 +1,102 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "service/outbox.h"
+
+#include <algorithm>
+#include <utility>
+
+#include "radix/frames.h"
+
+namespace probeview {
+
+namespace {
+
+// Queues of metrics of which nothing waits are kept for the next record; not for more metrics than there are.
+constexpr std::size_t mostMetricsKnown = 256;
+
+}  // namespace
+
+void Outbox::addRecord(std::int64_t metricId, radix::FrameBytes frame) {
+  const std::size_t size = frame->size();
+  if (records_ + 1 > limits_.records || bytes_ + size > limits_.bytes) makeRoom(metricId, size);
+  if (ofMetric_.size() > mostMetricsKnown) {
+    std::erase_if(ofMetric_, [](const auto& one) { return one.second.empty(); });
+  }
+  ofMetric_[metricId].push_back(firstNumber_ + queue_.size());
+  queue_.push_back({metricId, std::move(frame)});
+  ++records_;
+  bytes_ += size;
+}
+
+void Outbox::makeRoom(std::int64_t metricId, std::size_t size) {
+  while (records_ > 0 && (records_ + 1 > limits_.records || bytes_ + size > limits_.bytes)) {
+    auto same = ofMetric_.find(metricId);
+    if (same == ofMetric_.end() || same->second.empty()) {
+      same = std::max_element(ofMetric_.begin(), ofMetric_.end(), [](const auto& left, const auto& right) {
+        return left.second.size() < right.second.size();
+      });
+    }
+    dropOldest(same->second);
+  }
+}
+
+void Outbox::dropOldest(std::deque<std::uint64_t>& waiting) {
+  Entry& entry = queue_[static_cast<std::size_t>(waiting.front() - firstNumber_)];
+  waiting.pop_front();
+  bytes_ -= entry.frame->size();
+  entry.frame.reset();
+  --records_;
+  ++lost_;
+  discardDropped();
+}
+
+void Outbox::discardDropped() {
+  while (!queue_.empty() && queue_.front().frame == nullptr) {
+    queue_.pop_front();
+    ++firstNumber_;
+  }
+  // Holes in the middle may outnumber what is left, when one metric is dropped behind another that waits: close them.
+  if (queue_.size() <= 2 * limits_.records) return;
+  std::deque<Entry> kept;
+  ofMetric_.clear();
+  firstNumber_ += queue_.size();
+  for (Entry& entry : queue_) {
+    if (entry.frame == nullptr) continue;
+    ofMetric_[entry.metricId].push_back(firstNumber_ + kept.size());
+    kept.push_back(std::move(entry));
+  }
+  queue_ = std::move(kept);
+}
+
+std::size_t Outbox::next(std::span<radix::FrameBytes> frames) {
+  if (lost_ != told_) {
+    words_.push_back(radix::encode(radix::Dropped{lost_ - told_}));
+    told_ = lost_;
+  }
+  std::size_t count = 0;
+  for (const radix::FrameBytes& word : words_) {
+    if (count == frames.size()) return count;
+    frames[count++] = word;
+  }
+  for (const Entry& entry : queue_) {
+    if (count == frames.size()) break;
+    if (entry.frame != nullptr) frames[count++] = entry.frame;
+  }
+  return count;
+}
+
+void Outbox::sent(std::size_t count) {
+  for (; count > 0 && !words_.empty(); --count) words_.pop_front();
+  for (; count > 0; --count) {
+    discardDropped();
+    Entry& entry = queue_.front();
+    ofMetric_[entry.metricId].pop_front();
+    bytes_ -= entry.frame->size();
+    --records_;
+    ++sentRecords_;
+    queue_.pop_front();
+    ++firstNumber_;
+  }
+  discardDropped();
+}
+
+}  // namespace probeview

@@ -1,0 +1,36 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "service/payload_check.h"
+
+#include <charconv>
+
+#include "messages/metric_identifiers.h"
+#include "messages/runtime/codable.h"
+#include "messages/runtime/data_reader.h"
+
+namespace probeview {
+
+bool payloadDecodes(std::int64_t metricId, std::span<const std::uint8_t> payload) {
+  const MetricIdentifier* metric = metricWithId(metricId);
+  if (metric == nullptr || metric->message == nullptr) return true;
+  const auto message = metric->message->make();
+  PBDataReader reader(payload);
+  return message->readFrom(reader);
+}
+
+std::string hexText(std::int64_t number) {
+  char digits[16];
+  const auto end = std::to_chars(digits, digits + sizeof digits, static_cast<std::uint64_t>(number), 16).ptr;
+  std::string text = "0x";
+  for (const char* digit = digits; digit != end; ++digit) {
+    text += *digit >= 'a' ? static_cast<char>(*digit - 'a' + 'A') : *digit;
+  }
+  return text;
+}
+
+std::string metricText(std::int64_t metricId) {
+  const MetricIdentifier* metric = metricWithId(metricId);
+  if (metric == nullptr) return hexText(metricId);
+  return std::string(metric->name) + " (" + hexText(metricId) + ")";
+}
+
+}  // namespace probeview

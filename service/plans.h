@@ -1,0 +1,15 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include <optional>
+#include <span>
+
+#include "service/metric_source.h"
+
+namespace probeview {
+
+// What all plans together ask for, each metric at the shortest period; "on every change" is more than any period, as it
+// leaves nothing out. Absent when there is no plan at all.
+std::optional<MetricPlan> unite(std::span<const MetricPlan* const> plans);
+
+}  // namespace probeview

@@ -1,0 +1,273 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "service/service.h"
+
+#include <algorithm>
+#include <string_view>
+#include <utility>
+
+#include "radix/client.h"
+#include "radix/service_commands.h"
+#include "radix/status.h"
+#include "service/payload_check.h"
+#include "service/plans.h"
+#include "service/status_report.h"
+#include "values/printer.h"
+
+namespace probeview {
+
+namespace {
+
+using radix::Reply;
+using radix::Status;
+
+// More notes on one configuration than anybody reads in a log.
+constexpr std::size_t mostNotesLogged = 10;
+constexpr std::int64_t configurationPayloadType = 0;
+
+Reply answer(Status status, std::string message = {}) {
+  return {.sequence = 0, .status = static_cast<std::int32_t>(status), .message = std::move(message), .content = {}};
+}
+
+// An argument that need not be there; then it is 0.
+std::int64_t integerArgument(const Dictionary& arguments, std::string_view key) {
+  const Value* value = arguments.find(key);
+  return value != nullptr ? value->int64().value_or(0) : 0;
+}
+
+struct PushedConfiguration {
+  std::optional<Configuration> configuration;
+  Reply refusal;
+};
+
+PushedConfiguration readConfiguration(const Dictionary& arguments, ServiceLog& log, const std::string& who) {
+  const Value* payload = arguments.find(radix::kKeyPayload);
+  if (payload == nullptr || !payload->bytes()) {
+    return {{}, answer(Status::BadArguments, "the configuration is missing: kKeyPayload must hold its bytes")};
+  }
+  if (const std::int64_t type = integerArgument(arguments, radix::kKeyPayloadType); type != configurationPayloadType) {
+    return {{}, answer(Status::BadArguments, "the payload type " + std::to_string(type) + " is not known, only 0 is")};
+  }
+  const auto bytes = *payload->bytes();
+  ConfigurationResult result = parseConfiguration({reinterpret_cast<const char*>(bytes.data()), bytes.size()});
+  if (!result.configuration) {
+    log.write(LogLevel::Warning, "the configuration of " + who + " was refused: " + result.error);
+    return {{}, answer(Status::BadConfiguration, result.error)};
+  }
+  const auto& notes = result.configuration->notes;
+  for (std::size_t index = 0; index < std::min(notes.size(), mostNotesLogged); ++index) {
+    log.write(LogLevel::Info, "the configuration of " + who + ": " + notes[index]);
+  }
+  if (notes.size() > mostNotesLogged) {
+    log.write(LogLevel::Info,
+              "the configuration of " + who + ": " + std::to_string(notes.size() - mostNotesLogged) + " notes more");
+  }
+  return {std::move(result.configuration), answer(Status::Ok)};
+}
+
+std::string nameOf(const Session& session) {
+  return "client " + std::to_string(session.number()) + " '" + session.clientName() + "'";
+}
+
+}  // namespace
+
+Service::Service(Worker& worker, ServiceLog log, Settings settings)
+    : worker_(worker),
+      log_(log),
+      settings_(std::move(settings)),
+      sessionSettings_{.serviceName = settings_.name,
+                       .version = settings_.version,
+                       .oldestVersion = settings_.oldestVersion,
+                       .outbox = settings_.outbox},
+      started_(worker.clock().monotonicTime()),
+      alive_(std::make_shared<bool>(true)) {}
+
+Service::~Service() { *alive_ = false; }
+
+void Service::addSource(std::unique_ptr<MetricSource> source) {
+  sources_.push_back(std::make_unique<SourceSlot>(std::move(source), worker_, log_,
+                                                  [this](MetricRecord record) { route(std::move(record)); }));
+  SourceSlot& slot = *sources_.back();
+  log_.write(LogLevel::Info,
+             "source " + slot.origin() + " can fill " + std::to_string(slot.metrics().size()) + " metrics");
+  slot.start(plan_, listening_);
+}
+
+void Service::accept(std::unique_ptr<radix::Link> link, Peer peer) {
+  // Those who were refused stay for a moment; a crowd of them is not waited for.
+  if (sessions_.size() >= 2 * settings_.mostClients) {
+    log_.write(LogLevel::Warning,
+               "a connection of process " + std::to_string(peer.process) + " was closed: there are too many already");
+    return;
+  }
+  sessions_.push_back(std::make_unique<Session>(++sessionsAccepted_, worker_, log_, static_cast<Session::Host&>(*this),
+                                                sessionSettings_, std::move(link), std::move(peer)));
+  sessions_.back()->start();
+}
+
+std::size_t Service::clientCount() const {
+  return static_cast<std::size_t>(
+      std::count_if(sessions_.begin(), sessions_.end(), [](const auto& session) { return session->isActive(); }));
+}
+
+std::optional<std::string> Service::refusal(const Session&) {
+  if (clientCount() < settings_.mostClients) return std::nullopt;
+  return "there are already " + std::to_string(settings_.mostClients) + " clients, more are not served";
+}
+
+Reply Service::perform(Session& session, const radix::Command& command) {
+  const auto arguments =
+      command.arguments.empty() ? std::optional<Dictionary>(std::in_place) : radix::decodeDictionary(command.arguments);
+  if (!arguments) return answer(Status::BadArguments, "the arguments of " + command.name + " cannot be read");
+  const std::string_view name = command.name;
+  if (name == radix::kCommandAddConfiguration) return addConfiguration(session, *arguments);
+  if (name == radix::kCommandClearConfiguration) return clearConfiguration(session);
+  if (name == radix::kCommandQueryMetric) return queryMetric(session, *arguments);
+  if (name == radix::kCommandShowStatus) return showStatus();
+  if (name == radix::kCommandSetBaseConfiguration) return setBaseConfiguration(*arguments);
+  if (name == radix::kCommandClearBaseConfiguration) return clearBaseConfiguration();
+  return answer(Status::UnknownCommand, "the command '" + command.name.substr(0, 64) + "' is not known");
+}
+
+Reply Service::addConfiguration(Session& session, const Dictionary& arguments) {
+  PushedConfiguration pushed = readConfiguration(arguments, log_, nameOf(session));
+  if (!pushed.configuration) return pushed.refusal;
+  session.setConfiguration(std::move(pushed.configuration));
+  updatePlan();
+  return pushed.refusal;
+}
+
+Reply Service::clearConfiguration(Session& session) {
+  session.setConfiguration(std::nullopt);
+  updatePlan();
+  return answer(Status::Ok);
+}
+
+Reply Service::setBaseConfiguration(const Dictionary& arguments) {
+  PushedConfiguration pushed = readConfiguration(arguments, log_, "the service");
+  if (!pushed.configuration) return pushed.refusal;
+  baseConfiguration_ = std::move(pushed.configuration);
+  log_.write(LogLevel::Info, "the service has a base configuration of " +
+                                 std::to_string(baseConfiguration_->plan.metrics.size()) + " metrics");
+  updatePlan();
+  return pushed.refusal;
+}
+
+Reply Service::clearBaseConfiguration() {
+  baseConfiguration_.reset();
+  log_.write(LogLevel::Info, "the service has no base configuration any more");
+  updatePlan();
+  return answer(Status::Ok);
+}
+
+Reply Service::queryMetric(Session& session, const Dictionary& arguments) {
+  const std::int64_t trigger = integerArgument(arguments, radix::kKeyTriggerID);
+  std::vector<std::int64_t> metrics;
+  if (const std::int64_t metric = integerArgument(arguments, radix::kKeyMetricID); metric != 0) {
+    metrics.push_back(metric);
+  } else if (trigger != 0) {
+    // A client's own configuration says what its triggers mean; without one the service's does.
+    const auto& configuration = session.configuration() ? session.configuration() : baseConfiguration_;
+    if (configuration) {
+      if (const auto found = configuration->triggers.find(trigger); found != configuration->triggers.end()) {
+        metrics = found->second;
+      }
+    }
+    if (metrics.empty()) {
+      return answer(Status::CannotFill, "no configuration says which metrics the trigger " + hexText(trigger) +
+                                            " stands for: push one with it under [triggers]");
+    }
+  } else {
+    return answer(Status::BadArguments, "a query names a metric in kKeyMetricID or a trigger in kKeyTriggerID");
+  }
+
+  std::string missing;
+  bool any = false;
+  for (const std::int64_t metric : metrics) {
+    // Before the source is asked, as it may answer at once.
+    const bool wanted = session.wants(metric);
+    bool taken = false;
+    for (const auto& source : sources_) {
+      if (!source->canFill(metric)) continue;
+      if (!wanted) session.expectMetric(metric);
+      taken = source->query(metric) || taken;
+    }
+    any = any || taken;
+    if (!taken) missing += (missing.empty() ? "" : ", ") + metricText(metric);
+  }
+  if (!any) return answer(Status::CannotFill, "no source can fill " + missing);
+  return answer(Status::Ok, missing.empty() ? std::string() : "no source can fill " + missing);
+}
+
+Reply Service::showStatus() const {
+  Reply reply = answer(Status::Ok);
+  reply.content = radix::encodeDictionary(StatusReport::of(*this));
+  return reply;
+}
+
+void Service::deliveryChanged(Session& session, bool switchedOn) {
+  if (switchedOn && session.takeLastRecordsDue()) {
+    const auto now = worker_.clock().monotonicTime();
+    for (const auto& [arrival, record] : lastRecords_.records()) {
+      if (session.wants(record.metricId)) session.send(record.metricId, record.frame, now);
+    }
+  }
+  updateListening();
+}
+
+void Service::ended(Session&) {
+  if (removalPosted_) return;
+  removalPosted_ = true;
+  // The session that has ended is still at work.
+  worker_.post([this, alive = alive_] {
+    if (*alive) removeEnded();
+  });
+}
+
+void Service::removeEnded() {
+  removalPosted_ = false;
+  std::erase_if(sessions_, [](const auto& session) { return session->hasEnded(); });
+  updatePlan();
+  updateListening();
+}
+
+void Service::route(MetricRecord record) {
+  const auto frame = radix::encode(radix::Event{.kind = radix::EventKind::Metric,
+                                                .metricId = record.metricId,
+                                                .payload = std::move(record.payload),
+                                                .profileId = 0,
+                                                .time = record.time.count(),
+                                                .origin = std::move(record.origin),
+                                                .group = 0,
+                                                .triggerId = 0,
+                                                .triggerRef = 0,
+                                                .triggerType = 0});
+  lastRecords_.keep(record.metricId, frame);
+  if (!listening_) return;
+  const auto now = worker_.clock().monotonicTime();
+  for (const auto& session : sessions_) {
+    if (session->isListening() && session->wants(record.metricId)) session->send(record.metricId, frame, now);
+  }
+}
+
+void Service::updatePlan() {
+  std::vector<const MetricPlan*> plans;
+  if (baseConfiguration_) plans.push_back(&baseConfiguration_->plan);
+  for (const auto& session : sessions_) {
+    if (session->isActive() && session->configuration()) plans.push_back(&session->configuration()->plan);
+  }
+  std::optional<MetricPlan> plan = unite(plans);
+  const bool same = plan.has_value() == plan_.has_value() && (!plan || plan->metrics == plan_->metrics);
+  if (same) return;
+  plan_ = std::move(plan);
+  for (const auto& source : sources_) source->setPlan(plan_);
+}
+
+void Service::updateListening() {
+  const bool listening =
+      std::any_of(sessions_.begin(), sessions_.end(), [](const auto& session) { return session->isListening(); });
+  if (listening == listening_) return;
+  listening_ = listening;
+  for (const auto& source : sources_) source->setListening(listening_);
+}
+
+}  // namespace probeview

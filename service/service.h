@@ -1,0 +1,89 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include <chrono>
+#include <cstddef>
+#include <cstdint>
+#include <memory>
+#include <optional>
+#include <string>
+#include <vector>
+
+#include "platform/worker.h"
+#include "radix/frames.h"
+#include "radix/link.h"
+#include "service/configuration.h"
+#include "service/last_records.h"
+#include "service/log.h"
+#include "service/metric_source.h"
+#include "service/session.h"
+#include "service/source_slot.h"
+
+namespace probeview {
+
+// The baseband manager service without its socket: sources on one side, sessions on the other, between them the
+// configurations and the last record of each metric. Lives on one worker, where everything of it is called, and does
+// nothing while nothing happens.
+class Service final : Session::Host {
+ public:
+  struct Settings {
+    std::string name = "radixd " PROBEVIEW_VERSION;
+    std::uint32_t version = radix::protocolVersion;
+    std::uint32_t oldestVersion = radix::oldestProtocolVersion;
+    // Clients that are served at once; those past it are told so.
+    std::size_t mostClients = 128;
+    Outbox::Limits outbox;
+  };
+
+  Service(Worker& worker, ServiceLog log, Settings settings);
+  ~Service() override;
+  Service(const Service&) = delete;
+  Service& operator=(const Service&) = delete;
+
+  // Starts the source.
+  void addSource(std::unique_ptr<MetricSource> source);
+  // Begins a conversation over the link.
+  void accept(std::unique_ptr<radix::Link> link, Peer peer);
+
+  std::size_t clientCount() const;
+  ServiceLog& log() { return log_; }
+
+ private:
+  friend class StatusReport;
+
+  std::optional<std::string> refusal(const Session& session) override;
+  radix::Reply perform(Session& session, const radix::Command& command) override;
+  void deliveryChanged(Session& session, bool switchedOn) override;
+  void ended(Session& session) override;
+
+  radix::Reply addConfiguration(Session& session, const Dictionary& arguments);
+  radix::Reply clearConfiguration(Session& session);
+  radix::Reply setBaseConfiguration(const Dictionary& arguments);
+  radix::Reply clearBaseConfiguration();
+  radix::Reply queryMetric(Session& session, const Dictionary& arguments);
+  radix::Reply showStatus() const;
+
+  // Takes a record of a source to all who want it.
+  void route(MetricRecord record);
+  // Tells the sources what has changed for them.
+  void updatePlan();
+  void updateListening();
+  void removeEnded();
+
+  Worker& worker_;
+  ServiceLog log_;
+  Settings settings_;
+  Session::Settings sessionSettings_;
+  std::chrono::nanoseconds started_;
+  std::vector<std::unique_ptr<SourceSlot>> sources_;
+  std::vector<std::unique_ptr<Session>> sessions_;
+  std::uint64_t sessionsAccepted_ = 0;
+  LastRecords lastRecords_;
+  std::optional<Configuration> baseConfiguration_;
+  std::optional<MetricPlan> plan_;
+  bool listening_ = false;
+  bool removalPosted_ = false;
+  std::shared_ptr<bool> alive_;
+};
+
+}  // namespace probeview

@@ -1,0 +1,228 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "service/session.h"
+
+#include <algorithm>
+#include <array>
+#include <utility>
+
+namespace probeview {
+
+namespace {
+
+using radix::Status;
+
+// How long a client may take to greet, and to go away after it was refused.
+constexpr std::chrono::seconds greetingTime{5};
+constexpr std::chrono::seconds leavingTime{1};
+constexpr std::size_t longestClientName = 64;
+// Frames that leave together; a queue that has grown this long does not wait for the end of the turn.
+constexpr std::size_t framesPerFlush = 64;
+// Replies that a client may leave unread before it is no longer listened to.
+constexpr std::size_t mostWordsUnread = 64;
+
+}  // namespace
+
+Session::Session(std::uint64_t number, Worker& worker, ServiceLog& log, Host& host, const Settings& settings,
+                 std::unique_ptr<radix::Link> link, Peer peer)
+    : number_(number),
+      worker_(worker),
+      log_(log),
+      host_(host),
+      settings_(settings),
+      link_(std::move(link)),
+      peer_(std::move(peer)),
+      connectedSince_(worker.clock().wallTime()),
+      started_(worker.clock().monotonicTime()),
+      outbox_(settings.outbox),
+      alive_(std::make_shared<bool>(true)) {}
+
+Session::~Session() { *alive_ = false; }
+
+void Session::start() {
+  deadline_ = worker_.after(greetingTime, [this] {
+    log_.write(LogLevel::Warning,
+               description() + " did not greet within " + std::to_string(greetingTime.count()) + " s and was let go");
+    end();
+  });
+  link_->start(*this);
+  if (peer_.refusal) {
+    log_.write(LogLevel::Warning, description() + " was refused: " + *peer_.refusal);
+    refuse(Status::NotPermitted, *peer_.refusal);
+  }
+}
+
+double Session::recordsPerSecond() const { return rate_.perSecond(worker_.clock().monotonicTime(), started_); }
+
+bool Session::wants(std::int64_t metricId) const {
+  return !configuration_ || configured_.contains(metricId) || asked_.contains(metricId);
+}
+
+void Session::setConfiguration(std::optional<Configuration> configuration) {
+  configuration_ = std::move(configuration);
+  configured_.clear();
+  asked_.clear();
+  if (!configuration_) return;
+  lastRecordsGiven_ = false;
+  for (const auto& [metric, period] : configuration_->plan.metrics) configured_.insert(metric);
+  for (const auto& [trigger, metrics] : configuration_->triggers) configured_.insert(metrics.begin(), metrics.end());
+}
+
+bool Session::takeLastRecordsDue() { return !std::exchange(lastRecordsGiven_, true); }
+
+void Session::send(std::int64_t metricId, const radix::FrameBytes& frame, std::chrono::nanoseconds now) {
+  outbox_.addRecord(metricId, frame);
+  rate_.add(now);
+  if (!blocked_ && outbox_.records() >= framesPerFlush) {
+    flush();
+  } else {
+    flushSoon();
+  }
+}
+
+void Session::onFrame(std::span<const std::uint8_t> frame) {
+  // Whoever was refused may go on talking until it has gone.
+  if (phase_ == Phase::Refused || phase_ == Phase::Ended) return;
+  if (!radix::decodeFrame(frame, *this)) {
+    const std::string reason = "a frame of " + std::to_string(frame.size()) + " bytes is malformed";
+    log_.write(LogLevel::Warning, description() + " was let go: " + reason);
+    refuse(Status::MalformedFrame, reason);
+  } else if (phase_ == Phase::Greeting) {
+    const std::string reason = "the first frame is no greeting";
+    log_.write(LogLevel::Warning, description() + " was let go: " + reason);
+    refuse(Status::MalformedFrame, reason);
+  }
+}
+
+void Session::onOverlongFrame(std::size_t size) {
+  if (phase_ == Phase::Refused || phase_ == Phase::Ended) return;
+  const std::string reason = "a frame of " + std::to_string(size) + " bytes is too long, at most " +
+                             std::to_string(radix::longestFrame) + " are taken";
+  log_.write(LogLevel::Warning, description() + " was let go: " + reason);
+  refuse(Status::TooLarge, reason);
+}
+
+void Session::onWritable() {
+  blocked_ = false;
+  flush();
+}
+
+void Session::onClosed() {
+  if (phase_ == Phase::Active) {
+    log_.write(LogLevel::Info, description() + " has gone after " + std::to_string(outbox_.sentRecords()) +
+                                   " records, " + std::to_string(outbox_.lostRecords()) + " lost");
+  }
+  end();
+}
+
+void Session::onHello(radix::Hello hello) {
+  if (phase_ != Phase::Greeting) return;
+  clientName_ = hello.name.substr(0, longestClientName);
+  std::optional<std::string> reason;
+  Status status = Status::VersionMismatch;
+  if (hello.oldestVersion > settings_.version || hello.version < settings_.oldestVersion) {
+    reason = "the client speaks version " + std::to_string(hello.version) + " of the protocol and needs " +
+             std::to_string(hello.oldestVersion) + ", this service speaks " + std::to_string(settings_.version) +
+             " and needs " + std::to_string(settings_.oldestVersion) + ": update " +
+             (hello.oldestVersion > settings_.version ? "the service" : "the client");
+  } else {
+    status = Status::TooMany;
+    reason = host_.refusal(*this);
+  }
+  if (reason) {
+    log_.write(LogLevel::Warning, description() + " was refused: " + *reason);
+    refuse(status, *reason);
+    return;
+  }
+  deadline_.reset();
+  phase_ = Phase::Active;
+  log_.write(LogLevel::Info, description() + " has connected");
+  say(radix::encode(radix::Hello{.version = settings_.version,
+                                 .oldestVersion = settings_.oldestVersion,
+                                 .name = settings_.serviceName,
+                                 .refusalStatus = 0,
+                                 .refusal = {}}));
+}
+
+void Session::onCommand(radix::Command command) {
+  if (phase_ != Phase::Active) return;
+  radix::Reply reply = host_.perform(*this, command);
+  reply.sequence = command.sequence;
+  if (log_.takes(LogLevel::Debug)) {
+    log_.write(LogLevel::Debug, description() + ": " + command.name + " answered with " + std::to_string(reply.status) +
+                                    (reply.message.empty() ? "" : ", " + reply.message));
+  }
+  say(radix::encode(reply));
+}
+
+void Session::onDelivery(radix::Delivery delivery) {
+  if (phase_ != Phase::Active) return;
+  delivery_ = delivery.on;
+  host_.deliveryChanged(*this, delivery.on);
+}
+
+void Session::onPing(radix::Ping ping) {
+  if (phase_ == Phase::Active && !ping.isAnswer) say(radix::encode(radix::Ping{ping.number, true}));
+}
+
+void Session::say(radix::FrameBytes frame) {
+  outbox_.addWord(std::move(frame));
+  flushSoon();
+  // A client that asks and never reads is not asked to go on.
+  if (outbox_.words() > mostWordsUnread && reading_) {
+    reading_ = false;
+    link_->setReading(false);
+  }
+}
+
+void Session::refuse(Status status, const std::string& reason) {
+  phase_ = Phase::Refused;
+  delivery_ = false;
+  host_.deliveryChanged(*this, false);
+  // The link is closed by the client once it has read this: closing first could take the words away from it.
+  deadline_ = worker_.after(leavingTime, [this] { end(); });
+  outbox_.addWord(radix::encode(radix::Hello{.version = settings_.version,
+                                             .oldestVersion = settings_.oldestVersion,
+                                             .name = settings_.serviceName,
+                                             .refusalStatus = static_cast<std::int32_t>(status),
+                                             .refusal = reason}));
+  flush();
+}
+
+void Session::end() {
+  if (phase_ == Phase::Ended) return;
+  phase_ = Phase::Ended;
+  deadline_.reset();
+  link_.reset();
+  host_.ended(*this);
+}
+
+void Session::flushSoon() {
+  if (flushPosted_ || blocked_) return;
+  flushPosted_ = true;
+  worker_.post([this, alive = alive_] {
+    if (!*alive) return;
+    flushPosted_ = false;
+    flush();
+  });
+}
+
+void Session::flush() {
+  std::array<radix::FrameBytes, framesPerFlush> frames;
+  while (!blocked_ && link_ && !outbox_.empty()) {
+    const std::size_t count = outbox_.next(frames);
+    const std::size_t taken = link_->send({frames.data(), count});
+    outbox_.sent(taken);
+    if (taken < count) blocked_ = true;
+  }
+  if (!reading_ && outbox_.words() == 0 && link_) {
+    reading_ = true;
+    link_->setReading(true);
+  }
+}
+
+std::string Session::description() const {
+  return "client " + std::to_string(number_) + (clientName_.empty() ? "" : " '" + clientName_ + "'") + " (process " +
+         std::to_string(peer_.process) + ", user " + std::to_string(peer_.user) + ")";
+}
+
+}  // namespace probeview

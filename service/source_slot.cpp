@@ -1,0 +1,154 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "service/source_slot.h"
+
+#include <algorithm>
+#include <bit>
+#include <exception>
+#include <utility>
+
+#include "radix/link.h"
+#include "service/payload_check.h"
+
+namespace probeview {
+
+namespace {
+
+// What a record's frame needs beside payload and origin.
+constexpr std::size_t frameOverhead = 256;
+constexpr std::size_t longestOrigin = 1024;
+constexpr std::size_t longestPayload = radix::longestFrame - frameOverhead - longestOrigin;
+
+}  // namespace
+
+// Runs the source's timers and catches what they throw.
+class SourceSlot::GuardedScheduler final : public Scheduler {
+ public:
+  explicit GuardedScheduler(SourceSlot& slot) : slot_(slot) {}
+  ScheduledTaskHandle after(std::chrono::nanoseconds delay, Task task) override {
+    return slot_.worker_.after(delay, guard(std::move(task)));
+  }
+  ScheduledTaskHandle every(std::chrono::nanoseconds interval, Task task) override {
+    return slot_.worker_.every(interval, guard(std::move(task)));
+  }
+
+ private:
+  Task guard(Task task) {
+    return [&slot = slot_, inner = std::move(task)] { slot.guarded("in a timer", inner); };
+  }
+  SourceSlot& slot_;
+};
+
+class SourceSlot::SourceLog final : public LineSink {
+ public:
+  explicit SourceLog(SourceSlot& slot) : slot_(slot) {}
+  void line(std::string_view text) override {
+    slot_.log_.write(LogLevel::Warning, slot_.origin_ + ": " + std::string(text));
+  }
+
+ private:
+  SourceSlot& slot_;
+};
+
+SourceSlot::SourceSlot(std::unique_ptr<MetricSource> source, Worker& worker, ServiceLog& log, Taker taker)
+    : worker_(worker),
+      log_(log),
+      taker_(std::move(taker)),
+      scheduler_(std::make_unique<GuardedScheduler>(*this)),
+      sourceLog_(std::make_unique<SourceLog>(*this)),
+      source_(std::move(source)),
+      started_(worker.clock().monotonicTime()),
+      alive_(std::make_shared<bool>(true)) {
+  guarded("naming itself", [this] {
+    origin_ = std::string(source_->origin()).substr(0, longestOrigin);
+    metrics_ = source_->metrics();
+  });
+}
+
+SourceSlot::~SourceSlot() {
+  *alive_ = false;
+  guarded("stopping", [this] { source_->stop(); });
+}
+
+void SourceSlot::start(const std::optional<MetricPlan>& plan, bool listening) {
+  guarded("starting", [&] {
+    source_->start({*scheduler_, worker_.clock(), *sourceLog_}, *this);
+    source_->setPlan(plan);
+    source_->setListening(listening);
+  });
+}
+
+void SourceSlot::setPlan(const std::optional<MetricPlan>& plan) {
+  guarded("taking a plan", [&] { source_->setPlan(plan); });
+}
+
+void SourceSlot::setListening(bool listening) {
+  guarded("being told who listens", [&] { source_->setListening(listening); });
+}
+
+bool SourceSlot::canFill(std::int64_t metricId) const {
+  return failure_.empty() && std::find(metrics_.begin(), metrics_.end(), metricId) != metrics_.end();
+}
+
+bool SourceSlot::query(std::int64_t metricId) {
+  bool taken = false;
+  guarded("answering a query", [&] { taken = source_->query(metricId); });
+  return taken;
+}
+
+double SourceSlot::recordsPerSecond() const { return rate_.perSecond(worker_.clock().monotonicTime(), started_); }
+
+void SourceSlot::emit(MetricRecord record) {
+  if (emitting_) {
+    withhold(record, "it was emitted while another record was on its way");
+    return;
+  }
+  if (record.payload.size() > longestPayload) {
+    withhold(record, "its payload has " + std::to_string(record.payload.size()) + " bytes, more than " +
+                         std::to_string(longestPayload));
+    return;
+  }
+  if (!payloadDecodes(record.metricId, record.payload)) {
+    withhold(record, "its payload of " + std::to_string(record.payload.size()) + " bytes does not decode");
+    return;
+  }
+  if (record.origin.empty()) record.origin = origin_;
+  if (record.origin.size() > longestOrigin) record.origin.resize(longestOrigin);
+  ++records_;
+  rate_.add(worker_.clock().monotonicTime());
+  lastRecord_ = record.time;
+  emitting_ = true;
+  taker_(std::move(record));
+  emitting_ = false;
+}
+
+void SourceSlot::withhold(const MetricRecord& record, const std::string& reason) {
+  ++withheld_;
+  // A source that does nothing else must not fill the log: the first, the second, the fourth … of them is told.
+  if (!std::has_single_bit(withheld_)) return;
+  log_.write(LogLevel::Warning, origin_ + ": a record of " + metricText(record.metricId) + " was withheld, " + reason +
+                                    " (" + std::to_string(withheld_) + " withheld so far)");
+}
+
+void SourceSlot::guarded(const char* occasion, const std::function<void()>& call) {
+  if (!source_ || !failure_.empty()) return;
+  try {
+    call();
+  } catch (const std::exception& error) {
+    fail(occasion, error.what());
+  } catch (...) {
+    // Whatever a plug-in throws, the service goes on for the others.
+    fail(occasion, "something that is no exception");
+  }
+}
+
+void SourceSlot::fail(const char* occasion, const std::string& reason) {
+  emitting_ = false;
+  failure_ = std::string("failed ") + occasion + ": " + reason;
+  log_.write(LogLevel::Error, (origin_.empty() ? "a source" : origin_) + " " + failure_ + "; it runs no more");
+  // Not from inside its own code.
+  worker_.post([this, alive = alive_] {
+    if (*alive) source_.reset();
+  });
+}
+
+}  // namespace probeview

@@ -1,0 +1,60 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "service/status_report.h"
+
+#include <chrono>
+
+#include "service/service.h"
+
+namespace probeview {
+
+namespace {
+
+Value count(std::uint64_t number) { return number; }
+Value milliseconds(std::chrono::nanoseconds time) {
+  return std::int64_t{std::chrono::duration_cast<std::chrono::milliseconds>(time).count()};
+}
+
+Dictionary describe(const SourceSlot& source) {
+  Dictionary entry{{"origin", Value::text(source.origin())},
+                   {"metrics", count(source.metrics().size())},
+                   {"records", count(source.records())},
+                   {"records_per_second", source.recordsPerSecond()},
+                   {"withheld", count(source.withheld())}};
+  if (source.lastRecord()) entry.append("last_record_ms", milliseconds(*source.lastRecord()));
+  if (!source.failure().empty()) entry.append("failure", Value::text(source.failure()));
+  return entry;
+}
+
+Dictionary describe(const Session& client) {
+  return {{"number", count(client.number())},
+          {"name", Value::text(client.clientName())},
+          {"process", std::int64_t{client.peer().process}},
+          {"user", std::int64_t{client.peer().user}},
+          {"connected_since_ms", milliseconds(client.connectedSince())},
+          {"listening", client.isListening()},
+          {"configured", client.configuration().has_value()},
+          {"records", count(client.outbox().sentRecords())},
+          {"records_per_second", client.recordsPerSecond()},
+          {"queued", count(client.outbox().records())},
+          {"lost", count(client.outbox().lostRecords())}};
+}
+
+}  // namespace
+
+Dictionary StatusReport::of(const Service& service) {
+  List sources;
+  for (const auto& source : service.sources_) sources.append(describe(*source));
+  List clients;
+  for (const auto& session : service.sessions_) {
+    if (session->isActive()) clients.append(describe(*session));
+  }
+  Dictionary report{{"service", Value::text(service.settings_.name)},
+                    {"uptime_ms", milliseconds(service.worker_.clock().monotonicTime() - service.started_)},
+                    {"base_configuration", service.baseConfiguration_.has_value()}};
+  if (service.plan_) report.append("configured_metrics", count(service.plan_->metrics.size()));
+  report.append("sources", std::move(sources));
+  report.append("clients", std::move(clients));
+  return report;
+}
+
+}  // namespace probeview

@@ -1,0 +1,177 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "radix/frames.h"
+
+#include <gtest/gtest.h>
+
+#include <cstdint>
+#include <string>
+#include <vector>
+
+namespace radix {
+namespace {
+
+using probeview::Dictionary;
+using probeview::List;
+using probeview::Value;
+using Bytes = std::vector<std::uint8_t>;
+
+// Writes down what it is told.
+class Recorder final : public FrameHandler {
+ public:
+  void onHello(Hello hello) override {
+    said = "hello " + std::to_string(hello.version) + " " + std::to_string(hello.oldestVersion) + " " + hello.name +
+           " " + std::to_string(hello.refusalStatus) + " " + hello.refusal;
+  }
+  void onCommand(Command command) override {
+    said = "command " + std::to_string(command.sequence) + " " + command.name;
+    bytes = command.arguments;
+  }
+  void onReply(Reply reply) override {
+    said = "reply " + std::to_string(reply.sequence) + " " + std::to_string(reply.status) + " " + reply.message;
+    bytes = reply.content;
+  }
+  void onDelivery(Delivery delivery) override { said = delivery.on ? "delivery on" : "delivery off"; }
+  void onEvent(Event one) override {
+    said = "event";
+    event = std::move(one);
+  }
+  void onDropped(Dropped dropped) override { said = "dropped " + std::to_string(dropped.count); }
+  void onPing(Ping ping) override { said = "ping " + std::to_string(ping.number) + (ping.isAnswer ? " answer" : ""); }
+
+  std::string said;
+  Bytes bytes;
+  Event event;
+};
+
+template <typename Frame>
+Recorder roundTrip(const Frame& frame) {
+  Recorder recorder;
+  EXPECT_TRUE(decodeFrame(*encode(frame), recorder));
+  return recorder;
+}
+
+TEST(Frames, EachKindComesBackAsItWasSent) {
+  EXPECT_EQ(roundTrip(Hello{.version = 3, .oldestVersion = 2, .name = "probeview"}).said, "hello 3 2 probeview 0 ");
+  EXPECT_EQ(
+      roundTrip(Hello{.version = 1, .oldestVersion = 1, .name = "radixd", .refusalStatus = 9, .refusal = "no"}).said,
+      "hello 1 1 radixd 9 no");
+  const Recorder command =
+      roundTrip(Command{.sequence = 4294967295U, .name = "kCommandQueryMetric", .arguments = {1, 2}});
+  EXPECT_EQ(command.said, "command 4294967295 kCommandQueryMetric");
+  EXPECT_EQ(command.bytes, (Bytes{1, 2}));
+  const Recorder reply = roundTrip(Reply{.sequence = 7, .status = -3, .message = "why", .content = {9}});
+  EXPECT_EQ(reply.said, "reply 7 -3 why");
+  EXPECT_EQ(reply.bytes, (Bytes{9}));
+  EXPECT_EQ(roundTrip(Delivery{true}).said, "delivery on");
+  EXPECT_EQ(roundTrip(Delivery{false}).said, "delivery off");
+  EXPECT_EQ(roundTrip(Dropped{18446744073709551615U}).said, "dropped 18446744073709551615");
+  EXPECT_EQ(roundTrip(Ping{5, false}).said, "ping 5");
+  EXPECT_EQ(roundTrip(Ping{5, true}).said, "ping 5 answer");
+}
+
+TEST(Frames, AnEventKeepsEveryNumberIncludingNegativeOnes) {
+  const Event sent{.kind = EventKind::Trigger,
+                   .metricId = -1,
+                   .payload = {0, 255},
+                   .profileId = -2,
+                   .time = 1709640000123,
+                   .origin = "scenario:city",
+                   .group = 4,
+                   .triggerId = 0x7F0013,
+                   .triggerRef = 9999,
+                   .triggerType = -7};
+  const Event got = roundTrip(sent).event;
+  EXPECT_EQ(got.kind, EventKind::Trigger);
+  EXPECT_EQ(got.metricId, -1);
+  EXPECT_EQ(got.payload, sent.payload);
+  EXPECT_EQ(got.profileId, -2);
+  EXPECT_EQ(got.time, sent.time);
+  EXPECT_EQ(got.origin, sent.origin);
+  EXPECT_EQ(got.group, 4);
+  EXPECT_EQ(got.triggerId, 0x7F0013);
+  EXPECT_EQ(got.triggerRef, 9999);
+  EXPECT_EQ(got.triggerType, -7);
+}
+
+TEST(Frames, AnEmptyPayloadIsAPayload) { EXPECT_TRUE(roundTrip(Event{}).event.payload.empty()); }
+
+TEST(Frames, UnknownFramesAndFieldsAreIgnored) {
+  Recorder recorder;
+  // Field 15, a frame of a later version with the content "x".
+  EXPECT_TRUE(decodeFrame(Bytes{0x7A, 0x01, 'x'}, recorder));
+  EXPECT_EQ(recorder.said, "");
+  // A ping with a field 9 that nobody knows: 3A (ping) 04, 08 05 (number 5), 48 01.
+  EXPECT_TRUE(decodeFrame(Bytes{0x3A, 0x04, 0x08, 0x05, 0x48, 0x01}, recorder));
+  EXPECT_EQ(recorder.said, "ping 5");
+  // An event of a kind that nobody knows: 2A (event) 02, 08 07.
+  recorder.said.clear();
+  EXPECT_TRUE(decodeFrame(Bytes{0x2A, 0x02, 0x08, 0x07}, recorder));
+  EXPECT_EQ(recorder.said, "");
+  EXPECT_TRUE(decodeFrame(Bytes{}, recorder));
+  EXPECT_EQ(recorder.said, "");
+}
+
+TEST(Frames, BytesThatAreNoFrameAreRefusedAndNothingIsHandedOver) {
+  for (const Bytes& bytes : {
+           Bytes{0x3A, 0x7F, 0x08},        // a ping longer than the frame
+           Bytes{0x0A},                    // a key without content
+           Bytes{0x7B},                    // a group, which nobody sends
+           Bytes{0x3A, 0x02, 0x08, 0x80},  // a number that does not end
+           Bytes(64, 0xFF),
+       }) {
+    Recorder recorder;
+    EXPECT_FALSE(decodeFrame(bytes, recorder));
+    EXPECT_EQ(recorder.said, "");
+  }
+}
+
+TEST(Frames, ADictionaryKeepsItsOrderAndTheTypeOfEachValue) {
+  const Bytes bytes{1, 2, 255};
+  const Dictionary sent{{"z", std::int64_t{-9999}},
+                        {"a", std::int32_t{-5}},
+                        {"unsigned", std::uint32_t{4294967295U}},
+                        {"long", std::uint64_t{18446744073709551615U}},
+                        {"truth", true},
+                        {"float", 1.4F},
+                        {"double", -0.1},
+                        {"text", Value::text("grüße")},
+                        {"bytes", Value::bytes(bytes)},
+                        {"none", Value::bytes({})},
+                        {"list", List{std::int64_t{1}, Value::text("x"), List{}}},
+                        {"inner", Dictionary{{"deep", Dictionary{{"deeper", false}}}}}};
+  const auto got = decodeDictionary(encodeDictionary(sent));
+  ASSERT_TRUE(got);
+  EXPECT_EQ(*got, sent);
+  ASSERT_EQ(got->size(), sent.size());
+  for (std::size_t index = 0; index < sent.size(); ++index) {
+    EXPECT_EQ((*got)[index].key, sent[index].key);
+    EXPECT_EQ((*got)[index].value.kind(), sent[index].value.kind());
+  }
+  EXPECT_EQ(decodeDictionary(encodeDictionary(Dictionary{})), Dictionary{});
+}
+
+TEST(Frames, AValueOfAnUnknownKindIsLeftOut) {
+  // One item without kind, one of kind 99: 0A 03 0A 01 'a'; 0A 05 0A 01 'b' 10 63; then 0A 07 0A 01 'c' 10 03 18 02.
+  const auto got = decodeDictionary(
+      Bytes{0x0A, 3, 0x0A, 1, 'a', 0x0A, 5, 0x0A, 1, 'b', 0x10, 99, 0x0A, 7, 0x0A, 1, 'c', 0x10, 3, 0x18, 2});
+  EXPECT_EQ(got, (Dictionary{{"c", std::int64_t{2}}}));
+}
+
+Dictionary nested(int levels) {
+  Dictionary dictionary{{"bottom", true}};
+  for (int level = 0; level < levels; ++level) dictionary = Dictionary{{"down", std::move(dictionary)}};
+  return dictionary;
+}
+
+TEST(Frames, ADictionaryMayBeNestedSixteenLevelsDeepAndNoMore) {
+  EXPECT_TRUE(decodeDictionary(encodeDictionary(nested(16))));
+  EXPECT_FALSE(decodeDictionary(encodeDictionary(nested(17))));
+}
+
+TEST(Frames, BytesThatAreNoDictionaryAreRefused) {
+  EXPECT_FALSE(decodeDictionary(Bytes{0x0A, 0x7F}));
+  EXPECT_FALSE(decodeDictionary(Bytes{0x0A, 6, 0x10, 10, 0x22, 2, 0x0A, 0x7F}));  // a list whose content is cut off
+}
+
+}  // namespace
+}  // namespace radix
