@@ -87,7 +87,8 @@ const std::uint8_t* TableWalker::decodeFields(PBCodable& message, const MessageD
     position = wire::readVarint(position, limit, key);
     if (position == nullptr) return nullptr;
     const FieldDescriptor* row = expected;
-    if (key != row->expectedKey) {
+    // A payload may well hold the key that stands for a row which is never read.
+    if (key != row->expectedKey || key == neverRead) {
       if ((key & 7) == static_cast<unsigned>(wire::WireType::EndGroup)) return position;
       // Only 16 bits of a field number count.
       const auto number = static_cast<std::uint16_t>(key >> 3);

@@ -64,9 +64,13 @@ union FieldMember {
   PBRepeatedInt32 PBCodable::*signed32List;
 };
 
+// Expected of a row that is not to be decoded. It is a key like any other, so whoever meets it in a payload must not
+// take it for such a row's.
+inline constexpr std::uint32_t neverRead = 0xFFFFFFFF;
+
 struct FieldDescriptor {
   std::uint32_t key = 0;          // as it is written: number and wire type
-  std::uint32_t expectedKey = 0;  // the same; a key that is never read where decoding drops the field
+  std::uint32_t expectedKey = 0;  // the same; neverRead where decoding drops the field
   std::uint16_t number = 0;
   FieldKind kind = FieldKind::UInt64;
   FieldMember member;

@@ -52,9 +52,6 @@ consteval std::size_t countFields() {
   (std::make_index_sequence<fieldNumberLimit>{});
 }
 
-// No key of a field with a number of 16 bits.
-inline constexpr std::uint32_t neverRead = 0xFFFFFFFF;
-
 // All rows of the class, ordered by number whatever their order in the class, and the row that ends them.
 template <typename Message>
 consteval auto collectFields() {
