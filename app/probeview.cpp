@@ -6,7 +6,8 @@
 
 namespace probeview {
 
-int runProbeview(int argc, char** argv, std::ostream& output, std::ostream& errors) {
+int runProbeview(int argc, const char* const* argv, const MakeWindow& makeWindow, std::ostream& output,
+                 std::ostream& errors) {
   CLI::App program(
       "Shows the live state of the phone's cellular radio: LTE, UMTS and GSM cells, measurements, connection states,\n"
       "mobility contexts, bearers and SIM files, as the baseband service radixd reports them.",
@@ -39,9 +40,7 @@ int runProbeview(int argc, char** argv, std::ostream& output, std::ostream& erro
   } catch (const CLI::ParseError& error) {
     return program.exit(error, output, errors) == 0 ? 0 : 2;
   }
-  // What is left is the program's name: the window has options of its own, which are not offered here.
-  int windowArguments = 1;
-  return runViewer(options, windowArguments, argv, errors);
+  return runViewer(options, makeWindow, errors);
 }
 
 }  // namespace probeview

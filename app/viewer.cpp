@@ -11,7 +11,6 @@
 #include <ostream>
 
 #include "app/application.h"
-#include "app/window_front.h"
 #include "platform/console_log.h"
 #include "platform/system_log.h"
 #include "ui/open_page.h"
@@ -45,10 +44,12 @@ bool chooseLogs(const ViewerOptions& options, FrontKind front, std::ostream& err
   return true;
 }
 
-std::unique_ptr<Front> makeFront(FrontKind kind, int& argc, char** argv, std::string& error) {
+std::unique_ptr<Front> makeFront(FrontKind kind, const MakeWindow& makeWindow, std::string& error) {
   switch (kind) {
     case FrontKind::Window:
-      return makeWindowFront(argc, argv, error);
+      if (makeWindow) return makeWindow();
+      error = "this build has no window; --terminal and --print show the pages without one";
+      return nullptr;
     case FrontKind::Terminal:
       return terminal::TerminalFront::make(error);
     case FrontKind::Print:
@@ -59,13 +60,13 @@ std::unique_ptr<Front> makeFront(FrontKind kind, int& argc, char** argv, std::st
 
 }  // namespace
 
-int runViewer(const ViewerOptions& options, int& argc, char** argv, std::ostream& errors) {
+int runViewer(const ViewerOptions& options, const MakeWindow& makeWindow, std::ostream& errors) {
   // A reader that goes away is an end, not an accident.
   std::signal(SIGPIPE, SIG_IGN);
-  const auto kind = chooseFront(frontCircumstances(options.front, hasWindowFront));
+  const auto kind = chooseFront(frontCircumstances(options.front, makeWindow != nullptr));
   if (!chooseLogs(options, kind, errors)) return 1;
   std::string error;
-  const auto front = makeFront(kind, argc, argv, error);
+  const auto front = makeFront(kind, makeWindow, error);
   if (!front) {
     errors << error << "\n";
     return 1;

@@ -3,13 +3,20 @@
 // The viewer as a whole: chooses the logs and the front, and runs the application. Main thread, once per process.
 #pragma once
 
+#include <functional>
 #include <iosfwd>
+#include <memory>
 #include <optional>
 #include <string>
 
 #include "app/front_choice.h"
+#include "ui/front.h"
 
 namespace probeview {
+
+// Makes the window; empty in a build that has none. Handed in, so that this room does not know the window's toolkit and
+// programs without a window do not carry it.
+using MakeWindow = std::function<std::unique_ptr<Front>()>;
 
 struct ViewerOptions {
   std::optional<FrontKind> front;      // absent: whatever suits the circumstances
@@ -19,11 +26,11 @@ struct ViewerOptions {
   bool pagesOnly = false;
 };
 
-// The exit status: 0 when all went well; 1, with the reason on the stream, when the viewer could not be shown. A window
-// takes its own options out of the arguments, which must live as long as the process.
-int runViewer(const ViewerOptions& options, int& argc, char** argv, std::ostream& errors);
+// The exit status: 0 when all went well; 1, with the reason on the stream, when the viewer could not be shown.
+int runViewer(const ViewerOptions& options, const MakeWindow& makeWindow, std::ostream& errors);
 
 // The viewer's command line: understands it and runs the viewer; 2 when it is not understood.
-int runProbeview(int argc, char** argv, std::ostream& output, std::ostream& errors);
+int runProbeview(int argc, const char* const* argv, const MakeWindow& makeWindow, std::ostream& output,
+                 std::ostream& errors);
 
 }  // namespace probeview

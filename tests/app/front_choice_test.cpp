@@ -35,12 +35,11 @@ struct Answer {
 
 Answer run(std::vector<std::string> arguments) {
   arguments.insert(arguments.begin(), "probeview");
-  std::vector<char*> pointers;
-  for (auto& argument : arguments) pointers.push_back(argument.data());
-  pointers.push_back(nullptr);
+  std::vector<const char*> pointers;
+  for (const auto& argument : arguments) pointers.push_back(argument.c_str());
   std::ostringstream output;
   std::ostringstream errors;
-  const int status = runProbeview(static_cast<int>(arguments.size()), pointers.data(), output, errors);
+  const int status = runProbeview(static_cast<int>(arguments.size()), pointers.data(), nullptr, output, errors);
   return {status, output.str(), errors.str()};
 }
 
@@ -63,6 +62,12 @@ TEST(CommandLine, WhatIsNotUnderstoodIsAUsageError) {
   EXPECT_EQ(run({"--window", "--print"}).status, 2);
   EXPECT_EQ(run({"--log"}).status, 2);
   EXPECT_NE(run({"--windw"}).errors.find("--windw"), std::string::npos);
+}
+
+TEST(CommandLine, ABuildWithoutAWindowSaysSo) {
+  const auto answer = run({"--window"});
+  EXPECT_EQ(answer.status, 1);
+  EXPECT_EQ(answer.errors, "this build has no window; --terminal and --print show the pages without one\n");
 }
 
 TEST(CommandLine, ALogFileThatCannotBeWrittenIsNamed) {

@@ -36,6 +36,15 @@ std::size_t fitting(std::wstring_view text, int width) {
   return std::max<std::size_t>(count, 1);
 }
 
+// Where to break a line of which so many characters fit: at the last blank (one just past the end is as good), else
+// after the last underscore of a field's name, else where the room ends.
+std::size_t breakBefore(std::wstring_view line, std::size_t fits) {
+  const auto blank = line.substr(0, fits + 1).rfind(L' ');
+  if (blank != std::wstring_view::npos && blank > 0) return blank;
+  const auto underscore = line.substr(0, fits).rfind(L'_');
+  return underscore != std::wstring_view::npos && underscore > 0 ? underscore + 1 : fits;
+}
+
 }  // namespace
 
 std::wstring characters(std::string_view text) {
@@ -63,9 +72,7 @@ std::vector<std::wstring> wrapped(std::wstring_view text, int width) {
     auto line = text.substr(0, lineEnd);
     while (columns(line) > width) {
       std::size_t count = fitting(line, width);
-      // A blank just past the end is as good a place as one before it.
-      const auto blank = line.substr(0, count + 1).rfind(L' ');
-      if (blank != std::wstring_view::npos && blank > 0) count = blank;
+      count = breakBefore(line, count);
       lines.emplace_back(line.substr(0, count));
       line.remove_prefix(count);
       if (!line.empty() && line.front() == L' ') line.remove_prefix(1);
@@ -96,13 +103,16 @@ ListLayout::Extent ListLayout::extentOf(RowPlace place) const {
 ListLayout layOut(const PageSnapshot& snapshot, int width) {
   const int room = std::max(width - 4, 8);
   int labelWidth = 0;
+  int detailWidth = 0;
   for (const auto& section : snapshot.sections) {
     for (const auto& row : section.rows) {
-      if (row.text && row.detail) labelWidth = std::max(labelWidth, columns(characters(*row.text)));
+      if (!row.text || !row.detail) continue;
+      labelWidth = std::max(labelWidth, columns(characters(*row.text)));
+      detailWidth = std::max(detailWidth, columns(characters(*row.detail)));
     }
   }
-  // A value gets at least half of the line.
-  labelWidth = std::min(labelWidth, std::max(room / 2 - gap, 1));
+  // A long label leaves the value half of the line, or less if that is all that values need.
+  labelWidth = std::min(labelWidth, std::max({room / 2 - gap, room - gap - detailWidth, 1}));
 
   ListLayout layout;
   layout.detailColumn = labelWidth > 0 ? labelWidth + gap : 0;

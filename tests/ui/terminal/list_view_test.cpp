@@ -27,6 +27,10 @@ TEST_F(TextLayout, TextIsWrappedAtBlanksAndCutWhereThereAreNone) {
   EXPECT_EQ(wrapped(L"exactly", 7), (Wide{L"exactly"}));
 }
 
+TEST_F(TextLayout, AFieldsNameIsWrappedAfterItsUnderscores) {
+  EXPECT_EQ(wrapped(L"mo_data_ac_barring_time", 12), (Wide{L"mo_data_ac_", L"barring_time"}));
+}
+
 TEST_F(TextLayout, WideCharactersTakeTwoColumns) {
   EXPECT_EQ(columns(L"信号"), 4);
   EXPECT_EQ(wrapped(L"信号强", 4), (Wide{L"信号", L"强"}));
@@ -135,6 +139,15 @@ TEST_F(Lists, SectionsAreHeadedAndSetApartByABlankLine) {
   EXPECT_EQ(lines[1].detail, L"a!");
   EXPECT_EQ(lines[2].kind, LaidOutLine::Kind::Blank);
   EXPECT_EQ(lines[3].text, L"B");
+}
+
+TEST_F(Lists, LongLabelsTakeTheRoomThatShortValuesLeave) {
+  page.content.sections = {{std::nullopt, {{"SecondClickView", std::string(30, 'x'), "12"}}}};
+  show(40, 20);
+  EXPECT_EQ(view->layout().lines.size(), 1u);
+  page.content.sections[0].rows[0].detail = std::string(30, 'y');
+  page.reload();
+  EXPECT_EQ(view->layout().lines.size(), 2u);
 }
 
 TEST_F(Lists, ALongValueTakesSeveralLinesOfOneRow) {

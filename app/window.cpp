@@ -1,0 +1,16 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "ui/qt/window.h"
+
+#include "app/window.h"
+
+namespace probeview {
+
+MakeWindow windowMaker(char** argv) {
+  return [argv] {
+    // The toolkit keeps a reference to the count. It sees the program's name alone: its own options are not offered.
+    static int nameAlone = 1;
+    return qt::makeWindowFront(nameAlone, argv);
+  };
+}
+
+}  // namespace probeview

@@ -1,0 +1,56 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "tools/pages_command.h"
+
+#include <algorithm>
+#include <memory>
+#include <ostream>
+#include <vector>
+
+#include "app/viewer.h"
+#include "ui/varnet_view_items.h"
+
+namespace probeview {
+
+namespace {
+
+struct Options {
+  std::vector<std::string> key;
+  std::string logFile;
+};
+
+ExitStatus showPages(const Options& options, Tool& tool) {
+  ViewerOptions viewer;
+  viewer.pagesOnly = true;
+  if (!options.logFile.empty()) viewer.logFile = options.logFile;
+  if (!options.key.empty()) {
+    // The key is one text of several words; it may come quoted or not.
+    std::string key = options.key.front();
+    for (std::size_t word = 1; word < options.key.size(); ++word) key += " " + options.key[word];
+    const auto keys = navigablePageKeys();
+    if (std::find(keys.begin(), keys.end(), key) == keys.end()) {
+      tool.errors << "there is no page \"" << key << "\"; there are:\n";
+      for (const auto& known : keys) tool.errors << "  " << known << "\n";
+      return ExitStatus::UsageError;
+    }
+    viewer.pageKey = key;
+  }
+  return runViewer(viewer, nullptr, tool.errors) == 0 ? ExitStatus::Success : ExitStatus::Failure;
+}
+
+}  // namespace
+
+void addPagesCommand(CLI::App& program, Tool& tool) {
+  CLI::App* command = program.add_subcommand("pages", "Show the viewer's pages as text");
+  auto options = std::make_shared<Options>();
+  command->add_option("KEY", options->key, "The page to show, as LTE Tx Power; without it, all");
+  command
+      ->add_option("--log", options->logFile, "Write the console log of every metric to this file; else it is dropped")
+      ->type_name("FILE");
+  command->footer(
+      "In a terminal the pages are live: arrows move, Return opens, Esc goes back, q ends. Elsewhere each page is\n"
+      "printed once, when every metric has come or after 15 s.\n\n"
+      "Examples:\n  probectl pages\n  probectl pages LTE Serving Cell Info\n  probectl pages 'UMTS RRC State' | cat");
+  command->callback([options, &tool] { tool.run = [options, &tool] { return showPages(*options, tool); }; });
+}
+
+}  // namespace probeview

@@ -1,0 +1,11 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include "tools/subcommand.h"
+
+namespace probeview {
+
+// probectl pages: the viewer's pages as text, live in a terminal.
+void addPagesCommand(CLI::App& program, Tool& tool);
+
+}  // namespace probeview
