@@ -32,7 +32,7 @@ class Service final : Session::Host {
     std::uint32_t oldestVersion = radix::oldestProtocolVersion;
     // Clients that are served at once; those past it are told so.
     std::size_t mostClients = 128;
-    Outbox::Limits outbox;
+    Outbox::Limits outbox{};
   };
 
   Service(Worker& worker, ServiceLog log, Settings settings);

@@ -50,7 +50,7 @@ class Session final : radix::LinkListener, radix::FrameHandler {
     std::string serviceName;
     std::uint32_t version = radix::protocolVersion;
     std::uint32_t oldestVersion = radix::oldestProtocolVersion;
-    Outbox::Limits outbox;
+    Outbox::Limits outbox{};
   };
 
   Session(std::uint64_t number, Worker& worker, ServiceLog& log, Host& host, const Settings& settings,

@@ -1,0 +1,534 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// What a client may rely on, proved twice: in process on a manual loop, and over a real socket between threads.
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <memory>
+#include <string>
+#include <vector>
+
+#include "messages/metric_identifiers.h"
+#include "radix/client.h"
+#include "radix/object.h"
+#include "radix/service_commands.h"
+#include "radix/status.h"
+#include "tests/service/harness/test_service.h"
+
+namespace probeview {
+namespace {
+
+using radix::Status;
+using radix::client::ManagerHandle;
+using radix::client::ObjectHandle;
+using radix::client::Result;
+using std::chrono::milliseconds;
+using Bytes = std::vector<std::uint8_t>;
+
+// An RRC state: timestamp 1, the state given.
+Bytes rrcState(std::uint8_t state) { return {0x08, 0x01, 0x10, state}; }
+
+using Factory = std::unique_ptr<TestService> (*)(Service::Settings);
+
+class Contract : public ::testing::TestWithParam<Factory> {
+ protected:
+  // A client that keeps the events it gets.
+  struct Client {
+    ManagerHandle manager;
+    std::vector<Dictionary> events;
+
+    std::vector<std::int64_t> metrics() const {
+      std::vector<std::int64_t> all;
+      for (const Dictionary& event : events) all.push_back(event.find(radix::kKeyMetricID)->int64().value());
+      return all;
+    }
+    std::vector<Bytes> payloads() const {
+      std::vector<Bytes> all;
+      for (const Dictionary& event : events) {
+        const auto bytes = event.find(radix::kKeyPayload)->bytes().value();
+        all.emplace_back(bytes.begin(), bytes.end());
+      }
+      return all;
+    }
+  };
+
+  void SetUp() override { make({}); }
+
+  void make(Service::Settings settings) {
+    clients_.clear();
+    world_ = GetParam()(settings);
+    world_->script().metrics.clear();
+    for (const MetricIdentifier& metric : metricIdentifiers()) world_->script().metrics.push_back(metric.id);
+    std::sort(world_->script().metrics.begin(), world_->script().metrics.end());
+    // The source has named its metrics when it was added; it is added anew with those above.
+    world_->kill();
+    world_->restart();
+  }
+
+  void TearDown() override {
+    clients_.clear();
+    world_.reset();
+  }
+
+  Client& connect(const std::string& name = "test") {
+    clients_.push_back(std::make_unique<Client>());
+    Client& client = *clients_.back();
+    client.manager = world_->manager(name);
+    const auto take = [&client](const ObjectHandle& event, radix::client::Group) {
+      client.events.push_back(radix::client::nativeDictionary(*event));
+    };
+    radix::client::RegisterEventHandler(client.manager, radix::kEventMetric, take);
+    return client;
+  }
+
+  Result perform(const Client& client, std::string_view command, const Dictionary& arguments = {}) {
+    ObjectHandle reply;
+    Result result = radix::client::PerformCommand(client.manager, command, arguments, reply);
+    if (reply) reply_ = radix::client::nativeDictionary(*reply);
+    return result;
+  }
+
+  Result push(const Client& client, std::string_view text, std::string_view command = radix::kCommandAddConfiguration) {
+    return perform(
+        client, command,
+        {{radix::kKeyAppID, std::int64_t{2}},
+         {radix::kKeyPayload, Value::bytes({reinterpret_cast<const std::uint8_t*>(text.data()), text.size()})},
+         {radix::kKeyPayloadType, std::int64_t{0}}});
+  }
+
+  Result query(const Client& client, std::int64_t trigger, std::int64_t metric) {
+    return perform(client, radix::kCommandQueryMetric,
+                   {{radix::kKeyAppID, std::int64_t{2}},
+                    {radix::kKeyPayloadType, std::int64_t{0}},
+                    {radix::kKeyTriggerRef, std::int64_t{9999}},
+                    {radix::kKeyTriggerType, std::int64_t{0}},
+                    {radix::kKeyTriggerID, trigger},
+                    {radix::kKeyProfileID, std::int64_t{0}},
+                    {radix::kKeyMetricID, metric}});
+  }
+
+  void listen(const Client& client) {
+    radix::client::EventsOff(client.manager);
+    radix::client::EventsOn(client.manager);
+    world_->settle();
+  }
+
+  std::optional<MetricPlan> plan() {
+    std::optional<MetricPlan> seen;
+    world_->onService([&] { seen = world_->script().plan; });
+    return seen;
+  }
+
+  bool sourceIsHeard() {
+    bool seen = false;
+    world_->onService([&] { seen = world_->script().listening; });
+    return seen;
+  }
+
+  std::size_t logged(std::string_view text) {
+    std::size_t count = 0;
+    world_->onService([&] { count = world_->log().count(text); });
+    return count;
+  }
+
+  bool until(const std::function<bool()>& condition) { return world_->until(condition); }
+
+  std::unique_ptr<TestService> world_;
+  std::vector<std::unique_ptr<Client>> clients_;
+  Dictionary reply_;
+};
+
+INSTANTIATE_TEST_SUITE_P(, Contract, ::testing::Values(&makeInProcessService, &makeSocketService),
+                         [](const auto& information) { return information.index == 0 ? "InProcess" : "Socket"; });
+
+TEST_P(Contract, ARecordArrivesAsAnEventWithItsKeysInOrder) {
+  Client& client = connect();
+  listen(client);
+  world_->emit(K_LTE_RRC_STATE, rrcState(3), milliseconds(1709640000123));
+  ASSERT_TRUE(until([&] { return client.events.size() == 1; }));
+  const Dictionary expected{{"kKeyMetricID", K_LTE_RRC_STATE},
+                            {"kKeyPayload", Value::bytes(rrcState(3))},
+                            {"kKeyProfileID", std::int64_t{0}},
+                            {"kKeyTime", std::int64_t{1709640000123}},
+                            {"kKeyOrigin", Value::text("scripted")}};
+  EXPECT_EQ(client.events[0], expected);
+  for (std::size_t index = 0; index < expected.size(); ++index) {
+    EXPECT_EQ(client.events[0][index].key, expected[index].key);
+  }
+}
+
+TEST_P(Contract, EventsArriveInTheirOrderAndEachOnce) {
+  Client& client = connect();
+  listen(client);
+  world_->onService([&] {
+    for (std::uint8_t state = 0; state < 7; ++state) world_->script().emit(K_LTE_RRC_STATE, rrcState(state));
+  });
+  ASSERT_TRUE(until([&] { return client.events.size() >= 7; }));
+  world_->settle();
+  ASSERT_EQ(client.events.size(), 7U);
+  for (std::uint8_t state = 0; state < 7; ++state) EXPECT_EQ(client.payloads()[state], rrcState(state));
+}
+
+TEST_P(Contract, NothingIsDeliveredBeforeEventsOnAndAfterEventsOff) {
+  Client& client = connect();
+  world_->settle();
+  world_->emit(K_LTE_TX_POWER, {});
+  world_->settle();
+  EXPECT_TRUE(client.events.empty());
+  listen(client);
+  EXPECT_EQ(client.metrics(), std::vector<std::int64_t>{K_LTE_TX_POWER});
+  radix::client::EventsOff(client.manager);
+  world_->settle();
+  world_->emit(K_LTE_TX_POWER, {});
+  world_->settle();
+  EXPECT_EQ(client.events.size(), 1U);
+}
+
+TEST_P(Contract, ListeningTwiceDoesNotDeliverTwice) {
+  Client& client = connect();
+  listen(client);
+  listen(client);
+  world_->emit(K_LTE_RRC_STATE, rrcState(1));
+  ASSERT_TRUE(until([&] { return !client.events.empty(); }));
+  world_->settle();
+  EXPECT_EQ(client.events.size(), 1U);
+}
+
+TEST_P(Contract, RegisteringAHandlerReplacesTheOneBefore) {
+  Client& client = connect();
+  listen(client);
+  int second = 0;
+  radix::client::RegisterEventHandler(client.manager, radix::kEventMetric,
+                                      [&](const ObjectHandle&, radix::client::Group) { ++second; });
+  world_->emit(K_LTE_RRC_STATE, rrcState(1));
+  ASSERT_TRUE(until([&] { return second == 1; }));
+  EXPECT_TRUE(client.events.empty());
+}
+
+TEST_P(Contract, ANewClientGetsTheLastRecordOfEachMetricInTheOrderOfTheirArrival) {
+  Client& first = connect();
+  listen(first);
+  world_->emit(K_LTE_RRC_STATE, rrcState(1));
+  world_->emit(K_LTE_TX_POWER, {});
+  world_->emit(K_LTE_RRC_STATE, rrcState(3));
+  Client& second = connect();
+  listen(second);
+  EXPECT_EQ(second.metrics(), (std::vector<std::int64_t>{K_LTE_TX_POWER, K_LTE_RRC_STATE}));
+  EXPECT_EQ(second.payloads()[1], rrcState(3));
+}
+
+TEST_P(Contract, TheLastRecordsComeOncePerConfigurationAndOnlyThoseItNames) {
+  Client& client = connect();
+  world_->emit(K_LTE_RRC_STATE, rrcState(1));
+  world_->emit(K_LTE_TX_POWER, {});
+  ASSERT_EQ(push(client, "[metrics]\nK_LTE_RRC_STATE = 1000\n").status, 0);
+  world_->settle();
+  EXPECT_TRUE(client.events.empty());
+  listen(client);
+  EXPECT_EQ(client.metrics(), std::vector<std::int64_t>{K_LTE_RRC_STATE});
+  listen(client);
+  EXPECT_EQ(client.events.size(), 1U);
+  ASSERT_EQ(push(client, "[metrics]\nK_LTE_TX_POWER = 1000\n").status, 0);
+  listen(client);
+  EXPECT_EQ(client.metrics(), (std::vector<std::int64_t>{K_LTE_RRC_STATE, K_LTE_TX_POWER}));
+}
+
+TEST_P(Contract, AClientWithoutConfigurationGetsEveryRecordThatFlowsAndOneWithItOnlyItsOwn) {
+  Client& open = connect("open");
+  Client& narrow = connect("narrow");
+  ASSERT_EQ(
+      push(narrow, "[metrics]\nK_LTE_TX_POWER = \"on change\"\n[triggers]\n0x7F0013 = [\"K_SIM_FILE_INFO\"]\n").status,
+      0);
+  listen(open);
+  listen(narrow);
+  for (const std::int64_t metric : {K_LTE_RRC_STATE, K_LTE_TX_POWER, K_SIM_FILE_INFO}) world_->emit(metric, {});
+  ASSERT_TRUE(until([&] { return open.events.size() >= 3 && narrow.events.size() >= 2; }));
+  world_->settle();
+  EXPECT_EQ(open.metrics(), (std::vector<std::int64_t>{K_LTE_RRC_STATE, K_LTE_TX_POWER, K_SIM_FILE_INFO}));
+  EXPECT_EQ(narrow.metrics(), (std::vector<std::int64_t>{K_LTE_TX_POWER, K_SIM_FILE_INFO}));
+}
+
+TEST_P(Contract, SourcesAreToldTheUnionOfAllConfigurationsAtTheShortestPeriod) {
+  EXPECT_EQ(plan(), std::nullopt);
+  Client& first = connect("first");
+  Client& second = connect("second");
+  ASSERT_EQ(push(first, "[metrics]\nK_LTE_RRC_STATE = 1000\nK_LTE_TX_POWER = 500\n").status, 0);
+  ASSERT_EQ(push(second, "[metrics]\nK_LTE_RRC_STATE = 200\nK_LTE_TX_POWER = \"on change\"\n").status, 0);
+  auto both = plan();
+  ASSERT_TRUE(both);
+  EXPECT_EQ(both->metrics.at(K_LTE_RRC_STATE), milliseconds(200));
+  EXPECT_EQ(both->metrics.at(K_LTE_TX_POWER), std::nullopt);
+  ASSERT_EQ(perform(second, radix::kCommandClearConfiguration, {{radix::kKeyAppID, std::int64_t{2}}}).status, 0);
+  EXPECT_EQ(plan()->metrics.at(K_LTE_RRC_STATE), milliseconds(1000));
+}
+
+TEST_P(Contract, AConfigurationGoesWithItsConnection) {
+  Client& client = connect();
+  ASSERT_EQ(push(client, "[metrics]\nK_LTE_RRC_STATE = 1000\n").status, 0);
+  ASSERT_TRUE(plan());
+  client.manager.reset();
+  EXPECT_TRUE(until([&] { return !plan(); }));
+}
+
+TEST_P(Contract, TheBaseConfigurationCountsAsThatOfOneMoreClientUntilItIsCleared) {
+  Client& client = connect();
+  ASSERT_EQ(push(client, "[metrics]\nK_LTE_RRC_STATE = 300\n", radix::kCommandSetBaseConfiguration).status, 0);
+  EXPECT_EQ(plan()->metrics.at(K_LTE_RRC_STATE), milliseconds(300));
+  client.manager.reset();
+  Client& other = connect();
+  world_->settle();
+  ASSERT_TRUE(plan());
+  ASSERT_EQ(perform(other, radix::kCommandClearBaseConfiguration).status, 0);
+  EXPECT_EQ(plan(), std::nullopt);
+}
+
+TEST_P(Contract, AnEmptyConfigurationIsValidAndAsksForNothing) {
+  Client& client = connect();
+  EXPECT_EQ(push(client, "").status, 0);
+  ASSERT_TRUE(plan());
+  EXPECT_TRUE(plan()->metrics.empty());
+}
+
+TEST_P(Contract, AnUnknownMetricIsNotedAndIgnored) {
+  Client& client = connect();
+  EXPECT_EQ(push(client, "[metrics]\nK_NOBODY_KNOWS = 5\nK_LTE_RRC_STATE = 1000\n").status, 0);
+  EXPECT_EQ(plan()->metrics.size(), 1U);
+  EXPECT_EQ(logged("K_NOBODY_KNOWS"), 1U);
+}
+
+TEST_P(Contract, ASyntaxErrorIsRefusedWithLineAndColumnAndChangesNothing) {
+  Client& client = connect();
+  ASSERT_EQ(push(client, "[metrics]\nK_LTE_RRC_STATE = 1000\n").status, 0);
+  const Result result = push(client, "[metrics]\nK_LTE_RRC_STATE = = 5\n");
+  EXPECT_EQ(result.status, static_cast<int>(Status::BadConfiguration));
+  EXPECT_NE(result.message.find("line 2"), std::string::npos) << result.message;
+  EXPECT_NE(result.message.find("column"), std::string::npos) << result.message;
+  EXPECT_EQ(plan()->metrics.at(K_LTE_RRC_STATE), milliseconds(1000));
+}
+
+TEST_P(Contract, AConfigurationWithoutPayloadOrOfAnotherTypeIsRefused) {
+  Client& client = connect();
+  EXPECT_EQ(perform(client, radix::kCommandAddConfiguration, {{radix::kKeyAppID, std::int64_t{2}}}).status,
+            static_cast<int>(Status::BadArguments));
+  const Result result = perform(client, radix::kCommandAddConfiguration,
+                                {{radix::kKeyPayload, Value::bytes({})}, {radix::kKeyPayloadType, std::int64_t{4}}});
+  EXPECT_EQ(result.status, static_cast<int>(Status::BadArguments));
+  EXPECT_NE(result.message.find("4"), std::string::npos);
+}
+
+// A configuration of exactly that many bytes.
+std::string configurationOf(std::size_t size) { return std::string(size - 1, '#') + "\n"; }
+
+TEST_P(Contract, AConfigurationUpToTheLimitOfAFrameIsTakenAndOneByteMoreIsRefusedByTheClientLibrary) {
+  Client& client = connect();
+  const Result refused = push(client, configurationOf(radix::longestFrame));
+  EXPECT_EQ(refused.status, static_cast<int>(Status::TooLarge));
+  // The message names the limit, which is what really fits.
+  const std::string start = "the configuration has 131072 bytes; at most ";
+  ASSERT_EQ(refused.message.substr(0, start.size()), start);
+  const std::size_t limit = std::stoul(refused.message.substr(start.size()));
+  EXPECT_GT(limit, 130000U);
+  EXPECT_EQ(push(client, configurationOf(limit)).status, 0);
+  EXPECT_EQ(push(client, configurationOf(limit + 1)).status, static_cast<int>(Status::TooLarge));
+  EXPECT_TRUE(radix::client::Connection(client.manager).connected);
+}
+
+TEST_P(Contract, AnUnknownCommandIsRefused) {
+  Client& client = connect();
+  const Result result = perform(client, "kCommandMakeCoffee");
+  EXPECT_EQ(result.status, static_cast<int>(Status::UnknownCommand));
+  EXPECT_EQ(result.message, "the command 'kCommandMakeCoffee' is not known");
+}
+
+TEST_P(Contract, AQueryOfATriggerAsksForTheMetricsThatTheConfigurationNamesAndAnswersAsAnEvent) {
+  Client& client = connect();
+  world_->onService([&] {
+    world_->script().onQuery = [this](std::int64_t metric) {
+      world_->script().emit(metric, {});
+      return true;
+    };
+  });
+  EXPECT_EQ(query(client, 0x7F0013, 0).status, static_cast<int>(Status::CannotFill));
+  ASSERT_EQ(push(client, "[metrics]\n[triggers]\n0x7F0013 = [\"K_SIM_FILE_INFO\"]\n").status, 0);
+  listen(client);
+  const Result result = query(client, 0x7F0013, 0);
+  EXPECT_EQ(result.status, 0);
+  EXPECT_EQ(result.message, "");
+  ASSERT_TRUE(until([&] { return !client.events.empty(); }));
+  EXPECT_EQ(client.metrics(), std::vector<std::int64_t>{K_SIM_FILE_INFO});
+}
+
+TEST_P(Contract, AQueriedMetricIsDeliveredAlsoWhenTheConfigurationDoesNotNameIt) {
+  Client& client = connect();
+  world_->onService([&] { world_->script().onQuery = [](std::int64_t) { return true; }; });
+  ASSERT_EQ(push(client, "").status, 0);
+  listen(client);
+  ASSERT_EQ(query(client, 0, K_LTE_TX_POWER).status, 0);
+  world_->emit(K_LTE_TX_POWER, {});
+  EXPECT_TRUE(until([&] { return client.events.size() == 1; }));
+}
+
+TEST_P(Contract, AQueryThatNoSourceCanFillIsRefusedWithTheMetricsName) {
+  Client& client = connect();
+  const Result result = query(client, 0, K_LTE_TX_POWER);
+  EXPECT_EQ(result.status, static_cast<int>(Status::CannotFill));
+  EXPECT_EQ(result.message, "no source can fill K_LTE_TX_POWER (0x3CD302)");
+  EXPECT_EQ(query(client, 0, 77).message, "no source can fill 0x4D");
+  EXPECT_EQ(query(client, 0, 0).status, static_cast<int>(Status::BadArguments));
+  const Result unknown = query(client, 5, 0);
+  EXPECT_EQ(unknown.status, static_cast<int>(Status::CannotFill));
+  EXPECT_NE(unknown.message.find("0x5"), std::string::npos);
+}
+
+TEST_P(Contract, ASourceIsToldWhetherAnybodyListens) {
+  Client& client = connect();
+  world_->settle();
+  EXPECT_FALSE(sourceIsHeard());
+  listen(client);
+  EXPECT_TRUE(sourceIsHeard());
+  radix::client::EventsOff(client.manager);
+  world_->settle();
+  EXPECT_FALSE(sourceIsHeard());
+  listen(client);
+  client.manager.reset();
+  EXPECT_TRUE(until([&] { return !sourceIsHeard(); }));
+}
+
+TEST_P(Contract, APayloadThatDoesNotDecodeIsCountedLoggedAndWithheld) {
+  Client& client = connect();
+  listen(client);
+  world_->emit(K_LTE_RRC_STATE, {0x08});
+  world_->emit(K_LTE_RRC_STATE, rrcState(2));
+  ASSERT_TRUE(until([&] { return !client.events.empty(); }));
+  world_->settle();
+  ASSERT_EQ(client.events.size(), 1U);
+  EXPECT_EQ(client.payloads()[0], rrcState(2));
+  EXPECT_EQ(logged("a record of K_LTE_RRC_STATE (0x3C4E04) was withheld"), 1U);
+  ASSERT_EQ(perform(client, radix::kCommandShowStatus).status, 0);
+  const Value& source = (*reply_.find("sources")->list())[0];
+  EXPECT_EQ(source.dictionary()->find("withheld")->rawUInt64(), 1U);
+}
+
+TEST_P(Contract, TheStatusTellsSourcesClientsAndCounts) {
+  Client& client = connect("somebody");
+  listen(client);
+  world_->emit(K_LTE_RRC_STATE, rrcState(2), milliseconds(5000));
+  ASSERT_TRUE(until([&] { return client.events.size() == 1; }));
+  ASSERT_EQ(perform(client, radix::kCommandShowStatus).status, 0);
+  EXPECT_EQ(reply_.find("base_configuration")->boolean(), false);
+  const Dictionary& source = *(*reply_.find("sources")->list())[0].dictionary();
+  EXPECT_EQ(source.find("origin")->text(), "scripted");
+  EXPECT_EQ(source.find("records")->rawUInt64(), 1U);
+  EXPECT_EQ(source.find("last_record_ms")->int64(), 5000);
+  const List& clients = *reply_.find("clients")->list();
+  ASSERT_EQ(clients.size(), 1U);
+  const Dictionary& entry = *clients[0].dictionary();
+  EXPECT_EQ(entry.find("name")->text(), "somebody");
+  EXPECT_EQ(entry.find("listening")->boolean(), true);
+  EXPECT_EQ(entry.find("configured")->boolean(), false);
+  EXPECT_EQ(entry.find("records")->rawUInt64(), 1U);
+  EXPECT_EQ(entry.find("lost")->rawUInt64(), 0U);
+}
+
+TEST_P(Contract, ASourceThatThrowsEndsAndTheServiceGoesOn) {
+  Client& client = connect();
+  world_->onService(
+      [&] { world_->script().onQuery = [](std::int64_t) -> bool { throw std::runtime_error("out of order"); }; });
+  const Result result = query(client, 0, K_LTE_TX_POWER);
+  EXPECT_EQ(result.status, static_cast<int>(Status::CannotFill));
+  EXPECT_EQ(logged("scripted failed answering a query: out of order; it runs no more"), 1U);
+  ASSERT_EQ(perform(client, radix::kCommandShowStatus).status, 0);
+  const Dictionary& source = *(*reply_.find("sources")->list())[0].dictionary();
+  EXPECT_EQ(source.find("failure")->text(), "failed answering a query: out of order");
+  // It is asked no more.
+  EXPECT_EQ(query(client, 0, K_LTE_TX_POWER).status, static_cast<int>(Status::CannotFill));
+}
+
+TEST_P(Contract, ASourceThatThrowsInATimerEndsAndTheServiceGoesOn) {
+  Client& client = connect();
+  ScheduledTaskHandle timer;
+  world_->onService([&] { timer = world_->script().context->scheduler.after(milliseconds(1), [] { throw 7; }); });
+  EXPECT_TRUE(until([&] { return logged("failed in a timer: something that is no exception") == 1; }));
+  world_->onService([&] { timer.reset(); });
+  EXPECT_EQ(perform(client, radix::kCommandShowStatus).status, 0);
+}
+
+TEST_P(Contract, WithoutAServiceEachCommandAnswersWithANonZeroStatusThatSaysSo) {
+  Client& client = connect();
+  world_->settle();
+  world_->kill();
+  ASSERT_TRUE(until([&] { return !radix::client::Connection(client.manager).connected; }));
+  const Result result = perform(client, radix::kCommandQueryMetric);
+  EXPECT_EQ(result.status, static_cast<int>(Status::NoService));
+  EXPECT_NE(result.message.find("no baseband service"), std::string::npos) << result.message;
+  EXPECT_FALSE(radix::client::Connection(client.manager).trouble.empty());
+}
+
+TEST_P(Contract, AClientStartedBeforeTheServiceConnectsWhenItComes) {
+  world_->kill();
+  Client& client = connect();
+  EXPECT_EQ(perform(client, radix::kCommandShowStatus).status, static_cast<int>(Status::NoService));
+  EXPECT_FALSE(radix::client::Connection(client.manager).everConnected);
+  radix::client::EventsOn(client.manager);
+  world_->restart();
+  ASSERT_TRUE(until([&] { return radix::client::Connection(client.manager).connected; }));
+  world_->settle();
+  world_->emit(K_LTE_RRC_STATE, rrcState(2));
+  EXPECT_TRUE(until([&] { return client.events.size() == 1; }));
+}
+
+TEST_P(Contract, AfterARestartOfTheServiceConfigurationAndDeliveryAreRestored) {
+  Client& client = connect();
+  ASSERT_EQ(push(client, "[metrics]\nK_LTE_RRC_STATE = 250\n").status, 0);
+  listen(client);
+  world_->kill();
+  ASSERT_TRUE(until([&] { return !radix::client::Connection(client.manager).connected; }));
+  world_->restart();
+  ASSERT_TRUE(until([&] { return sourceIsHeard(); }));
+  ASSERT_TRUE(plan());
+  EXPECT_EQ(plan()->metrics.at(K_LTE_RRC_STATE), milliseconds(250));
+  world_->emit(K_LTE_TX_POWER, {});
+  world_->emit(K_LTE_RRC_STATE, rrcState(2));
+  ASSERT_TRUE(until([&] { return !client.events.empty(); }));
+  EXPECT_EQ(client.metrics(), std::vector<std::int64_t>{K_LTE_RRC_STATE});
+}
+
+TEST_P(Contract, WhatWasClearedOrSwitchedOffIsNotRestored) {
+  Client& client = connect();
+  ASSERT_EQ(push(client, "[metrics]\nK_LTE_RRC_STATE = 250\n").status, 0);
+  listen(client);
+  ASSERT_EQ(perform(client, radix::kCommandClearConfiguration).status, 0);
+  radix::client::EventsOff(client.manager);
+  world_->kill();
+  world_->restart();
+  ASSERT_TRUE(until([&] { return radix::client::Connection(client.manager).connected; }));
+  world_->settle();
+  EXPECT_EQ(plan(), std::nullopt);
+  EXPECT_FALSE(sourceIsHeard());
+}
+
+TEST_P(Contract, AClientPastTheLimitIsRefusedWithAReasonAndTheOthersAreServed) {
+  make({.mostClients = 3});
+  for (int number = 0; number < 3; ++number) {
+    ASSERT_EQ(perform(connect(), radix::kCommandShowStatus).status, 0);
+  }
+  const Result result = perform(connect(), radix::kCommandShowStatus);
+  EXPECT_EQ(result.status, static_cast<int>(Status::TooMany));
+  EXPECT_EQ(result.message, "there are already 3 clients, more are not served");
+  EXPECT_EQ(perform(*clients_[0], radix::kCommandShowStatus).status, 0);
+}
+
+TEST_P(Contract, AClientOlderThanTheServiceLikesIsRefusedAndToldWhichSideToUpdate) {
+  make({.version = 3, .oldestVersion = 2});
+  const Result result = perform(connect(), radix::kCommandShowStatus);
+  EXPECT_EQ(result.status, static_cast<int>(Status::VersionMismatch));
+  EXPECT_NE(result.message.find("update the client"), std::string::npos) << result.message;
+}
+
+TEST_P(Contract, AServiceOfALaterVersionThatStillKnowsOursIsServed) {
+  make({.version = 3, .oldestVersion = 1});
+  EXPECT_EQ(perform(connect(), radix::kCommandShowStatus).status, 0);
+}
+
+}  // namespace
+}  // namespace probeview
