@@ -70,13 +70,11 @@ void BatchOutput::error(std::string_view what) {
 
 bool BatchOutput::closed() const { return !output_.good(); }
 
-void appendJson(const CollectedLines& lines, std::string& out) {
+void appendJson(const CollectedLines& lines, std::string& out, std::size_t first) {
   out += '[';
-  bool first = true;
-  for (const std::string& line : lines.lines()) {
-    if (!first) out += ',';
-    first = false;
-    appendJsonString(line, out);
+  for (std::size_t index = first; index < lines.lines().size(); ++index) {
+    if (index > first) out += ',';
+    appendJsonString(lines.lines()[index], out);
   }
   out += ']';
 }

@@ -65,8 +65,8 @@ class CollectedLines final : public LineSink {
  private:
   std::vector<std::string> lines_;
 };
-// As an array of strings.
-void appendJson(const CollectedLines& lines, std::string& out);
+// As an array of strings, from the line with that index on.
+void appendJson(const CollectedLines& lines, std::string& out, std::size_t first = 0);
 
 // Splits at blanks and tabs; none of the words is empty. A carriage return is a blank, too. No more words than
 // mostWords are returned: no command takes as many, and a line can have millions.

@@ -264,8 +264,6 @@ std::string StoreSession::pages() {
   for (const std::string& key : navigablePageKeys()) {
     if (!first) out += ',';
     first = false;
-    // Each page carries its own lines.
-    console_.clear();
     appendPage(key, out);
   }
   out += ']';
@@ -273,6 +271,8 @@ std::string StoreSession::pages() {
 }
 
 void StoreSession::appendPage(std::string_view key, std::string& out) {
+  // Each page carries its own lines; should one of them stop the program, its answer carries those of all before it.
+  const std::size_t firstLine = console_.lines().size();
   CategoryPage page(std::string(key), *store_, console_);
   const PageSnapshot snapshot = takeSnapshot(page);
   out += "{\"page\":";
@@ -296,7 +296,7 @@ void StoreSession::appendPage(std::string_view key, std::string& out) {
     out += "]}";
   }
   out += "],\"log\":";
-  appendJson(console_, out);
+  appendJson(console_, out, firstLine);
   out += '}';
 }
 
