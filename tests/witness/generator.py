@@ -160,6 +160,7 @@ class Payloads:
             result.insert(random.randrange(len(result) + 1), self.metric_tag())
         while self.wild(0.2):
             extra = random.choice([lambda: self.unknown(name), self.metric_tag,
+                                   lambda: to_varint(EVERY_BIT ^ random.getrandbits(random.choice([0, 3, 19]))),
                                    lambda: random.randbytes(random.randrange(1, 12)),
                                    lambda: b"\xff" * random.randrange(1, 12)])
             result.insert(random.randrange(len(result) + 1), extra())

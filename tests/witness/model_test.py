@@ -135,6 +135,14 @@ class Unknown(Vectors):
     def test_a_key_of_ten_bytes_without_an_end_is_unknown_field_0_with_a_varint(self):
         self.expect("KCellularLteRrcState", "ffffffffffffffffffff 05 0807", {"timestamp": 7}, reencoded="0807")
 
+    def test_the_key_of_all_ones_is_unknown_field_65535_of_a_form_that_cannot_be_skipped(self):
+        self.expect("KCellularLteRrcState", "0807 ffffffffffffffffff01 2001", {"timestamp": 7}, complete=False,
+                    reencoded="0807")
+
+    def test_the_largest_key_that_can_be_skipped_is_unknown_field_65535(self):
+        # 2^64 - 3: form 5
+        self.expect("KCellularLteRrcState", "fdffffffffffffffff01 01020304 0807", {"timestamp": 7}, reencoded="0807")
+
     def test_an_unknown_varint_without_an_end_is_skipped(self):
         self.expect("KCellularLteRrcState", "30 ffffffffffffffffffff 0807", {"timestamp": 7}, reencoded="0807")
 
