@@ -5,10 +5,8 @@
 
 #include <algorithm>
 
-#include <sstream>
-
 #include "tests/support/golden.h"
-#include "tools/probectl.h"
+#include "tests/tools/run_probectl.h"
 
 namespace probeview {
 namespace {
@@ -28,15 +26,11 @@ class GoldenSession : public ::testing::TestWithParam<std::string> {};
 
 TEST_P(GoldenSession, IsAnsweredAsKept) {
   const std::string subcommand = GetParam().substr(0, GetParam().find('_'));
-  std::istringstream input(contentOf(folder / (GetParam() + ".in")));
-  std::ostringstream output;
-  std::ostringstream errors;
-  const std::vector<std::string> arguments = {subcommand, "--batch"};
-  const int status = runProbectl(arguments, input, output, errors);
-  EXPECT_EQ(errors.str(), "");
-  const std::string text = output.str();
+  const Outcome outcome = probectl({subcommand, "--batch"}, contentOf(folder / (GetParam() + ".in")));
+  EXPECT_EQ(outcome.errors, "");
+  const std::string& text = outcome.output;
   const bool stopped = text.find("\n{\"fatal\":") != std::string::npos || text.starts_with("{\"fatal\":");
-  EXPECT_EQ(status, stopped ? 3 : 0);
+  EXPECT_EQ(outcome.status, stopped ? 3 : 0);
   expectGolden(folder / (GetParam() + ".out"), text);
 }
 

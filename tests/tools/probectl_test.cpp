@@ -4,24 +4,10 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
-#include <sstream>
+#include "tests/tools/run_probectl.h"
 
 namespace probeview {
 namespace {
-
-struct Outcome {
-  int status;
-  std::string output;
-  std::string errors;
-};
-
-Outcome probectl(const std::vector<std::string>& arguments, const std::string& input = "") {
-  std::istringstream in(input);
-  std::ostringstream out;
-  std::ostringstream err;
-  const int status = runProbectl(arguments, in, out, err);
-  return {status, out.str(), err.str()};
-}
 
 TEST(Probectl, ShowsTheOneVersion) {
   const Outcome outcome = probectl({"--version"});
