@@ -1,2 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
 # One line per target.
+probeview_fuzz(configuration KNOWS configuration)
+probeview_fuzz(trace KNOWS trace_source)
+probeview_fuzz(batch KNOWS tools)
