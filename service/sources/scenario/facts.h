@@ -1,0 +1,74 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include <array>
+#include <cstddef>
+#include <cstdint>
+
+namespace probeview::scenario {
+
+// Simulated time since power-on.
+using Milliseconds = std::int64_t;
+
+// The model goes forward in steps of this length; everything in it happens at a multiple.
+constexpr Milliseconds kStep = 40;
+// How often the technology in service is measured: the layer 1 period of 3GPP TS 36.133, 8.1.2.2.1.
+constexpr Milliseconds kMeasurementPeriod = 200;
+
+// The things about the phone that can be reported, one for each metric.
+enum class Fact : std::uint8_t {
+  kGsmServingCell,
+  kGsmIdleConfiguration,
+  kGsmIdleMeasurement,
+  kGsmDedicatedMeasurement,
+  kGsmNeighbours,
+  kGsmPacketConfiguration,
+  kUmtsServingCell,
+  kUmtsServingMeasurement,
+  kUmtsTransmitPower,
+  kUmtsSelection,
+  kUmtsNeighbours,
+  kUmtsConnection,
+  kUmtsConfiguration,
+  kLteServingCell,
+  kLteSamples,
+  kLteConnection,
+  kLteDrx,
+  kLteTransmitPower,
+  kLteComponentCarriers,
+  kLteSelection,
+  kLteNeighbours,
+  kLteInterRatNeighbours,
+  kLteAggregation,
+  kMobilityCommon,
+  kMobilityContext,
+  kGprsContext,
+  kEpsContext,
+  kBearers,
+  kSimFiles,
+};
+constexpr std::size_t kFacts = 29;
+
+// When each fact was last learnt. A report is due when the revision has moved on.
+class Facts {
+ public:
+  struct Entry {
+    Milliseconds learnt = -1;    // -1: never yet
+    std::uint32_t revision = 0;  // moves on each time that the fact is learnt anew
+    bool holds = false;          // whether it is still so; false once the phone has left the technology
+  };
+
+  void learn(Fact fact, Milliseconds now) {
+    Entry& entry = entries_[static_cast<std::size_t>(fact)];
+    entry.learnt = now;
+    ++entry.revision;
+    entry.holds = true;
+  }
+  void end(Fact fact) { entries_[static_cast<std::size_t>(fact)].holds = false; }
+  const Entry& operator[](Fact fact) const { return entries_[static_cast<std::size_t>(fact)]; }
+
+ private:
+  std::array<Entry, kFacts> entries_{};
+};
+
+}  // namespace probeview::scenario
