@@ -5,6 +5,7 @@
 #include <string_view>
 
 #include "service/metric_source.h"
+#include "service/sources/scenario/scenario_source.h"
 #include "service/sources/trace_source.h"
 
 namespace probeview {
@@ -18,6 +19,7 @@ struct SourceKind {
 };
 
 constexpr SourceKind kinds[] = {
+    {"scenario", makeScenarioSource},
     {"trace", makeTraceSource},
 };
 

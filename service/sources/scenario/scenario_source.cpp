@@ -1,0 +1,237 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "service/sources/scenario/scenario_source.h"
+
+#include <algorithm>
+#include <array>
+#include <charconv>
+#include <memory>
+#include <string>
+#include <utility>
+
+#include "service/sources/scenario/edges_story.h"
+#include "service/sources/scenario/phone_story.h"
+#include "service/sources/scenario/report_schedule.h"
+#include "service/sources/scenario/reports.h"
+
+namespace probeview {
+namespace scenario {
+namespace {
+
+using std::chrono::milliseconds;
+using std::chrono::nanoseconds;
+
+// How long the source sleeps at most and at least; in between, as long as the shortest period that anybody wants.
+constexpr Milliseconds kLongestSleep = 100, kShortestSleep = kStep;
+// A machine that was stopped for longer than this does not drive all the way that it has missed.
+constexpr milliseconds kMostToCatchUp{5000};
+
+class ScenarioSource final : public MetricSource {
+ public:
+  ScenarioSource(std::string_view name, std::unique_ptr<Story> story, double speed,
+                 std::optional<Milliseconds> forcedPeriod)
+      : origin_("scenario:" + std::string(name)),
+        story_(std::move(story)),
+        speed_(speed),
+        schedule_(speed, forcedPeriod) {}
+
+  std::string_view origin() const override { return origin_; }
+
+  std::vector<std::int64_t> metrics() const override {
+    std::vector<std::int64_t> ids;
+    for (const Report& report : reports()) ids.push_back(report.metricId);
+    std::sort(ids.begin(), ids.end());
+    return ids;
+  }
+
+  void start(const SourceContext& context, MetricSink& sink) override {
+    scheduler_ = &context.scheduler;
+    clock_ = &context.clock;
+    sink_ = &sink;
+    anchor();
+  }
+
+  void stop() override { timer_.reset(); }
+
+  void setPlan(const std::optional<MetricPlan>& plan) override {
+    schedule_.setPlan(plan);
+    if (timer_) sleep();
+  }
+
+  void setListening(bool listening) override {
+    if (!listening) {
+      timer_.reset();
+    } else if (!timer_) {
+      anchor();
+      schedule_.renew();
+      sleep();
+    }
+  }
+
+  bool query(std::int64_t metricId) override {
+    const auto all = reports();
+    const auto found =
+        std::find_if(all.begin(), all.end(), [&](const Report& report) { return report.metricId == metricId; });
+    if (found == all.end()) return false;
+    // The card can be read as soon as the phone is on.
+    if (story_->now() < 0) story_->advance();
+    const Facts::Entry& fact = story_->facts()[found->fact];
+    if (fact.learnt < 0) return false;
+    if (!timer_) anchor();  // while it rests, now is the time of day
+    emit(*found, fact.holds && found->nature == Nature::kState ? story_->now() : fact.learnt);
+    return true;
+  }
+
+ private:
+  // From here on, simulated time and the time of day go together.
+  void anchor() {
+    anchorMonotonic_ = clock_->monotonicTime();
+    anchorWall_ = clock_->wallTime();
+    anchorSimulated_ = story_->now();
+  }
+
+  void sleep() {
+    const Milliseconds sleep =
+        std::clamp(schedule_.shortestPeriod().value_or(kLongestSleep), kShortestSleep, kLongestSleep);
+    lastTurn_ = clock_->monotonicTime();
+    timer_ = scheduler_->every(milliseconds(sleep), [this] { turn(); });
+  }
+
+  void turn() {
+    const nanoseconds now = clock_->monotonicTime();
+    if (now - std::exchange(lastTurn_, now) > kMostToCatchUp) {
+      anchor();
+      return;
+    }
+    const double elapsed = std::chrono::duration<double, std::milli>(now - anchorMonotonic_).count();
+    const Milliseconds until = anchorSimulated_ + static_cast<Milliseconds>(elapsed * speed_);
+    while (story_->now() + kStep <= until) {
+      story_->advance();
+      for (const Report& report : reports()) {
+        const auto time = schedule_.due(report, story_->facts(), story_->now());
+        if (time) emit(report, *time);
+      }
+    }
+  }
+
+  void emit(const Report& report, Milliseconds simulated) {
+    MetricRecord record;
+    record.metricId = report.metricId;
+    record.time = anchorWall_ + milliseconds(simulated - anchorSimulated_);
+    record.payload = story_->tell(report.fact, static_cast<std::uint64_t>(record.time.count()));
+    record.origin = origin_;
+    sink_->emit(std::move(record));
+  }
+
+  std::string origin_;
+  std::unique_ptr<Story> story_;
+  double speed_;
+  ReportSchedule schedule_;
+  Scheduler* scheduler_ = nullptr;
+  const Clock* clock_ = nullptr;
+  MetricSink* sink_ = nullptr;
+  ScheduledTaskHandle timer_;
+  nanoseconds anchorMonotonic_{};
+  nanoseconds lastTurn_{};
+  milliseconds anchorWall_{};
+  Milliseconds anchorSimulated_ = 0;
+};
+
+struct Scenario {
+  std::string_view name;
+  std::unique_ptr<Story> (*make)(std::uint64_t seed);
+  std::optional<Milliseconds> forcedPeriod;
+};
+
+template <World (*makeWorld)(std::uint64_t)>
+std::unique_ptr<Story> drive(std::uint64_t seed) {
+  return std::make_unique<PhoneStory>(makeWorld(seed), seed);
+}
+
+constexpr Milliseconds kTwentyTimesASecond = 50;
+
+const std::array<Scenario, 5> kScenarios{{
+    {"city", drive<cityWorld>, std::nullopt},
+    {"highway", drive<highwayWorld>, std::nullopt},
+    {"indoor", drive<indoorWorld>, std::nullopt},
+    {"soak", drive<cityWorld>, kTwentyTimesASecond},
+    {"edges", [](std::uint64_t) -> std::unique_ptr<Story> { return std::make_unique<EdgesStory>(); }, std::nullopt},
+}};
+
+std::string names() {
+  std::string text;
+  for (const Scenario& scenario : kScenarios) {
+    if (!text.empty()) text += ", ";
+    text += scenario.name;
+  }
+  return text;
+}
+
+// The whole text as a number; false if it is anything else.
+template <typename Number>
+bool readNumber(std::string_view text, Number& number) {
+  const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
+  return error == std::errc() && end == text.data() + text.size();
+}
+
+struct Options {
+  std::string_view name = "city";
+  std::optional<std::uint64_t> seed;
+  std::optional<double> speed;
+};
+
+// Empty if the option was understood.
+std::string readOption(std::string_view option, Options& options) {
+  const std::size_t equals = option.find('=');
+  const std::string_view key = option.substr(0, equals);
+  const std::string_view value = equals == std::string_view::npos ? "" : option.substr(equals + 1);
+  const std::string what = "scenario: \"" + std::string(option) + "\": ";
+  if (key == "seed" && equals != std::string_view::npos) {
+    std::uint64_t seed = 0;
+    if (options.seed) return what + "the seed is given twice; give it once";
+    if (!readNumber(value, seed)) return what + "the seed must be a whole number from 0 to 18446744073709551615";
+    options.seed = seed;
+    return "";
+  }
+  if (key == "speed" && equals != std::string_view::npos) {
+    double speed = 0;
+    if (options.speed) return what + "the speed is given twice; give it once";
+    if (!readNumber(value, speed) || !(speed >= 1 && speed <= 1000)) {
+      return what + "the speed must be a number from 1 to 1000";
+    }
+    options.speed = speed;
+    return "";
+  }
+  return what + "no such option; say scenario[:NAME][,seed=N][,speed=N]";
+}
+
+}  // namespace
+}  // namespace scenario
+
+SourceResult makeScenarioSource(std::string_view arguments) {
+  using namespace scenario;
+  if (arguments.starts_with(':')) arguments.remove_prefix(1);
+  Options options;
+  bool first = true;
+  while (first || !arguments.empty()) {
+    const std::size_t comma = arguments.find(',');
+    const std::string_view item = arguments.substr(0, comma);
+    arguments.remove_prefix(comma == std::string_view::npos ? arguments.size() : comma + 1);
+    const bool isName = first && item.find('=') == std::string_view::npos;
+    first = false;
+    if (isName) {
+      if (!item.empty()) options.name = item;
+      continue;
+    }
+    if (std::string error = readOption(item, options); !error.empty()) return {nullptr, std::move(error)};
+  }
+  for (const Scenario& scenario : kScenarios) {
+    if (scenario.name != options.name) continue;
+    const std::uint64_t seed = options.seed.value_or(1);
+    return {std::make_unique<ScenarioSource>(scenario.name, scenario.make(seed), options.speed.value_or(1),
+                                             scenario.forcedPeriod),
+            ""};
+  }
+  return {nullptr, "scenario: there is no scenario \"" + std::string(options.name) + "\"; choose one of " + names()};
+}
+
+}  // namespace probeview
