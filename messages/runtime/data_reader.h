@@ -19,7 +19,10 @@ class PBDataReader {
   // The payload must outlive the reader. What decoding has to say ("valid metricId tag", "Unknown tag: 13:7") goes to
   // the log, if there is one.
   explicit PBDataReader(std::span<const std::uint8_t> payload, LineSink* log = nullptr) noexcept
-      : begin_(payload.empty() ? &nothing : payload.data()), position_(begin_), limit_(begin_ + payload.size()), log_(log) {}
+      : begin_(payload.empty() ? noData : payload.data()),
+        position_(begin_),
+        limit_(begin_ + payload.size()),
+        log_(log) {}
 
   std::size_t position() const noexcept { return static_cast<std::size_t>(position_ - begin_); }
   // The position at which reading ends: that of the record being read.
@@ -37,8 +40,8 @@ class PBDataReader {
   friend struct TableWalker;
   friend struct PBReaderOperations;
 
-  // An empty payload may come without an address, which would look like a failed read.
-  static constexpr std::uint8_t nothing = 0;
+  // No data has an address too: null means failure wherever a position is returned.
+  static constexpr std::uint8_t noData[1] = {};
 
   const std::uint8_t* begin_;
   const std::uint8_t* position_;
