@@ -2,7 +2,7 @@
 # SPDX-License-Identifier: Apache-2.0
 """Asks probectl and the model the same random questions and compares every answer.
 
-    compare.py PROBECTL decode|store [--seed N|random] [--count N] [--seconds S] [--zone NAME] [--wildness W]
+    compare.py PROBECTL decode|sweep|store [--seed N|random] [--count N] [--seconds S] [--zone NAME] [--wildness W]
 
 Ends with status 0 when all answers agree. On a difference it prints the seed and the smallest case that it could find,
 and ends with status 1.
@@ -25,23 +25,27 @@ from model.clock import Clock  # noqa: E402
 from model.tables import MESSAGES  # noqa: E402
 from model.text import Real, json_form  # noqa: E402
 
-STOPPED = "the program stopped"
-PATIENCE_SECONDS = 120
+PATIENCE_SECONDS = 60
 
 
 class Probectl:
     def __init__(self, path, zone):
-        self.path = path
+        self.command = [sys.executable, "-B", path] if path.endswith(".py") else [path]
         self.environment = os.environ | {"TZ": zone, "LC_ALL": "C.UTF-8"}
 
     def ask(self, subcommand, lines):
         """The answers as text, the exit status and what stood on standard error."""
-        done = subprocess.run([self.path, subcommand, "--batch"], input="".join(line + "\n" for line in lines).encode(),
-                              capture_output=True, env=self.environment, timeout=PATIENCE_SECONDS, check=False)
-        answers = done.stdout.decode("utf-8").split("\n")
+        text = "".join(line + "\n" for line in lines).encode()
+        try:
+            done = subprocess.run([*self.command, subcommand, "--batch"], input=text, capture_output=True,
+                                  env=self.environment, timeout=PATIENCE_SECONDS, check=False)
+            output, status, complaint = done.stdout, done.returncode, done.stderr.decode("utf-8", "replace")
+        except subprocess.TimeoutExpired as silence:
+            output, status, complaint = silence.stdout or b"", -1, "silent for %d s" % PATIENCE_SECONDS
+        answers = output.decode("utf-8", "backslashreplace").split("\n")
         if answers.pop() != "":
             answers.append("an answer without its line end")
-        return answers, done.returncode, done.stderr.decode("utf-8", "replace")
+        return answers, status, complaint
 
 
 # Answers.
@@ -91,6 +95,26 @@ def as_json(value):
             return {key: plain(inner) for key, inner in part.items()}
         return [plain(inner) for inner in part] if isinstance(part, list) else part
     return json.dumps(plain(value), ensure_ascii=True)
+
+
+def parting(wanted, answer, path="answer"):
+    """Where two answers part for the first time, for long ones."""
+    if isinstance(wanted, dict) and isinstance(answer, dict) and wanted.keys() == answer.keys():
+        for key in wanted:
+            if not same(wanted[key], answer[key]):
+                return parting(wanted[key], answer[key], "%s[%s]" % (path, json.dumps(key)))
+        return "%s: the entries have another order" % path
+    if isinstance(wanted, list) and isinstance(answer, list) and len(wanted) == len(answer):
+        for place, (left, right) in enumerate(zip(wanted, answer)):
+            if not same(left, right):
+                return parting(left, right, "%s[%d]" % (path, place))
+    return "%s: model %s, probectl %s" % (path, as_json(wanted), as_json(answer))
+
+
+def told_apart(question, wanted, answer):
+    whole = "model:    %s\nprobectl: %s\n" % (as_json(wanted), answer)
+    return "question: %s\n%sat:       %s" % (
+        question, whole if len(whole) < 2000 else "", parting(wanted, parsed(answer)))
 
 
 class Difference(Exception):
@@ -150,6 +174,7 @@ class DecodeRun:
         self.wildness = arguments.wildness
 
     def batch(self, rng):
+        """Questions, the answers expected and the cases behind them (None where the question is nonsense)."""
         lines, expected, cases = [], [], []
         identifiers = {handler[0]: number for number, handler in store.HANDLERS.items()}
         for _ in range(self.BATCH):
@@ -178,13 +203,15 @@ class DecodeRun:
             if not agrees(wanted, parsed(answer)):
                 raise Difference(self.explain(line, wanted, answer, case))
         if len(answers) != len(expected) or status != 0:
-            raise Difference("%d answers to %d questions, exit status %d\nlast question answered: %s\n%s" % (
-                len(answers), len(expected), status, asked[len(answers) - 1] if answers else "none", complaint))
+            lost = min(len(answers), len(expected) - 1)
+            raise Difference("%d answers to %d questions, exit status %d %s\n%s" % (
+                len(answers), len(expected), status, complaint,
+                self.explain(asked[lost], expected[lost], "nothing", cases[lost])))
         return len(expected)
 
     def explain(self, line, wanted, answer, case):
         if case is None:
-            return "question: %s\nmodel:    an error\nprobectl: %s" % (line, answer)
+            return told_apart(line, wanted, answer)
         name, nodes = case
 
         def first_failing(payloads):
@@ -195,15 +222,33 @@ class DecodeRun:
             for payload, content, reply in zip(payloads, contents, answers):
                 if not agrees(expected_decode(name, content), parsed(reply)):
                     return payload
-            return None
+            # A program that ends early ended at the first question without an answer.
+            return payloads[len(answers)] if len(answers) < len(payloads) else None
 
         if first_failing([nodes]) is None:
-            return "not seen when asked alone\nquestion: %s\nmodel:    %s\nprobectl: %s" % (
-                line, as_json(wanted), answer)
+            return "not seen when asked alone\n" + told_apart(line, wanted, answer)
         content = shrink(flatten(shrink(nodes, smaller_trees, first_failing)), smaller_bytes, first_failing)
         reply = self.probectl.ask("decode", [name + " " + (content.hex() or "-")])[0]
-        return "question: %s %s\nmodel:    %s\nprobectl: %s\nfound in: %s" % (
-            name, content.hex() or "-", as_json(expected_decode(name, content)), "\n".join(reply), line)
+        question = name + " " + (content.hex() or "-")
+        return told_apart(question, expected_decode(name, content), "\n".join(reply)) + "\nfound in: " + line
+
+
+class SweepRun(DecodeRun):
+    """Not random: every small field number of every class as a varint and as a record, whether the model knows the
+    field or not, and every small value of every enumeration."""
+
+    NUMBERS = range(41)
+    VALUES = [*range(-1, 261), 2**31 - 1, -(2**31)]
+
+    def batch(self, rng):
+        values = ((0, b"\x05"), (2, b"\x02\x08\x05"))
+        cases = [(name, [wire.to_varint(number * 8 + form) + value])
+                 for name in MESSAGES for number in self.NUMBERS for form, value in values]
+        cases += [(name, [wire.to_varint(field.number * 8) + wire.to_varint(value)])
+                  for name, fields in MESSAGES.items() for field in fields.values() if field.kind == "choice"
+                  for value in self.VALUES]
+        return ([name + " " + flatten(nodes).hex() for name, nodes in cases],
+                [expected_decode(name, flatten(nodes)) for name, nodes in cases], cases)
 
 
 # store --batch
@@ -289,38 +334,44 @@ class StoreRun:
             commands += generator.story(rng, wildness, self.LENGTH) + [("reset",)]
         while commands:
             model = Told(commands, self.zone)
-            self.check(commands[:len(model.answers)], model, rng)
             told += len(model.answers)
+            self.check(commands[:len(model.answers)], model, rng)
             commands = commands[len(model.answers):]
         return told
 
     def check(self, commands, model, rng):
-        lines = [line_of(command, rng) for command in commands]
-        if self.differs(lines, model) is None:
+        found = self.differs([line_of(command, rng) for command in commands], model)
+        if found is None:
             return
-        smallest = shrink(commands, self.smaller_stories, self.first_failing)
-        model = Told(smallest, self.zone)
-        smallest = smallest[:len(model.answers)]
+        # What follows the difference plays no part, and what stands before the last reset hardly ever does.
+        place, report = found
+        story = commands[:place + 1]
+        last_story = story[max((at + 1 for at, command in enumerate(story[:-1]) if command == ("reset",)), default=0):]
+        start = self.first_failing([last_story, story, commands])
+        if start is None:
+            raise Difference("not seen a second time\n" + report)
+        smallest = shrink(start, self.smaller_stories, self.first_failing)
         lines = [line_of(command) for command in smallest]
-        where = self.differs(lines, model)
-        raise Difference("story:\n  %s\n%s" % ("\n  ".join(lines), where or "not seen in the smallest story again"))
+        place, report = self.differs(lines, Told(smallest, self.zone)) or (0, report)
+        raise Difference("story:\n  %s\n%s" % ("\n  ".join(lines), report))
 
     def differs(self, lines, model):
-        """Where probectl and the model part, as text, or None."""
+        """Where probectl and the model part, as a place among the lines and a text, or None."""
+        lines = lines[:len(model.answers)]
         # One more question after a fatal stop: nothing may answer it.
         answers, status, complaint = self.probectl.ask("store", lines + ["trigger"] if model.fatal else lines)
         for place, (line, wanted, answer) in enumerate(zip(lines, model.answers, answers)):
             if not agrees(wanted, parsed(answer)):
-                return "question: %s\nmodel:    %s\nprobectl: %s" % (line, as_json(wanted), answer)
+                return place, told_apart(line, wanted, answer)
         if len(answers) != len(model.answers) or (status != 0) != model.fatal or status < 0:
-            return "%d answers where the model has %d; exit status %d where the model %s\n%s" % (
-                len(answers), len(model.answers), status, STOPPED if model.fatal else "goes on", complaint)
+            report = "%d answers, the model has %d; exit status %d, the model %s\n%s"
+            return min(len(answers), len(lines) - 1), report % (
+                len(answers), len(model.answers), status, "stops" if model.fatal else "goes on", complaint)
         return None
 
     def first_failing(self, stories):
         for commands in stories:
-            model = Told(commands, self.zone)
-            if self.differs([line_of(command) for command in commands[:len(model.answers)]], model) is not None:
+            if self.differs([line_of(command) for command in commands], Told(commands, self.zone)) is not None:
                 return commands
         return None
 
@@ -346,19 +397,21 @@ class StoreRun:
 def main():
     parser = argparse.ArgumentParser(description=__doc__, formatter_class=argparse.RawDescriptionHelpFormatter)
     parser.add_argument("probectl")
-    parser.add_argument("subcommand", choices=["decode", "store"])
+    parser.add_argument("subcommand", choices=["decode", "sweep", "store"])
     parser.add_argument("--seed", default="1", help="a number, or 'random'")
     parser.add_argument("--count", type=int, default=0, help="how many answers at least; 0: no bound")
     parser.add_argument("--seconds", type=float, default=0, help="for how long; 0: no bound")
     parser.add_argument("--zone", default="UTC", help="the time zone, as TZ names it")
     parser.add_argument("--wildness", type=float, help="from 0, well-formed payloads only, to 1")
     arguments = parser.parse_args()
-    if not arguments.count and not arguments.seconds:
+    if arguments.subcommand == "sweep":
+        arguments.count = 1
+    elif not arguments.count and not arguments.seconds:
         arguments.count = 10000
 
     seed = random.SystemRandom().getrandbits(32) if arguments.seed == "random" else int(arguments.seed)
     probectl = Probectl(arguments.probectl, arguments.zone)
-    run = (DecodeRun if arguments.subcommand == "decode" else StoreRun)(probectl, arguments)
+    run = {"decode": DecodeRun, "sweep": SweepRun, "store": StoreRun}[arguments.subcommand](probectl, arguments)
     begin, compared, batch = time.monotonic(), 0, 0
     while (not arguments.count or compared < arguments.count) and (
             not arguments.seconds or time.monotonic() - begin < arguments.seconds):

@@ -1,8 +1,8 @@
 # SPDX-License-Identifier: Apache-2.0
 """Random payloads, events and questions. Everything comes from the random.Random that is handed in.
 
-A payload is a tree: a list of nodes, each either bytes or a Record, whose length is made when the tree is flattened. So a
-failing payload can be made smaller by taking nodes away without breaking the lengths around them.
+A payload is a tree: a list of nodes, each either bytes or a Record, whose length is made when the tree is flattened. So
+a failing payload can be made smaller by taking nodes away without breaking the lengths around them.
 """
 
 from model import pages, store
@@ -15,9 +15,9 @@ SIGNED_CORNERS = [0, -1, 1, -2, 50, -99, 99, -100, 100, -101, -140, -199, -1050,
                   116 - 2**31, 115 - 2**31, 139 - 2**31, 140 - 2**31]
 MOMENTS = [0, 1, 999, 1000, 1711846799999, 1711846800000, 1729990799999, 1729990800000, 1729994400000, 253402300799999,
            253402300800000, 2**53, 2**53 + 1, 13569465600000, 2**63, EVERY_BIT]
-TEXTS = [b"", b"internet", b'say "hi"\\', b"line\nline\r\tend", b"\x00\x01\x1f\x7f", "Grüße ☎ 𝄞".encode(), "\u0085\u2028\ufeff".encode(),
-         b"\xc3(", b"\xff\xfe", b"\xe2\x82", b"\xed\xa0\x80", b"\xf0\x9f\x98", b"\xc0\x80", b"\xf4\x90\x80\x80", b"a\xe2\x82\xacb\xe2\x28\xa1",
-         b"x" * 31, b"y" * 200]
+TEXTS = [b"", b"internet", b'say "hi"\\', b"line\nline\r\tend", b"\x00\x01\x1f\x7f", "Grüße ☎ 𝄞".encode(),
+         "\u0085\u2028\ufeff".encode(), b"\xc3(", b"\xff\xfe", b"\xe2\x82", b"\xed\xa0\x80", b"\xf0\x9f\x98",
+         b"\xc0\x80", b"\xf4\x90\x80\x80", b"a\xe2\x82\xacb\xe2\x28\xa1", b"x" * 31, b"y" * 200]
 
 
 class Record:
@@ -219,6 +219,12 @@ EXTRA_PAGE_KEYS = ["UMTS Serving Cell Measurement", "Connected Serv Cell Meas", 
                    "GSM GPRS Config", "lte nas", "LTE  NAS", "LTE NAS ", "Anything at all"]
 
 
+# Lines that are to be answered with an error.
+NONSENSE = ["dict myNoSuchDict", "record CDMA", "event", "event 0x3CD302", "event 0x3CD302 0", "event 0x3CD302 0g",
+            "event x 00", "events 1 00", "event 0x3CD302 00 00", "event 99999999999999999999 00", "state all", "dict",
+            "record", "reset now", "EVENT 0x3CD302 -", "trigger 1", "pages 1"]
+
+
 def story(random, wildness, length):
     commands = []
     payloads = Payloads(random, wildness)
@@ -247,8 +253,5 @@ def story(random, wildness, length):
         elif roll < 0.98:
             commands.append(("reset",))
         else:
-            commands.append(("nonsense", random.choice([
-                "dict myNoSuchDict", "record CDMA", "event", "event 0x3CD302", "event 0x3CD302 0", "event 0x3CD302 0g",
-                "event x 00", "events 1 00", "event 0x3CD302 00 00", "event 99999999999999999999 00", "state all", "dict",
-                "record", "reset now", "EVENT 0x3CD302 -", "trigger 1", "pages 1"])))
+            commands.append(("nonsense", random.choice(NONSENSE)))
     return commands

@@ -1,7 +1,7 @@
 #!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
-"""Vectors made by hand, so that a mistake that the model and the programs share is less likely. The meaning of each stands
-above it; the bytes were put together with pencil and paper from the published encoding."""
+"""Vectors made by hand, so that a mistake that the model and the programs share is less likely. The meaning of each
+stands above it; the bytes were put together by hand from the published encoding."""
 
 import os
 import sys
@@ -148,8 +148,8 @@ class Unknown(Vectors):
 
     def test_field_19_is_dropped_as_a_metric_identifier(self):
         # Thresh_serving_lowQ is field 19: 19 * 8 = 152 = 0x98 -> 98 01
-        self.expect("KCellularLteSelReselCellInfo", "9801 05 a001 06", {"priority_operating_freq": 6}, reencoded="a001 06",
-                    log=["valid metricId tag", "Unknown tag: 13:5"])
+        self.expect("KCellularLteSelReselCellInfo", "9801 05 a001 06", {"priority_operating_freq": 6},
+                    reencoded="a001 06", log=["valid metricId tag", "Unknown tag: 13:5"])
 
     def test_a_metric_identifier_is_dropped_with_its_low_32_bits_logged(self):
         # 0xD302 * 8 = 0x69810 -> 90 b0 1a; the value is 2^32 + 9
@@ -168,7 +168,8 @@ class Unknown(Vectors):
 class Nested(Vectors):
     def test_two_elements(self):
         self.expect("KCellularLteTxPower", "0801 12 04 0803 1002 12 02 1807",
-                    {"timestamp": 1, "tx_power_info": [{"pucch_tx_power": -2, "pusch_tx_power": 1}, {"subframe_index": 7}]})
+                    {"timestamp": 1, "tx_power_info": [{"pucch_tx_power": -2, "pusch_tx_power": 1},
+                                                       {"subframe_index": 7}]})
 
     def test_an_empty_element_is_an_element(self):
         self.expect("KCellularLteTxPower", "1200", {"tx_power_info": [{}]})
@@ -177,16 +178,16 @@ class Nested(Vectors):
         self.expect("KCellularLteTxPower", "12 03 1807", {"tx_power_info": [{}]}, complete=False, reencoded="1200")
 
     def test_a_fault_inside_an_element_keeps_what_was_read(self):
-        self.expect("KCellularLteTxPower", "12 03 1807 08 1801", {"tx_power_info": [{"pucch_tx_power": 0, "subframe_index": 7}]},
-                    complete=False, reencoded="12 04 0800 1807")
+        self.expect("KCellularLteTxPower", "12 03 1807 08 1801",
+                    {"tx_power_info": [{"pucch_tx_power": 0, "subframe_index": 7}]}, complete=False, reencoded="12 04 0800 1807")
 
     def test_a_length_counts_up_to_the_enclosing_record_only(self):
         # In a GUTI's place an area identity whose bytes field says 2 bytes but only 1 belongs to the record.
         self.expect("KCellularMmContext", "22 03 0a 02 62 2801", {"lai": {}}, complete=False, reencoded="2200")
 
     def test_after_an_end_of_a_group_in_an_element_reading_goes_on_at_its_end(self):
-        self.expect("KCellularLteTxPower", "12 05 1807 0c 1809 0805", {"timestamp": 5, "tx_power_info": [{"subframe_index": 7}]},
-                    reencoded="0805 12 02 1807")
+        self.expect("KCellularLteTxPower", "12 05 1807 0c 1809 0805",
+                    {"timestamp": 5, "tx_power_info": [{"subframe_index": 7}]}, reencoded="0805 12 02 1807")
 
     def test_a_second_single_message_replaces_the_first(self):
         # GUTI with mmegi 1, then GUTI with mmec 2.
@@ -254,7 +255,7 @@ class Tables(unittest.TestCase):
     def test_every_detail_is_there(self):
         for fields in MESSAGES.values():
             for field in fields.values():
-                self.assertIn(field.kind, {"uint64", "uint32", "sint32", "choice", "bool", "bytes", "string", "message"})
+                self.assertIn(field.kind, "uint64 uint32 sint32 choice bool bytes string message".split())
                 if field.kind in ("choice", "message"):
                     self.assertIn(field.detail, CHOICES if field.kind == "choice" else MESSAGES)
                 else:
@@ -267,13 +268,15 @@ class Tables(unittest.TestCase):
 
 class TextForms(unittest.TestCase):
     def test_values(self):
-        self.assertEqual(printed({"a": 1, "b": "x", "c": [1, 4], "d": b"\x62\xf2\x10", "e": b"", "f": True, "g": [], "h": {}}),
-                         '["a": 1, "b": "x", "c": [1, 4], "d": <62f210>, "e": <>, "f": 1, "g": [], "h": []]')
+        self.assertEqual(printed({"a": 1, "b": "x", "c": [1, 4], "d": b"\x62\xf2\x10", "e": b"", "f": True, "g": []}),
+                         '["a": 1, "b": "x", "c": [1, 4], "d": <62f210>, "e": <>, "f": 1, "g": []]')
+        self.assertEqual(printed({}), "[]")
         self.assertEqual([printed(real) for real in (1.4, 10.0, -9.5, 0.0, -0.01, 2147483628.0)],
                          ["1.4", "10.0", "-9.5", "0.0", "-0.01", "2147483628.0"])
 
     def test_a_printed_text_stays_on_its_line(self):
-        self.assertEqual(printed('\\ " \n \r \t \0 \x1b \x7f \x85 ü'), '"\\\\ \\" \\n \\r \\t \\0 \\u{1b} \\u{7f} \x85 ü"')
+        self.assertEqual(printed('\\ " \n \r \t \0 \x1b \x7f \x85 ü'),
+                         '"\\\\ \\" \\n \\r \\t \\0 \\u{1b} \\u{7f} \x85 ü"')
 
     def test_a_cell_is_bare(self):
         self.assertEqual(bare("a\n\"b\""), "a\n\"b\"")
@@ -353,7 +356,8 @@ class Stores(unittest.TestCase):
     def test_a_carrier(self):
         # index 3 of the bandwidths; rsrp -9550 -> -95, rsrq -1050 -> -10.5
         self.event(0x3CD313, "12 09 3003 58 9b9501 60 b310")
-        self.assertEqual(self.store.records["LTE"]["CAStatusList"], [{"dl_bandwidth": 10.0, "rsrp": -95, "rsrq": -10.5}])
+        self.assertEqual(self.store.records["LTE"]["CAStatusList"],
+                         [{"dl_bandwidth": 10.0, "rsrp": -95, "rsrq": -10.5}])
         self.assertEqual(self.store.dicts["myLTECAStatusDict"]["scc_list"],
                          [{"dl_bandwidth": 3, "rsrp": -9550, "rsrq": -1050}])
 
@@ -363,7 +367,8 @@ class Stores(unittest.TestCase):
             'Received LTE Cell Resel Info is ["timestamp": 0, "multi_band_info": [3, 7], "priority_operating_freq": 5, '
             '"nbr_eutra": [["earfcn": 5, "dl_bw": 6]]]', "[3, 7]"])
         known = self.store.records["LTE"]["SelReselCellInfo"]
-        self.assertEqual((known["priority_operating_freq"], known["multi_band_info"], known["Q_hyst"]), (5, "[3, 7]", ""))
+        self.assertEqual((known["priority_operating_freq"], known["multi_band_info"], known["Q_hyst"]),
+                         (5, "[3, 7]", ""))
         self.event(0x3CD30E, "6801")
         known = self.store.records["LTE"]["SelReselCellInfo"]
         self.assertEqual((known["priority_operating_freq"], known["multi_band_info"], known["Q_hyst"], len(known)),

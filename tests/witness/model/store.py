@@ -1,7 +1,7 @@
 # SPDX-License-Identifier: Apache-2.0
 """The store: which metric goes where, what is rewritten, what is logged, and when the program stops.
 
-A handler is a list of steps. Each step takes the store and the name of the display dictionary and changes what it is for.
+A handler is a list of steps. Each step takes the store and the name of the display dictionary and does its one thing.
 """
 
 from . import wire

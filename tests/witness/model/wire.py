@@ -1,8 +1,8 @@
 # SPDX-License-Identifier: Apache-2.0
 """Payloads to messages and back.
 
-A message is its class's name and a dictionary from field number to what was read. A fault anywhere ends everything; what
-was read before it stays, because every part is attached to its parent before it is filled.
+A message is its class's name and a dictionary from field number to what was read. A fault anywhere ends everything;
+what was read before it stays, because every part is attached to its parent before it is filled.
 """
 
 from .tables import CHOICES, MESSAGES, METRIC_TAGS
