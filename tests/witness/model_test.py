@@ -179,7 +179,8 @@ class Nested(Vectors):
 
     def test_a_fault_inside_an_element_keeps_what_was_read(self):
         self.expect("KCellularLteTxPower", "12 03 1807 08 1801",
-                    {"tx_power_info": [{"pucch_tx_power": 0, "subframe_index": 7}]}, complete=False, reencoded="12 04 0800 1807")
+                    {"tx_power_info": [{"pucch_tx_power": 0, "subframe_index": 7}]}, complete=False,
+                    reencoded="12 04 0800 1807")
 
     def test_a_length_counts_up_to_the_enclosing_record_only(self):
         # In a GUTI's place an area identity whose bytes field says 2 bytes but only 1 belongs to the record.
