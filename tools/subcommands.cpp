@@ -1,8 +1,12 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/subcommand.h"
 
+#include "tools/config_command.h"
 #include "tools/decode_command.h"
+#include "tools/query_command.h"
+#include "tools/status_command.h"
 #include "tools/store_command.h"
+#include "tools/watch_command.h"
 
 namespace probeview {
 
@@ -10,8 +14,7 @@ namespace {
 
 // One line for each file; nothing else knows which subcommands there are.
 constexpr AddSubcommand subcommands[] = {
-    addDecodeCommand,
-    addStoreCommand,
+    addStatusCommand, addWatchCommand, addQueryCommand, addConfigCommand, addDecodeCommand, addStoreCommand,
 };
 
 }  // namespace

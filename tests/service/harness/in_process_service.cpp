@@ -61,6 +61,7 @@ class InProcessService final : public TestService {
     return std::move(near);
   }
 
+  std::string socketPath() const override { return {}; }
   Service& service() override { return *service_; }
 
  private:

@@ -82,7 +82,7 @@ class SocketService final : public TestService {
     thread_ = std::make_unique<LoopThread>("test.service");
     onService([this] {
       ServiceLog log(log_, LogLevel::Debug);
-      auto socket = ListeningSocket::make(path());
+      auto socket = ListeningSocket::make(socketPath());
       if (!socket.socket) throw std::runtime_error(socket.error);
       service_ = std::make_unique<Service>(thread_->loop(), log, settings_);
       service_->addSource(std::make_unique<ScriptedSource>(script_));
@@ -97,13 +97,13 @@ class SocketService final : public TestService {
     return std::move(radix::makeSocketConnector(loop_, surroundings())->connect().link);
   }
 
+  std::string socketPath() const override { return folder_.path() + "/radixd.sock"; }
   Service& service() override { return *service_; }
 
  private:
-  std::string path() const { return folder_.path() + "/radixd.sock"; }
   radix::SocketSurroundings surroundings() const {
     radix::SocketSurroundings surroundings;
-    surroundings.namedSocket = path();
+    surroundings.namedSocket = socketPath();
     return surroundings;
   }
 

@@ -35,6 +35,8 @@ class TestService {
   // Connects by hand, to say what no manager would say. The link lives on queue()'s thread.
   virtual std::unique_ptr<radix::Link> rawLink() = 0;
 
+  // Where programs find it; empty in process.
+  virtual std::string socketPath() const = 0;
   virtual Service& service() = 0;
   Script& script() { return *script_; }
   // To be read on the service's thread.

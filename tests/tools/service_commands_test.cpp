@@ -1,0 +1,177 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// The subcommands that talk to the service, against a service behind a real socket.
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include <fstream>
+#include <nlohmann/json.hpp>
+#include <sstream>
+
+#include "messages/metric_identifiers.h"
+#include "tests/service/harness/temporary_folder.h"
+#include "tests/service/harness/test_service.h"
+#include "tools/personal_data.h"
+#include "tools/probectl.h"
+#include "values/printer.h"
+
+namespace probeview {
+namespace {
+
+using std::chrono::milliseconds;
+using ::testing::HasSubstr;
+using ::testing::StartsWith;
+
+struct Outcome {
+  int status;
+  std::string output;
+  std::string errors;
+};
+
+class ServiceCommands : public ::testing::Test {
+ protected:
+  ServiceCommands() {
+    world_->script().origin = "scripted";
+    world_->script().metrics = {K_SIM_FILE_INFO, K_LTE_RRC_STATE, K_CELLULAR_MM_CTXT};
+    world_->kill();
+    world_->restart();
+  }
+
+  Outcome probectl(std::vector<std::string> arguments) {
+    arguments.insert(arguments.begin(), {"--socket", world_->socketPath()});
+    std::istringstream in;
+    std::ostringstream out;
+    std::ostringstream err;
+    const int status = runProbectl(arguments, in, out, err);
+    return {status, out.str(), err.str()};
+  }
+
+  std::optional<MetricPlan> plan() {
+    std::optional<MetricPlan> seen;
+    world_->onService([&] { seen = world_->script().plan; });
+    return seen;
+  }
+
+  std::unique_ptr<TestService> world_ = makeSocketService();
+};
+
+TEST_F(ServiceCommands, WatchPrintsEachRecordAsALineForAPerson) {
+  world_->emit(K_LTE_RRC_STATE, {0x10, 3}, milliseconds(1709640000000));
+  const Outcome outcome = probectl({"watch", "--count", "1"});
+  EXPECT_EQ(outcome.status, 0);
+  EXPECT_EQ(outcome.output,
+            "2024-03-05 12:00:00 UTC  scripted  K_LTE_RRC_STATE  [\"state\": \"KLTE_RRC_STATE_CONNECTED\"]\n");
+}
+
+TEST_F(ServiceCommands, WatchPrintsRecordsThatComeWhileItListens) {
+  world_->onService([&] {
+    world_->script().onListening = [this](bool listening) {
+      if (listening) world_->script().emit(K_LTE_RRC_STATE, {0x10, 1});
+    };
+  });
+  EXPECT_THAT(probectl({"watch", "--count", "1"}).output, HasSubstr("KLTE_RRC_STATE_IDLE"));
+}
+
+TEST_F(ServiceCommands, WatchAsJsonPrintsOneObjectALineWithItsKeysInOrder) {
+  world_->emit(K_LTE_RRC_STATE, {0x10, 3}, milliseconds(1709640000123));
+  world_->emit(77, {1, 2}, milliseconds(5));
+  const Outcome outcome = probectl({"watch", "--json", "--count", "2"});
+  EXPECT_EQ(outcome.output,
+            "{\"time\":1709640000123,\"origin\":\"scripted\",\"metric\":\"K_LTE_RRC_STATE\",\"id\":3952132,"
+            "\"dict\":{\"state\":\"KLTE_RRC_STATE_CONNECTED\"}}\n"
+            "{\"time\":5,\"origin\":\"scripted\",\"metric\":\"0x4D\",\"id\":77,\"dict\":null}\n");
+}
+
+TEST_F(ServiceCommands, PersonalFieldsShowAsAnEllipsisUnlessAskedFor) {
+  // tmsi (field 5) 7, reject_cause left out.
+  world_->emit(K_CELLULAR_MM_CTXT, {0x28, 7});
+  EXPECT_THAT(probectl({"watch", "--count", "1"}).output, HasSubstr("[\"tmsi\": \"…\"]"));
+  EXPECT_THAT(probectl({"watch", "--count", "1", "--personal"}).output, HasSubstr("[\"tmsi\": 7]"));
+  EXPECT_THAT(probectl({"watch", "--count", "1", "--json"}).output, HasSubstr("{\"tmsi\":\"…\"}"));
+}
+
+TEST(PersonalData, IsHiddenHoweverDeepItLies) {
+  Dictionary dictionary{
+      {"imsi", Value::text("001010000000001")},
+      {"guti", Dictionary{{"m_tmsi", std::uint32_t{5}}}},
+      {"bearer_contexts", List{Dictionary{{"cid", std::uint32_t{1}}, {"pdp_addr", Value::text("x")}}}},
+      {"ef_list", List{Dictionary{{"ef_id", std::uint32_t{28423}}, {"content", Value::text("y")}}}},
+  };
+  hidePersonalData(dictionary);
+  EXPECT_EQ(printed(dictionary),
+            "[\"imsi\": \"…\", \"guti\": \"…\", \"bearer_contexts\": [[\"cid\": 1, \"pdp_addr\": \"…\"]], "
+            "\"ef_list\": [[\"ef_id\": 28423, \"content\": \"…\"]]]");
+}
+
+TEST_F(ServiceCommands, QueryPrintsTheAnswerAndNotTheRecordFromBefore) {
+  world_->emit(K_LTE_RRC_STATE, {0x10, 1});
+  world_->onService([&] {
+    world_->script().onQuery = [this](std::int64_t metric) {
+      world_->script().emit(metric, {0x10, 3});
+      return true;
+    };
+  });
+  const Outcome outcome = probectl({"query", "K_LTE_RRC_STATE"});
+  EXPECT_EQ(outcome.status, 0);
+  EXPECT_THAT(outcome.output, HasSubstr("KLTE_RRC_STATE_CONNECTED"));
+  EXPECT_EQ(std::count(outcome.output.begin(), outcome.output.end(), '\n'), 1);
+  EXPECT_EQ(probectl({"query", "0x3C4E04", "--json"}).status, 0);
+}
+
+TEST_F(ServiceCommands, AQueryThatNoSourceCanFillEndsWithStatusOneAndTheReason) {
+  const Outcome outcome = probectl({"query", "K_LTE_TX_POWER"});
+  EXPECT_EQ(outcome.status, 1);
+  EXPECT_EQ(outcome.output, "");
+  EXPECT_EQ(outcome.errors, "probectl: no source can fill K_LTE_TX_POWER (0x3CD302)\n");
+  EXPECT_EQ(probectl({"query", "K_NOBODY_KNOWS"}).status, 2);
+}
+
+TEST_F(ServiceCommands, ConfigPushSetsTheBaseConfigurationAndClearTakesItAway) {
+  const TemporaryFolder folder;
+  const std::string path = folder.path() + "/base.deviceconfig";
+  std::ofstream(path) << "[metrics]\nK_LTE_RRC_STATE = 400\n";
+  EXPECT_EQ(probectl({"config", "push", path}).status, 0);
+  ASSERT_TRUE(plan());
+  EXPECT_EQ(plan()->metrics.at(K_LTE_RRC_STATE), milliseconds(400));
+  EXPECT_EQ(probectl({"config", "clear"}).status, 0);
+  EXPECT_EQ(plan(), std::nullopt);
+}
+
+TEST_F(ServiceCommands, AConfigurationThatIsRefusedOrCannotBeReadEndsWithStatusOneAndTheReason) {
+  const TemporaryFolder folder;
+  const std::string path = folder.path() + "/bad.deviceconfig";
+  std::ofstream(path) << "[metrics\n";
+  const Outcome refused = probectl({"config", "push", path});
+  EXPECT_EQ(refused.status, 1);
+  EXPECT_THAT(refused.errors, HasSubstr("line 1"));
+  EXPECT_EQ(probectl({"config", "push", folder.path()}).errors,
+            "probectl: cannot read " + folder.path() + ": Is a directory\n");
+  EXPECT_THAT(probectl({"config", "push", folder.path() + "/none"}).errors, HasSubstr("No such file"));
+  EXPECT_EQ(probectl({"config"}).status, 2);
+}
+
+TEST_F(ServiceCommands, StatusShowsSourcesAndClients) {
+  world_->emit(K_LTE_RRC_STATE, {0x10, 1});
+  const Outcome outcome = probectl({"status"});
+  EXPECT_EQ(outcome.status, 0);
+  EXPECT_THAT(outcome.output, StartsWith("radixd " PROBEVIEW_VERSION ", up for "));
+  EXPECT_THAT(outcome.output, HasSubstr("  scripted: 1 records, "));
+  EXPECT_THAT(outcome.output, HasSubstr("'probectl'"));
+  const auto json = nlohmann::json::parse(probectl({"status", "--json"}).output);
+  EXPECT_EQ(json.at("sources").at(0).at("records"), 1);
+  EXPECT_EQ(json.at("clients").at(0).at("name"), "probectl");
+}
+
+TEST_F(ServiceCommands, WithoutAServiceEachSaysSoAndEndsWithStatusOne) {
+  const std::string path = world_->socketPath();
+  world_->kill();
+  for (const std::vector<std::string>& arguments :
+       {std::vector<std::string>{"status"}, {"query", "K_LTE_RRC_STATE"}, {"config", "clear"}}) {
+    const Outcome outcome = probectl(arguments);
+    EXPECT_EQ(outcome.status, 1);
+    EXPECT_EQ(outcome.errors, "probectl: no baseband service at " + path + "; start radixd or set RADIXD_SOCKET\n");
+  }
+}
+
+}  // namespace
+}  // namespace probeview

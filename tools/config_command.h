@@ -1,0 +1,11 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include "tools/subcommand.h"
+
+namespace probeview {
+
+// probectl config: the service's base configuration.
+void addConfigCommand(CLI::App& program, Tool& tool);
+
+}  // namespace probeview

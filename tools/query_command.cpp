@@ -1,0 +1,72 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "tools/query_command.h"
+
+#include <chrono>
+#include <memory>
+#include <optional>
+#include <ostream>
+#include <string>
+
+#include "tools/batch.h"
+#include "tools/record_text.h"
+#include "tools/service_client.h"
+
+namespace probeview {
+
+namespace {
+
+// How long a source may take; a modem reads files from a card for it.
+constexpr std::chrono::seconds answerDeadline{5};
+
+struct Options {
+  std::string metric;
+  RecordText::Options text;
+};
+
+ExitStatus query(const Options& options, Tool& tool) {
+  const std::optional<std::int64_t> metric = metricOnCommandLine(options.metric);
+  if (!metric) {
+    tool.errors << "probectl: " << quotedExcerpt(options.metric) << " is no metric and no metric's identifier\n";
+    return ExitStatus::UsageError;
+  }
+  ServiceClient client(tool);
+  std::optional<Dictionary> answer;
+  client.listen([&](const Dictionary& event) {
+    const Value* id = event.find(radix::kKeyMetricID);
+    if (id != nullptr && id->int64() == metric) answer = event;
+  });
+  // The last records come first; they are no answer.
+  if (const ExitStatus status = client.drain(); status != ExitStatus::Success) return status;
+  answer.reset();
+  const Dictionary arguments{{radix::kKeyAppID, std::int64_t{2}}, {radix::kKeyMetricID, *metric}};
+  const ExitStatus status = client.perform(radix::kCommandQueryMetric, arguments);
+  if (status != ExitStatus::Success) return status;
+  if (!client.loop().runUntil([&answer] { return answer.has_value(); }, answerDeadline)) {
+    tool.errors << "probectl: the service took the query, but no record came within " << answerDeadline.count()
+                << " s\n";
+    return ExitStatus::Failure;
+  }
+  tool.output << RecordText(options.text).line(*answer) << '\n';
+  tool.output.flush();
+  return ExitStatus::Success;
+}
+
+}  // namespace
+
+void addQueryCommand(CLI::App& program, Tool& tool) {
+  CLI::App* command = program.add_subcommand("query", "Ask the service to report one metric now");
+  auto options = std::make_shared<Options>();
+  command->add_option("METRIC", options->metric, "A metric, or a metric's identifier (decimal or 0x…)")->required();
+  command->add_flag("--json", options->text.json, "One JSON object instead of text, as watch prints it");
+  command->add_flag("--personal", options->text.personal,
+                    "Show IMSI, TMSI, GUTI, addresses and SIM contents, which are … otherwise");
+  command->footer(
+      "Prints the record that answers. Exit status 1 when no source can fill the metric.\n"
+      "\n"
+      "Examples:\n"
+      "  probectl query K_SIM_FILE_INFO\n"
+      "  probectl query 0x3C4E04 --json");
+  command->callback([options, &tool] { tool.run = [options, &tool] { return query(*options, tool); }; });
+}
+
+}  // namespace probeview

@@ -1,0 +1,11 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include "tools/subcommand.h"
+
+namespace probeview {
+
+// probectl query: one metric, now.
+void addQueryCommand(CLI::App& program, Tool& tool);
+
+}  // namespace probeview

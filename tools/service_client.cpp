@@ -1,0 +1,45 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "tools/service_client.h"
+
+#include <ostream>
+#include <utility>
+
+#include "radix/service_commands.h"
+
+namespace probeview {
+
+ServiceClient::ServiceClient(Tool& tool)
+    : tool_(tool), loop_(std::make_shared<EventLoop>()), manager_(radix::client::CreateManager("probectl", loop_)) {}
+
+ExitStatus ServiceClient::perform(std::string_view command, const Dictionary& arguments, Dictionary* reply) {
+  radix::client::ObjectHandle answer;
+  const radix::client::Result result = radix::client::PerformCommand(manager_, command, arguments, answer);
+  if (result.status != 0) {
+    tool_.errors << "probectl: " << result.message << '\n';
+    return ExitStatus::Failure;
+  }
+  if (reply != nullptr && answer) *reply = radix::client::nativeDictionary(*answer);
+  return ExitStatus::Success;
+}
+
+void ServiceClient::listen(std::function<void(const Dictionary& event)> take) {
+  radix::client::RegisterEventHandler(
+      manager_, radix::kEventMetric,
+      [take = std::move(take)](const radix::client::ObjectHandle& event, radix::client::Group) {
+        take(radix::client::nativeDictionary(*event));
+      });
+  radix::client::EventsOn(manager_);
+}
+
+ExitStatus ServiceClient::drain() {
+  // A reply may overtake events; the events that one has overtaken have come when the next but one has.
+  for (int round = 0; round < 3; ++round) {
+    if (const ExitStatus status = perform(radix::kCommandShowStatus, {}); status != ExitStatus::Success) return status;
+  }
+  bool done = false;
+  loop_->post([&done] { done = true; });
+  loop_->runUntil([&done] { return done; }, std::chrono::seconds(2));
+  return ExitStatus::Success;
+}
+
+}  // namespace probeview
