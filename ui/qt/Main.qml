@@ -123,13 +123,16 @@ ApplicationWindow {
         }
     }
 
-    // Whoever touches the screen or the mouse needs no ring around the current row.
-    PointHandler {
-        parent: window.contentItem
-        acceptedButtons: Qt.AllButtons
-        onActiveChanged: {
-            if (active)
-                window.keyboardUsed = false;
+    Item {
+        anchors.fill: parent
+
+        // Whoever touches the screen or the mouse needs no ring around the current row.
+        PointHandler {
+            acceptedButtons: Qt.AllButtons
+            onActiveChanged: {
+                if (active)
+                    window.keyboardUsed = false;
+            }
         }
     }
 

@@ -62,5 +62,5 @@ QtObject {
     readonly property int focusWidth: 2
 
     // Milliseconds that a page takes to slide in.
-    readonly property int slide: 160
+    property int slide: 160
 }

@@ -2,6 +2,7 @@
 #include "ui/qt/appearance.h"
 
 #include <QDBusMessage>
+#include <QDBusMetaType>
 #include <QDBusPendingCallWatcher>
 #include <QDBusPendingReply>
 #include <QEvent>
@@ -10,7 +11,6 @@
 #include <QGuiApplication>
 #include <QPalette>
 #include <algorithm>
-#include <utility>
 
 namespace probeview::qt {
 
@@ -36,18 +36,21 @@ double fontScale() { return std::max(1.0, QFontInfo(QGuiApplication::font()).pix
 
 }  // namespace
 
-Appearance::Appearance(const QDBusConnection& bus, const QString& service) : bus_(bus) {
+Appearance::Appearance(const QDBusConnection& bus) : bus_(bus) {
   qGuiApp->installEventFilter(this);
   decide();
   if (!bus_.isConnected()) return;
-  bus_.connect(service, QString::fromLatin1(portalPath), QString::fromLatin1(portalInterface),
-               QStringLiteral("SettingChanged"), this, SLOT(settingChanged(QString, QString, QDBusVariant)));
-  ask(service, appearanceNamespace, colorSchemeKey);
-  ask(service, interfaceNamespace, textScaleKey);
+  // Qt registers this type only with the first call; until then it refuses a slot that takes one.
+  qDBusRegisterMetaType<QDBusVariant>();
+  bus_.connect(QString::fromLatin1(portalService), QString::fromLatin1(portalPath),
+               QString::fromLatin1(portalInterface), QStringLiteral("SettingChanged"), this,
+               SLOT(settingChanged(QString, QString, QDBusVariant)));
+  ask(appearanceNamespace, colorSchemeKey);
+  ask(interfaceNamespace, textScaleKey);
 }
 
-void Appearance::ask(const QString& service, const QString& nameSpace, const QString& key) {
-  auto call = QDBusMessage::createMethodCall(service, QString::fromLatin1(portalPath),
+void Appearance::ask(const QString& nameSpace, const QString& key) {
+  auto call = QDBusMessage::createMethodCall(QString::fromLatin1(portalService), QString::fromLatin1(portalPath),
                                              QString::fromLatin1(portalInterface), QStringLiteral("Read"));
   call << nameSpace << key;
   ++unanswered_;
@@ -80,7 +83,10 @@ void Appearance::take(const QString& nameSpace, const QString& key, const QVaria
 void Appearance::decide() {
   const bool dark = portalScheme_ == 1 || (portalScheme_ != 2 && paletteIsDark());
   const double scale = std::clamp(portalTextScale_ > 0 ? portalTextScale_ : fontScale(), 0.8, 2.0);
-  if (std::exchange(dark_, dark) != dark || std::exchange(textScale_, scale) != scale) emit changed();
+  if (dark == dark_ && scale == textScale_) return;
+  dark_ = dark;
+  textScale_ = scale;
+  emit changed();
 }
 
 bool Appearance::eventFilter(QObject* watched, QEvent* event) {

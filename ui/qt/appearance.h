@@ -18,8 +18,8 @@ class Appearance final : public QObject {
   static constexpr auto portalPath = "/org/freedesktop/portal/desktop";
   static constexpr auto portalInterface = "org.freedesktop.portal.Settings";
 
-  // The bus may be unconnected. The service is empty on a connection from peer to peer.
-  explicit Appearance(const QDBusConnection& bus, const QString& service = QString::fromLatin1(portalService));
+  // The bus may be unconnected.
+  explicit Appearance(const QDBusConnection& bus);
 
   bool dark() const { return dark_; }
   // 0.8 to 2; 1 is the usual size.
@@ -40,7 +40,7 @@ class Appearance final : public QObject {
   void settingChanged(const QString& nameSpace, const QString& key, const QDBusVariant& value);
 
  private:
-  void ask(const QString& service, const QString& nameSpace, const QString& key);
+  void ask(const QString& nameSpace, const QString& key);
   void take(const QString& nameSpace, const QString& key, const QVariant& value);
   void decide();
 

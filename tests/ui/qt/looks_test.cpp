@@ -1,0 +1,269 @@
+// SPDX-License-Identifier: Apache-2.0
+#include <QColor>
+#include <QFontMetricsF>
+#include <QImage>
+#include <cmath>
+
+#include "tests/ui/qt/window_testing.h"
+
+namespace probeview {
+namespace {
+
+// Relative luminance and contrast as the Web Content Accessibility Guidelines 2.1 define them.
+double luminance(const QColor& color) {
+  const auto linear = [](double channel) {
+    return channel <= 0.04045 ? channel / 12.92 : std::pow((channel + 0.055) / 1.055, 2.4);
+  };
+  return 0.2126 * linear(color.redF()) + 0.7152 * linear(color.greenF()) + 0.0722 * linear(color.blueF());
+}
+double contrast(const QColor& one, const QColor& other) {
+  const double lighter = std::max(luminance(one), luminance(other));
+  const double darker = std::min(luminance(one), luminance(other));
+  return (lighter + 0.05) / (darker + 0.05);
+}
+
+class WindowLooks : public testing_ui::WindowTest {
+ protected:
+  QColor color(const char* name) { return theme().property(name).value<QColor>(); }
+  double number(const char* name) { return theme().property(name).toDouble(); }
+  QQuickItem* whole() { return window().contentItem(); }
+
+  void setLook(bool dark, double textScale) {
+    theme().setProperty("dark", dark);
+    theme().setProperty("textScale", textScale);
+    rest();
+  }
+
+  // Every text in sight is drawn whole, inside the window's width and inside its row, and none lies on another.
+  void expectNothingClipped() {
+    const auto texts = textsIn(whole());
+    for (auto* text : texts) {
+      const std::string what = textOf(text);
+      EXPECT_FALSE(text->property("truncated").toBool()) << what;
+      EXPECT_LE(text->property("contentWidth").toDouble(), text->width() + 1) << what;
+      EXPECT_LE(text->property("contentHeight").toDouble(), text->height() + 1) << what;
+      const QRectF place = text->mapRectToScene(text->boundingRect());
+      EXPECT_GE(place.left(), 0) << what;
+      EXPECT_LE(place.right(), window().width()) << what;
+    }
+    for (int index = 0; index < model().rowCount(); ++index) {
+      QQuickItem* found = nullptr;
+      QMetaObject::invokeMethod(list(), "itemAtIndex", Q_RETURN_ARG(QQuickItem*, found), Q_ARG(int, index));
+      if (!found) continue;
+      EXPECT_GE(found->height(), 48);
+      QRectF label;
+      for (auto* text : textsIn(found)) {
+        if (textOf(text).empty()) continue;
+        const QRectF place = text->mapRectToItem(found, text->boundingRect());
+        EXPECT_GE(place.top(), 0) << textOf(text);
+        EXPECT_LE(place.bottom(), found->height()) << textOf(text);
+        // The box of a text spans the row; what counts is where its letters are.
+        const double letters = text->property("contentWidth").toDouble();
+        const bool right = text->property("effectiveHorizontalAlignment").toInt() == Qt::AlignRight;
+        const QRectF drawn(right ? place.right() - letters : place.left(), place.top(), letters, place.height());
+        EXPECT_FALSE(drawn.intersects(label)) << textOf(text);
+        label = drawn;
+      }
+    }
+  }
+};
+
+TEST_F(WindowLooks, EveryTextStandsOutFromItsGroundInBothLooks) {
+  show();
+  for (const bool dark : {false, true}) {
+    theme().setProperty("dark", dark);
+    const auto pairs = theme().property("textPairs").value<QVariantList>();
+    ASSERT_GT(pairs.size(), 20);
+    for (const auto& pair : pairs) {
+      const auto text = pair.toList().at(0).value<QColor>();
+      const auto ground = pair.toList().at(1).value<QColor>();
+      EXPECT_GE(contrast(text, ground), 4.5)
+          << text.name().toStdString() << " on " << ground.name().toStdString() << (dark ? ", dark" : ", light");
+    }
+  }
+}
+
+TEST_F(WindowLooks, EveryTextInSightHasAColourOfTheTestedPairs) {
+  store.filled[DisplayDictionary::myLTERRCStateDict] = testing_ui::dictionaryOf(3);
+  show();
+  const auto expectTested = [this] {
+    std::vector<QColor> tested;
+    for (const auto& pair : theme().property("textPairs").value<QVariantList>()) {
+      tested.push_back(pair.toList().at(0).value<QColor>());
+    }
+    for (auto* text : textsIn(whole())) {
+      EXPECT_NE(std::find(tested.begin(), tested.end(), text->property("color").value<QColor>()), tested.end())
+          << textOf(text);
+    }
+  };
+  expectTested();
+  goTo("LTE", "RRC State");
+  for (const bool dark : {false, true}) {
+    setLook(dark, 1);
+    expectTested();
+  }
+}
+
+TEST_F(WindowLooks, ThePictureFollowsTheLookAtOnce) {
+  show();
+  for (const bool dark : {true, false, true}) {
+    setLook(dark, 1);
+    const QImage picture = window().grabWindow();
+    EXPECT_EQ(picture.pixelColor(180, 600), color("ground")) << "below the last row";
+    EXPECT_EQ(picture.pixelColor(350, 700), color("bar")) << "right of the status line's words";
+    EXPECT_EQ(luminance(picture.pixelColor(180, 600)) < 0.5, dark);
+  }
+}
+
+TEST_F(WindowLooks, TextsAreDrawnAndNotOnlyLaidOut) {
+  show();
+  for (const bool dark : {false, true}) {
+    setLook(dark, 1);
+    const QImage picture = window().grabWindow();
+    auto* label = part(row("Device Info"), "label");
+    const QRect place =
+        label->mapRectToScene({0, 0, label->property("contentWidth").toDouble(), label->height()}).toAlignedRect();
+    double most = 1;
+    for (int y = place.top(); y < place.bottom(); ++y) {
+      for (int x = place.left(); x < place.right(); ++x) {
+        most = std::max(most, contrast(picture.pixelColor(x, y), color("card")));
+      }
+    }
+    EXPECT_GE(most, 4.5);
+  }
+}
+
+TEST_F(WindowLooks, NothingIsClippedAtTwiceTheTextSize) {
+  Dictionary state = testing_ui::dictionaryOf(2);
+  state.set("rrc_connection_release_cause", Value::text("KLTE_RRC_CONN_RELEASE_CAUSE_LOAD_BALANCING_TAU_REQUIRED"));
+  state.set("several_lines",
+            Value::text("the first line\nthe second line, which is longer than the first one\nthe third"));
+  state.set("a_single_word_that_is_much_longer_than_any_screen_of_a_phone_is_wide",
+            Value::text("ABCDEFGHIJKLMNOPQRSTUVWXYZABCDEFGHIJKLMNOPQRSTUVWXYZ"));
+  store.filled[DisplayDictionary::myLTERRCStateDict] = state;
+  statusText = "Baseband service away since 12:03:10, showing what was last known";
+  for (const QSize size : {QSize(360, 720), QSize(1280, 800)}) {
+    SCOPED_TRACE(size.width());
+    show(size);
+    setLook(true, 2);
+    EXPECT_EQ(part(row("LTE"), "label")->property("font").value<QFont>().pixelSize(), 30);
+    expectNothingClipped();
+    clickRow("LTE");
+    rest();
+    expectNothingClipped();
+    clickRow("RRC State");
+    rest();
+    expectNothingClipped();
+    scrollTo(600);
+    expectNothingClipped();
+  }
+}
+
+TEST_F(WindowLooks, NothingIsClippedOnAnyCategoryListAtAnySize) {
+  show();
+  for (const auto* technology : {"LTE", "UMTS", "GSM"}) {
+    clickRow(technology);
+    rest();
+    for (const double scale : {0.8, 1.0, 1.3, 2.0}) {
+      setLook(false, scale);
+      expectNothingClipped();
+    }
+    press(Qt::Key_Escape);
+    rest();
+  }
+}
+
+TEST_F(WindowLooks, ValuesStandBesideTheirLabelsOrBelowThemWhenLong) {
+  Dictionary state;
+  state.set("state", Value::text("SHORT"));
+  state.set("prev_rrc_state", Value::text("KLTE_RRC_CONN_STATE_CONNECTED_AND_MORE"));
+  store.filled[DisplayDictionary::myLTERRCStateDict] = state;
+  show();
+  goTo("LTE", "RRC State");
+  const auto gapBelow = [this](const std::string& label) {
+    return part(row(label), "value")->y() - part(row(label), "label")->y();
+  };
+  EXPECT_LT(std::abs(gapBelow("state")), 4);
+  EXPECT_GT(gapBelow("prev_rrc_state"), 12);
+  window().resize(1280, 800);
+  rest();
+  EXPECT_LT(std::abs(gapBelow("prev_rrc_state")), 4);
+}
+
+TEST_F(WindowLooks, RowsAreAtLeast48PixelsHighAndGrowWithTheirText) {
+  Dictionary state;
+  state.set("short", Value::text("1"));
+  state.set("long", Value::text("one\ntwo\nthree\nfour"));
+  store.filled[DisplayDictionary::myLTERRCStateDict] = state;
+  show();
+  goTo("LTE", "RRC State");
+  EXPECT_EQ(row("short")->height(), 48);
+  EXPECT_GT(row("long")->height(), 90);
+}
+
+TEST_F(WindowLooks, ALongNameBreaksBehindAnUnderscoreAndIsNeverCut) {
+  Dictionary state;
+  const std::string name = "KLTE_RRC_CONN_RELEASE_CAUSE_LOAD_BALANCING_TAU_REQUIRED";
+  state.set("cause", Value::text(name));
+  store.filled[DisplayDictionary::myLTERRCStateDict] = state;
+  show();
+  goTo("LTE", "RRC State");
+  auto* value = part(row("cause"), "value");
+  EXPECT_EQ(textOf(value), name);
+  EXPECT_EQ(value->property("lineCount").toInt(), 2);
+  EXPECT_FALSE(value->property("truncated").toBool());
+}
+
+TEST_F(WindowLooks, TextThatLooksLikeMarkupIsShownAsItStands) {
+  Dictionary state;
+  state.set("<b>bold</b>", Value::text("<img src='x'/><h1>big</h1>&amp;"));
+  store.filled[DisplayDictionary::myLTERRCStateDict] = state;
+  statusText = "<i>status</i>";
+  show();
+  goTo("LTE", "RRC State");
+  constexpr int plainText = 0;  // Text.PlainText
+  for (auto* text : textsIn(whole())) EXPECT_EQ(text->property("textFormat").toInt(), plainText) << textOf(text);
+  auto* value = part(row("<b>bold</b>"), "value");
+  EXPECT_EQ(textOf(value), "<img src='x'/><h1>big</h1>&amp;");
+  EXPECT_EQ(row("<b>bold</b>")->property("spoken").toString(), "<b>bold</b>, <img src='x'/><h1>big</h1>&amp;");
+}
+
+TEST_F(WindowLooks, AMissingValueLooksMissing) {
+  show();
+  goTo("LTE", "Serving Cell Info");
+  auto* blank = row("");
+  EXPECT_TRUE(part(blank, "missing")->isVisible());
+  EXPECT_EQ(textOf(part(blank, "label")), "");
+  EXPECT_EQ(textOf(part(blank, "value")), "");
+  store.filled[DisplayDictionary::myLTESCellInfoDict] = testing_ui::dictionaryOf(1);
+  loop.advance(std::chrono::seconds(5));
+  EXPECT_FALSE(part(row("field 0"), "missing")->isVisible());
+}
+
+TEST_F(WindowLooks, LinesStayReadableOnAWideScreen) {
+  store.filled[DisplayDictionary::myLTERRCStateDict] = testing_ui::dictionaryOf(2);
+  show({2560, 1400});
+  goTo("LTE", "RRC State");
+  auto* label = part(row("field 0"), "label");
+  EXPECT_LE(label->width(), number("columnWidth"));
+  EXPECT_NEAR(label->mapToScene(QPointF(label->width() / 2, 0)).x(), 1280, 2) << "in the middle";
+}
+
+TEST_F(WindowLooks, TheWindowCanBeAsSmallAsAWatch) {
+  show({240, 320});
+  goTo("LTE", "EUTRA Neighbor Info");
+  expectNothingClipped();
+  EXPECT_EQ(window().size(), QSize(240, 320));
+}
+
+TEST_F(WindowLooks, DigitsOfValuesHaveEqualWidth) {
+  store.filled[DisplayDictionary::myLTERRCStateDict] = testing_ui::dictionaryOf(1);
+  show();
+  goTo("LTE", "RRC State");
+  const auto font = part(row("field 0"), "value")->property("font").value<QFont>();
+  const QFontMetricsF metrics(font);
+  EXPECT_EQ(metrics.horizontalAdvance(QStringLiteral("111")), metrics.horizontalAdvance(QStringLiteral("888")));
+}
+
+}  // namespace
+}  // namespace probeview
