@@ -101,7 +101,10 @@ ApplicationWindow {
         anchors.fill: parent
         focus: true
 
-        Component.onCompleted: push(pageView, { page: window.viewer.firstPage }, StackView.Immediate)
+        Component.onCompleted: {
+            for (const page of window.viewer.firstPages)
+                push(pageView, { page: page }, StackView.Immediate);
+        }
 
         component Slide: NumberAnimation {
             property: "x"

@@ -20,12 +20,8 @@ QString equalWidthFamily() {
 }  // namespace
 
 Viewer::Viewer(NavigationStack& stack, StatusText status, Scheduler& scheduler, Appearance& appearance)
-    : stack_(stack),
-      appearance_(appearance),
-      valueFamily_(equalWidthFamily()),
-      status_(std::move(status)),
-      firstPage_(new PageModel(stack.topPage(), this)),
-      top_{firstPage_} {
+    : stack_(stack), appearance_(appearance), valueFamily_(equalWidthFamily()), status_(std::move(status)) {
+  for (std::size_t page = 0; page < stack_.depth(); ++page) didPush(stack_.page(page));
   stack_.setObserver(this);
   connect(&appearance, &Appearance::changed, this, &Viewer::appearanceChanged);
   if (!status_) return;
@@ -42,6 +38,8 @@ void Viewer::refreshStatus() {
   emit statusChanged();
 }
 
+QList<QObject*> Viewer::firstPages() const { return QList<QObject*>(pages_.begin(), pages_.end()); }
+
 QObject* Viewer::open(int row) {
   const auto* tapped = topPage()->cell(row);
   if (!tapped) return nullptr;
@@ -56,11 +54,11 @@ void Viewer::release(QObject* page) {
   if (page) page->deleteLater();
 }
 
-void Viewer::didPush(ListPage& page) { top_.push_back(new PageModel(page, this)); }
+void Viewer::didPush(ListPage& page) { pages_.push_back(new PageModel(page, this)); }
 
 void Viewer::willPop(ListPage&) {
-  top_.back()->detach();
-  top_.pop_back();
+  pages_.back()->detach();
+  pages_.pop_back();
 }
 
 }  // namespace probeview::qt

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include <QList>
 #include <QObject>
 #include <QString>
 #include <vector>
@@ -20,10 +21,11 @@ class Viewer final : public QObject, private NavigationObserver {
   Q_PROPERTY(double textScale READ textScale NOTIFY appearanceChanged FINAL)
   Q_PROPERTY(QString valueFamily READ valueFamily CONSTANT FINAL)
   Q_PROPERTY(QString statusText READ statusText NOTIFY statusChanged FINAL)
-  Q_PROPERTY(QObject* firstPage READ firstPage CONSTANT FINAL)
+  // The pages that the stack held when the window was made, from the root on.
+  Q_PROPERTY(QList<QObject*> firstPages READ firstPages CONSTANT FINAL)
 
  public:
-  // The stack stands at its root page. An empty status function means no status line. All outlive the viewer.
+  // The stack may already stand on any page. An empty status function means no status line. All outlive the viewer.
   Viewer(NavigationStack& stack, StatusText status, Scheduler& scheduler, Appearance& appearance);
   ~Viewer() override;
 
@@ -31,8 +33,8 @@ class Viewer final : public QObject, private NavigationObserver {
   double textScale() const { return appearance_.textScale(); }
   QString valueFamily() const { return valueFamily_; }
   QString statusText() const { return statusText_; }
-  PageModel* firstPage() const { return firstPage_; }
-  PageModel* topPage() const { return top_.back(); }
+  QList<QObject*> firstPages() const;
+  PageModel* topPage() const { return pages_.back(); }
 
   // A tap on a row of the top page: the model of the page that it opened, null if it leads nowhere.
   Q_INVOKABLE QObject* open(int row);
@@ -55,8 +57,7 @@ class Viewer final : public QObject, private NavigationObserver {
   StatusText status_;
   QString statusText_;
   ScheduledTaskHandle statusTimer_;
-  PageModel* firstPage_;
-  std::vector<PageModel*> top_;  // one per page of the stack; children of this object
+  std::vector<PageModel*> pages_;  // one per page of the stack; children of this object
 };
 
 }  // namespace probeview::qt

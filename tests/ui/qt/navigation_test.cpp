@@ -178,6 +178,18 @@ TEST_F(WindowNavigation, EveryCategoryPageCanBeOpenedAndLeft) {
   EXPECT_EQ(pages, 42);
 }
 
+TEST_F(WindowNavigation, AWindowOverAPageThatIsOpenAlreadyStartsThereAndGoesBackToTheRoot) {
+  showAt("LTE RRC State");
+  EXPECT_EQ(title(), "RRC State");
+  press(Qt::Key_Escape);
+  rest();
+  EXPECT_EQ(title(), "LTE");
+  press(Qt::Key_Escape);
+  rest();
+  EXPECT_EQ(stack->depth(), 1u);
+  EXPECT_EQ(list()->property("count").toInt(), 4);
+}
+
 TEST_F(WindowNavigation, TheTappedRowIsStillMarkedAfterComingBack) {
   show();
   goTo("LTE", "C-DRX");

@@ -4,6 +4,8 @@
 #include <QSignalSpy>
 #include <utility>
 
+#include "ui/open_page.h"
+
 namespace probeview::testing_ui {
 
 std::size_t HandPage::numberOfSections() {
@@ -50,6 +52,13 @@ void WindowTest::show(QSize size) {
   close();
   stack.emplace(description);
   open(size);
+}
+
+void WindowTest::showAt(const std::string& pageKey) {
+  close();
+  stack.emplace(description);
+  ASSERT_TRUE(openPage(*stack, pageKey));
+  open({360, 720});
 }
 
 HandPage& WindowTest::showPage(std::unique_ptr<HandPage> page, QSize size) {

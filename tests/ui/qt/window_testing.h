@@ -49,9 +49,11 @@ class WindowTest : public PagesTest {
   WindowTest();
   ~WindowTest() override;
 
-  // Shows the window over the launch list, or over a page of the test's own, and waits for its first picture. A window that is
-  // there already goes.
+  // Shows the window over the launch list, or over a page of the test's own, and waits for its first picture. A window
+  // that is there already goes.
   void show(QSize size = {360, 720});
+  // The same, with that page opened before.
+  void showAt(const std::string& pageKey);
   HandPage& showPage(std::unique_ptr<HandPage> page, QSize size = {360, 720});
 
   QQuickWindow& window() { return window_->quickWindow(); }
