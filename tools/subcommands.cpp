@@ -3,6 +3,7 @@
 
 #include "tools/config_command.h"
 #include "tools/decode_command.h"
+#include "tools/pages_command.h"
 #include "tools/query_command.h"
 #include "tools/status_command.h"
 #include "tools/store_command.h"
@@ -14,7 +15,8 @@ namespace {
 
 // One line for each file; nothing else knows which subcommands there are.
 constexpr AddSubcommand subcommands[] = {
-    addStatusCommand, addWatchCommand, addQueryCommand, addConfigCommand, addDecodeCommand, addStoreCommand,
+    addStatusCommand, addWatchCommand,  addPagesCommand, addQueryCommand,
+    addConfigCommand, addDecodeCommand, addStoreCommand,
 };
 
 }  // namespace
