@@ -13,14 +13,6 @@ Key Key::copy(std::string_view text) {
   return key;
 }
 
-Key::Key(const Key& other) : Key(other.owned_ ? copy(other.text()) : constant(other.text())) {}
-
-Key::Key(Key&& other) noexcept : data_(other.data_), size_(other.size_), owned_(other.owned_) {
-  other.data_ = "";
-  other.size_ = 0;
-  other.owned_ = false;
-}
-
 Key& Key::operator=(const Key& other) {
   if (this != &other) *this = Key(other);
   return *this;
@@ -31,10 +23,6 @@ Key& Key::operator=(Key&& other) noexcept {
   std::swap(size_, other.size_);
   std::swap(owned_, other.owned_);
   return *this;
-}
-
-Key::~Key() {
-  if (owned_) delete[] data_;
 }
 
 Dictionary::Dictionary(std::initializer_list<Entry> entries) {

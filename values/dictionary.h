@@ -25,11 +25,16 @@ class Key {
   static Key constant(std::string_view text) noexcept { return Key(text); }
   static Key copy(std::string_view text);
 
-  Key(const Key& other);
-  Key(Key&& other) noexcept;
+  Key(const Key& other) : data_(other.data_), size_(other.size_), owned_(false) {
+    if (other.owned_) *this = copy(other.text());
+  }
+  Key(Key&& other) noexcept
+      : data_(other.data_), size_(std::exchange(other.size_, 0)), owned_(std::exchange(other.owned_, false)) {}
   Key& operator=(const Key& other);
   Key& operator=(Key&& other) noexcept;
-  ~Key();
+  ~Key() {
+    if (owned_) delete[] data_;
+  }
 
   std::string_view text() const noexcept { return {data_, size_}; }
   friend bool operator==(const Key& left, const Key& right) noexcept { return left.text() == right.text(); }

@@ -1,9 +1,11 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "values/printer.h"
 
+#include <algorithm>
 #include <charconv>
 #include <cmath>
 #include <cstdint>
+#include <cstring>
 
 namespace probeview {
 
@@ -11,26 +13,69 @@ namespace {
 
 constexpr std::string_view replacementCharacter = "\xEF\xBF\xBD";
 
+// Writes to the end of a text through a plain pointer, which is what makes printing fast. While the writer lives the
+// text is longer than what was written; the writer cuts it to its length when it ends.
+class Writer {
+ public:
+  explicit Writer(std::string& out) : out_(out) { seat(out.size(), 256); }
+  ~Writer() { out_.resize(static_cast<std::size_t>(position_ - out_.data())); }
+  Writer(const Writer&) = delete;
+  Writer& operator=(const Writer&) = delete;
+
+  // Room for that many characters more; advanceTo() says how many were used.
+  char* room(std::size_t count) {
+    if (static_cast<std::size_t>(limit_ - position_) < count) {
+      const auto used = static_cast<std::size_t>(position_ - out_.data());
+      seat(used, std::max(count, used) + 256);
+    }
+    return position_;
+  }
+  void advanceTo(char* position) { position_ = position; }
+
+  void put(char character) { advanceTo(append(room(1), character)); }
+  void put(std::string_view text) { advanceTo(append(room(text.size()), text)); }
+
+  static char* append(char* to, char character) {
+    *to = character;
+    return to + 1;
+  }
+  static char* append(char* to, std::string_view text) {
+    if (!text.empty()) std::memcpy(to, text.data(), text.size());
+    return to + text.size();
+  }
+
+ private:
+  void seat(std::size_t used, std::size_t more) {
+    out_.resize(used + more);
+    position_ = out_.data() + used;
+    limit_ = out_.data() + out_.size();
+  }
+
+  std::string& out_;
+  char* position_ = nullptr;
+  char* limit_ = nullptr;
+};
+
 template <typename Real>
-void printReal(Real number, std::string& out) {
+void printReal(Real number, Writer& out) {
   // No radio quantity is infinite; should one ever be, it must not print as a plausible number.
   if (!std::isfinite(number)) {
-    out += std::isnan(number) ? "nan" : number < 0 ? "-inf" : "inf";
+    out.put(std::string_view(std::isnan(number) ? "nan" : number < 0 ? "-inf" : "inf"));
     return;
   }
   // The largest double has 309 digits before the point, the smallest 1074 after it.
-  char digits[1100];
-  const auto [end, error] = std::to_chars(digits, digits + sizeof digits, number, std::chars_format::fixed);
-  const std::string_view text(digits, static_cast<std::size_t>(end - digits));
-  out += text;
-  if (text.find('.') == std::string_view::npos) out += ".0";
+  constexpr std::size_t longest = 1100;
+  char* const begin = out.room(longest);
+  char* end = std::to_chars(begin, begin + longest, number, std::chars_format::fixed).ptr;
+  if (std::find(begin, end, '.') == end) end = Writer::append(end, ".0");
+  out.advanceTo(end);
 }
 
 template <typename Integer>
-void printInteger(Integer number, std::string& out) {
-  char digits[24];
-  const auto [end, error] = std::to_chars(digits, digits + sizeof digits, number);
-  out.append(digits, end);
+void printInteger(Integer number, Writer& out) {
+  constexpr std::size_t longest = 24;
+  char* const begin = out.room(longest);
+  out.advanceTo(std::to_chars(begin, begin + longest, number).ptr);
 }
 
 struct Utf8Step {
@@ -78,65 +123,172 @@ bool needsEscape(char character) noexcept {
   return code < 32 || code == 127 || code >= 0x80 || character == '"' || character == '\\';
 }
 
-void appendEscaped(char character, std::string& out) {
+// Whether one of eight characters may need an escape; a false alarm is allowed, a miss is not. Each term sets the top
+// bit of a byte that is below 32, above 126, a quotation mark or a backslash.
+bool mayNeedEscape(std::uint64_t eight) noexcept {
+  constexpr std::uint64_t ones = 0x0101010101010101;
+  constexpr std::uint64_t tops = 0x8080808080808080;
+  const auto zeroBytes = [](std::uint64_t bytes) { return (bytes - ones) & ~bytes; };
+  return ((eight | (eight - ones * 32) | (eight + ones) | zeroBytes(eight ^ ones * '"') |
+           zeroBytes(eight ^ ones * '\\')) &
+          tops) != 0;
+}
+
+// Where the first character that needs an escape stands, at or after the index; the text's size when there is none.
+std::size_t findEscape(std::string_view text, std::size_t index) noexcept {
+  const auto mayNeedEscapeAt = [text](std::size_t begin) {
+    std::uint64_t eight;
+    std::memcpy(&eight, text.data() + begin, sizeof eight);
+    return mayNeedEscape(eight);
+  };
+  for (; index + 8 <= text.size(); index += 8) {
+    if (mayNeedEscapeAt(index)) break;
+  }
+  // The rest together with what was already looked at.
+  if (index + 8 > text.size() && text.size() >= 8 && !mayNeedEscapeAt(text.size() - 8)) return text.size();
+  while (index < text.size() && !needsEscape(text[index])) ++index;
+  return index;
+}
+
+void putEscaped(char character, Writer& out) {
   switch (character) {
     case '\\':
-      out += "\\\\";
-      return;
+      return out.put(std::string_view("\\\\"));
     case '"':
-      out += "\\\"";
-      return;
+      return out.put(std::string_view("\\\""));
     case '\n':
-      out += "\\n";
-      return;
+      return out.put(std::string_view("\\n"));
     case '\r':
-      out += "\\r";
-      return;
+      return out.put(std::string_view("\\r"));
     case '\t':
-      out += "\\t";
-      return;
+      return out.put(std::string_view("\\t"));
     case '\0':
-      out += "\\0";
-      return;
+      return out.put(std::string_view("\\0"));
     default:
       break;
   }
-  out += "\\u{";
-  char digits[4];
-  const auto [end, error] = std::to_chars(digits, digits + sizeof digits, static_cast<unsigned>(character), 16);
-  out.append(digits, end);
-  out += '}';
+  char* const begin = Writer::append(out.room(8), "\\u{");
+  char* const end = std::to_chars(begin, begin + 2, static_cast<unsigned>(character), 16).ptr;
+  out.advanceTo(Writer::append(end, '}'));
 }
 
-void appendQuoted(std::string_view text, std::string& out) {
-  out += '"';
+void putQuoted(std::string_view text, Writer& out) {
   std::size_t begin = 0;
-  for (std::size_t index = 0; index < text.size();) {
-    if (!needsEscape(text[index])) {
-      ++index;
-      continue;
-    }
-    out.append(text, begin, index - begin);
+  std::size_t index = findEscape(text, 0);
+  if (index == text.size()) {
+    char* to = Writer::append(out.room(text.size() + 2), '"');
+    out.advanceTo(Writer::append(Writer::append(to, text), '"'));
+    return;
+  }
+  out.put('"');
+  while (index < text.size()) {
+    out.put(text.substr(begin, index - begin));
     if (static_cast<unsigned char>(text[index]) >= 0x80) {
       const Utf8Step step = nextSequence(text.substr(index));
-      out += step.valid ? text.substr(index, step.length) : replacementCharacter;
+      out.put(step.valid ? text.substr(index, step.length) : replacementCharacter);
       index += step.length;
     } else {
-      appendEscaped(text[index], out);
+      putEscaped(text[index], out);
       ++index;
     }
     begin = index;
+    index = findEscape(text, index);
   }
-  out.append(text, begin);
-  out += '"';
+  out.put(text.substr(begin));
+  out.put('"');
+}
+
+void putHex(std::string_view bytes, Writer& out) {
+  constexpr std::string_view digits = "0123456789abcdef";
+  char* to = out.room(2 * bytes.size());
+  for (const char character : bytes) {
+    const auto byte = static_cast<unsigned char>(character);
+    *to++ = digits[byte >> 4];
+    *to++ = digits[byte & 15];
+  }
+  out.advanceTo(to);
+}
+
+void put(const List& list, Writer& out);
+void put(const Dictionary& dictionary, Writer& out);
+
+void put(const Value& value, Writer& out) {
+  switch (value.kind()) {
+    case ValueKind::Int32:
+      return printInteger(value.rawInt32(), out);
+    case ValueKind::UInt32:
+      return printInteger(value.rawUInt32(), out);
+    case ValueKind::Int64:
+      return printInteger(value.rawInt64(), out);
+    case ValueKind::UInt64:
+      return printInteger(value.rawUInt64(), out);
+    case ValueKind::Bool:
+      return out.put(value.rawBool() ? '1' : '0');
+    case ValueKind::Float:
+      return printReal(value.rawFloat(), out);
+    case ValueKind::Double:
+      return printReal(value.rawDouble(), out);
+    case ValueKind::Text:
+      return putQuoted(value.rawText(), out);
+    case ValueKind::Bytes:
+      out.put('<');
+      putHex(value.rawText(), out);
+      return out.put('>');
+    case ValueKind::List:
+      return put(*value.list(), out);
+    case ValueKind::Dictionary:
+      return put(*value.dictionary(), out);
+  }
+}
+
+void put(const List& list, Writer& out) {
+  out.put('[');
+  bool first = true;
+  for (const Value& value : list) {
+    if (!first) out.put(std::string_view(", "));
+    first = false;
+    put(value, out);
+  }
+  out.put(']');
+}
+
+void put(const Dictionary& dictionary, Writer& out) {
+  out.put('[');
+  bool first = true;
+  for (const Dictionary::Entry& entry : dictionary) {
+    if (!first) out.put(std::string_view(", "));
+    first = false;
+    putQuoted(entry.key.text(), out);
+    out.put(std::string_view(": "));
+    put(entry.value, out);
+  }
+  out.put(']');
+}
+
+template <typename Content>
+void printTo(const Content& content, std::string& out) {
+  Writer writer(out);
+  put(content, writer);
+}
+
+template <typename Real>
+void printRealTo(Real number, std::string& out) {
+  Writer writer(out);
+  printReal(number, writer);
+}
+
+template <typename Integer>
+void printIntegerTo(Integer number, std::string& out) {
+  Writer writer(out);
+  printInteger(number, writer);
 }
 
 }  // namespace
 
-void printNumber(double number, std::string& out) { printReal(number, out); }
-void printNumber(float number, std::string& out) { printReal(number, out); }
-void printNumber(std::int64_t number, std::string& out) { printInteger(number, out); }
-void printNumber(std::uint64_t number, std::string& out) { printInteger(number, out); }
+void printNumber(double number, std::string& out) { printRealTo(number, out); }
+void printNumber(float number, std::string& out) { printRealTo(number, out); }
+void printNumber(std::int64_t number, std::string& out) { printIntegerTo(number, out); }
+void printNumber(std::uint64_t number, std::string& out) { printIntegerTo(number, out); }
 
 void appendValidUtf8(std::string_view text, std::string& out) {
   if (isPlainAscii(text)) {
@@ -161,68 +313,13 @@ bool isValidUtf8(std::string_view text) noexcept {
 }
 
 void appendHex(std::string_view bytes, std::string& out) {
-  constexpr std::string_view digits = "0123456789abcdef";
-  for (const char character : bytes) {
-    const auto byte = static_cast<unsigned char>(character);
-    out += digits[byte >> 4];
-    out += digits[byte & 15];
-  }
+  Writer writer(out);
+  putHex(bytes, writer);
 }
 
-void print(const Value& value, std::string& out) {
-  switch (value.kind()) {
-    case ValueKind::Int32:
-      return printInteger(value.rawInt32(), out);
-    case ValueKind::UInt32:
-      return printInteger(value.rawUInt32(), out);
-    case ValueKind::Int64:
-      return printInteger(value.rawInt64(), out);
-    case ValueKind::UInt64:
-      return printInteger(value.rawUInt64(), out);
-    case ValueKind::Bool:
-      out += value.rawBool() ? '1' : '0';
-      return;
-    case ValueKind::Float:
-      return printReal(value.rawFloat(), out);
-    case ValueKind::Double:
-      return printReal(value.rawDouble(), out);
-    case ValueKind::Text:
-      return appendQuoted(value.rawText(), out);
-    case ValueKind::Bytes:
-      out += '<';
-      appendHex(value.rawText(), out);
-      out += '>';
-      return;
-    case ValueKind::List:
-      return print(*value.list(), out);
-    case ValueKind::Dictionary:
-      return print(*value.dictionary(), out);
-  }
-}
-
-void print(const List& list, std::string& out) {
-  out += '[';
-  bool first = true;
-  for (const Value& value : list) {
-    if (!first) out += ", ";
-    first = false;
-    print(value, out);
-  }
-  out += ']';
-}
-
-void print(const Dictionary& dictionary, std::string& out) {
-  out += '[';
-  bool first = true;
-  for (const Dictionary::Entry& entry : dictionary) {
-    if (!first) out += ", ";
-    first = false;
-    appendQuoted(entry.key.text(), out);
-    out += ": ";
-    print(entry.value, out);
-  }
-  out += ']';
-}
+void print(const Value& value, std::string& out) { printTo(value, out); }
+void print(const List& list, std::string& out) { printTo(list, out); }
+void print(const Dictionary& dictionary, std::string& out) { printTo(dictionary, out); }
 
 std::string printed(const Value& value) {
   std::string out;

@@ -31,8 +31,6 @@ bool releaseReference(std::atomic<std::uint32_t>& references) noexcept {
 
 }  // namespace
 
-Value::Value() noexcept : storage_{} {}
-
 Value::Value(ValueKind kind, std::string_view content) : kind_(kind) {
   if (content.size() <= inlineCapacity) {
     form_ = static_cast<std::uint8_t>(content.size());
@@ -71,37 +69,7 @@ Value Value::bytes(std::span<const std::uint8_t> bytes) {
   return Value(ValueKind::Bytes, {reinterpret_cast<const char*>(bytes.data()), bytes.size()});
 }
 
-Value::Value(const Value& other) noexcept {
-  take(other);
-  retain();
-}
-
-Value::Value(Value&& other) noexcept {
-  take(other);
-  other.form_ = 0;
-  other.kind_ = ValueKind::Text;
-}
-
-Value& Value::operator=(const Value& other) noexcept {
-  other.retain();
-  release();
-  take(other);
-  return *this;
-}
-
-Value& Value::operator=(Value&& other) noexcept {
-  if (this == &other) return *this;
-  release();
-  take(other);
-  other.form_ = 0;
-  other.kind_ = ValueKind::Text;
-  return *this;
-}
-
-Value::~Value() { release(); }
-
 void Value::retain() const noexcept {
-  if (!isShared()) return;
   std::atomic<std::uint32_t>& references = kind_ == ValueKind::List         ? load<ListNode*>()->references
                                            : kind_ == ValueKind::Dictionary ? load<DictionaryNode*>()->references
                                                                             : load<Buffer*>()->references;
@@ -109,7 +77,6 @@ void Value::retain() const noexcept {
 }
 
 void Value::release() noexcept {
-  if (!isShared()) return;
   if (kind_ == ValueKind::List) {
     if (releaseReference(load<ListNode*>()->references)) delete load<ListNode*>();
   } else if (kind_ == ValueKind::Dictionary) {

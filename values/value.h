@@ -19,6 +19,7 @@
 #include <span>
 #include <string>
 #include <string_view>
+#include <utility>
 
 namespace probeview {
 
@@ -42,7 +43,7 @@ enum class ValueKind : std::uint8_t {
 class Value {
  public:
   // An empty text.
-  Value() noexcept;
+  Value() noexcept : storage_{} {}
 
   // Numbers keep the type they are given; no other conversion is offered.
   template <std::same_as<std::int32_t> T>
@@ -83,11 +84,26 @@ class Value {
   // Copies the bytes.
   static Value bytes(std::span<const std::uint8_t> bytes);
 
-  Value(const Value& other) noexcept;
-  Value(Value&& other) noexcept;
-  Value& operator=(const Value& other) noexcept;
-  Value& operator=(Value&& other) noexcept;
-  ~Value();
+  Value(const Value& other) noexcept {
+    take(other);
+    if (isShared()) retain();
+  }
+  Value(Value&& other) noexcept {
+    take(other);
+    other.becomeEmptyText();
+  }
+  Value& operator=(const Value& other) noexcept { return *this = Value(other); }
+  Value& operator=(Value&& other) noexcept {
+    if (this == &other) return *this;
+    // Released last: the other may lie inside what this one held.
+    const Value previous(std::move(*this));
+    take(other);
+    other.becomeEmptyText();
+    return *this;
+  }
+  ~Value() {
+    if (isShared()) release();
+  }
 
   ValueKind kind() const noexcept { return kind_; }
 
@@ -153,8 +169,13 @@ class Value {
   Value(ValueKind kind, std::string_view content);
   const char* data() const noexcept;
   std::size_t size() const noexcept;
+  // One holder more, or less, of what is shared; only for a value that shares.
   void retain() const noexcept;
   void release() noexcept;
+  void becomeEmptyText() noexcept {
+    form_ = 0;
+    kind_ = ValueKind::Text;
+  }
   void take(const Value& other) noexcept {
     std::memcpy(storage_, other.storage_, sizeof storage_);
     form_ = other.form_;

@@ -145,6 +145,39 @@ TEST(Printer, TextInsideADictionaryIsEscapedSoThatALineStaysALine) {
   EXPECT_EQ(printed(Value::text("gr\xC3\xBC\xC3\x9F dich \xE2\x82\xAC")), "\"gr\xC3\xBC\xC3\x9F dich \xE2\x82\xAC\"");
 }
 
+TEST(Printer, AnEscapeIsFoundAtEveryPlaceOfATextOfEveryLength) {
+  for (std::size_t size = 1; size < 40; ++size) {
+    for (std::size_t place = 0; place < size; ++place) {
+      for (int code = 0; code < 256; ++code) {
+        const char character = static_cast<char>(code);
+        std::string text(size, 'a');
+        text[place] = character;
+        const bool isPlain = code >= 32 && code < 127 && character != '"' && character != '\\';
+        const std::string shown = printed(Value::text(text));
+        ASSERT_EQ(shown == '"' + text + '"', isPlain) << size << " " << place << " " << code;
+        ASSERT_EQ(shown.substr(1, place), std::string(place, 'a'));
+        ASSERT_TRUE(shown.ends_with(std::string(size - place - 1, 'a') + '"'));
+      }
+    }
+  }
+}
+
+TEST(Printer, AppendsToWhatIsThere) {
+  std::string out = "prefix ";
+  print(Value(std::int32_t{7}), out);
+  print(Value::text(std::string(5000, 'x')), out);
+  EXPECT_EQ(out, "prefix 7\"" + std::string(5000, 'x') + '"');
+}
+
+TEST(Value, IsAssignedFromWhatItHolds) {
+  Value value(List{List{std::int32_t{1}}, std::int32_t{2}});
+  value = Value((*value.list())[0]);
+  EXPECT_EQ(printed(value), "[1]");
+  value = Value(Dictionary{{"inner", Dictionary{{"key", Value::text(std::string(40, 'y'))}}}});
+  value = std::move(value.mutableDictionary()->find("inner")->mutableDictionary()->find("key")[0]);
+  EXPECT_EQ(bareText(value), std::string(40, 'y'));
+}
+
 TEST(Printer, BareTextIsNotEscaped) {
   EXPECT_EQ(bareText(Value::text("a\"b\n")), "a\"b\n");
   EXPECT_EQ(bareText(Value(std::int32_t{-4})), "-4");
