@@ -203,10 +203,7 @@ std::size_t mostNames(const MessageDescriptor& message) {
   return most;
 }
 
-const MessageDescriptor& messageOf(Fact fact) {
-  const Report& report = reports()[static_cast<std::size_t>(fact)];
-  return *metricWithId(report.metricId)->message;
-}
+const MessageDescriptor& messageOf(Fact fact) { return *metricWithId(reportOf(fact).metricId)->message; }
 
 }  // namespace
 

@@ -37,6 +37,7 @@ void LteModem::serve(CellIndex cell, const Circumstances& c) {
   reselection_.clear();
   handover_.clear();
   outbound_.clear();
+  c.facts.end(Fact::kLteSamples);  // those of the cell before
   c.facts.learn(Fact::kLteServingCell, c.now);
   c.facts.learn(Fact::kLteSelection, c.now);
   c.facts.learn(Fact::kLteComponentCarriers, c.now);

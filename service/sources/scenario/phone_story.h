@@ -18,7 +18,7 @@ class PhoneStory final : public Story {
   Milliseconds now() const override { return phone_.now(); }
   const Facts& facts() const override { return phone_.facts(); }
   std::vector<std::uint8_t> tell(Fact fact, std::uint64_t timestamp) override {
-    return payloadOf(phone_, fact, timestamp);
+    return reportOf(fact).payload(phone_, timestamp);
   }
 
  private:

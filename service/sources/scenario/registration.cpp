@@ -41,6 +41,9 @@ void Registration::arrive(CellIndex cell, bool fromElsewhere, Milliseconds now, 
     ends_ = -1;
     gprs_.procedure = GprsProcedure::kNone;
     eps_.procedure = EpsProcedure::kNone;
+    for (Service* service : {&mobility_.service, &gprs_.service, &eps_.service}) {
+      if (*service == Service::kRegistrationInProgress) *service = Service::kNotRegistered;
+    }
     touch(interrupted, now, facts);
   }
   retryAt_ = -1;

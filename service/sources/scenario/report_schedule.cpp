@@ -58,7 +58,8 @@ std::optional<Milliseconds> ReportSchedule::due(const Report& report, const Fact
   Entry& entry = entries_[static_cast<std::size_t>(report.fact)];
   const Facts::Entry& fact = facts[report.fact];
   if (!entry.wanted || fact.learnt < 0) return std::nullopt;
-  const bool news = fact.revision != entry.reported;
+  // A measurement that was made too early to be sent, and has been overtaken by a change of the cell, is news no more.
+  const bool news = fact.revision != entry.reported && (fact.holds || report.nature == Nature::kState);
   if (entry.period || report.nature == Nature::kMeasurement) {
     if (now < entry.next) return std::nullopt;
   }

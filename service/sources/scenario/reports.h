@@ -23,12 +23,12 @@ struct Report {
   Nature nature;
   // How often, in ms, while nobody asks for anything else; none: on every change.
   std::optional<Milliseconds> ownPeriod;
+  // The encoded message of the fact, which has been learnt, with the timestamp, in ms since 1970-01-01 UTC.
+  std::vector<std::uint8_t> (*payload)(const Phone& phone, std::uint64_t timestamp);
 };
 
 // One report for each fact, in the facts' order.
 std::span<const Report> reports();
-
-// The encoded message of a fact that has been learnt.
-std::vector<std::uint8_t> payloadOf(const Phone& phone, Fact fact, std::uint64_t timestamp);
+const Report& reportOf(Fact fact);
 
 }  // namespace probeview::scenario
