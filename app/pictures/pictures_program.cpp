@@ -1,0 +1,64 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "app/pictures/pictures_program.h"
+
+#include <CLI/CLI.hpp>
+#include <cstdlib>
+#include <ostream>
+
+#include "app/application.h"
+#include "platform/console_log.h"
+#include "platform/system_log.h"
+#include "ui/qt/pictures.h"
+
+namespace probeview {
+
+namespace {
+
+class NoLines final : public LineSink {
+ public:
+  void line(std::string_view) override {}
+};
+
+}  // namespace
+
+int runPicturesProgram(int argc, char** argv, std::ostream& output, std::ostream& errors) {
+  CLI::App program(
+      "Draws pages of the viewer into one PNG file, without a display: the launch list, a category list and category\n"
+      "pages, in a light and a dark look. Waits until every metric has come once, at most 15 s.",
+      "probeview-pictures");
+  program.set_version_flag("--version", "probeview-pictures " PROBEVIEW_VERSION);
+  qt::PicturesOptions options;
+  options.pageKeys = {"LTE RRC State", "LTE Serving Cell Info", "LTE EUTRA Neighbor Info"};
+  program.add_option("OUTPUT", options.outputPath, "The PNG file")->required();
+  std::string socketPath;
+  auto* socket = program
+                     .add_option("--socket", socketPath,
+                                 "The service's socket; otherwise $RADIXD_SOCKET, the user's, then the system's")
+                     ->type_name("PATH");
+  program
+      .add_option("--page", options.pageKeys,
+                  "A category page, such as \"LTE Tx Power\"; may be given several times (default: three pages of LTE)")
+      ->type_name("KEY")
+      ->allow_extra_args(false);
+  std::string look = "both";
+  program.add_option("--look", look, "light, dark or both")
+      ->check(CLI::IsMember({"light", "dark", "both"}))
+      ->capture_default_str();
+  try {
+    program.parse(argc, argv);
+  } catch (const CLI::ParseError& error) {
+    return program.exit(error, output, errors) == 0 ? 0 : 2;
+  }
+  options.light = look != "dark";
+  options.dark = look != "light";
+  if (*socket) setenv("RADIXD_SOCKET", socketPath.c_str(), 1);
+  // The picture is the only output.
+  setConsoleLog(*new NoLines);
+  setSystemLog(*new SystemLog("probeview", SystemLog::Echo::None));
+  int noArguments = 1;
+  const auto front = qt::makePicturesFront(noArguments, argv, options, errors);
+  return applicationMain("AppDelegate", *front,
+                         [&](Session& session) { front->waitUntil([&session] { return session.isFilled(); }); });
+}
+
+}  // namespace probeview
