@@ -1,7 +1,7 @@
 # SPDX-License-Identifier: Apache-2.0
 # The Debian 12 packages that each purpose needs, and the one way to install what is missing. Sourced by run and test.
 
-packages_build="g++ cmake ninja-build pkg-config ccache libcli11-dev libtomlplusplus-dev libncurses-dev \
+packages_build="g++ cmake ninja-build pkg-config ccache mold libcli11-dev libtomlplusplus-dev libncurses-dev \
 qt6-base-dev qt6-base-dev-tools qt6-declarative-dev qt6-declarative-dev-tools libgl-dev libxkbcommon-dev"
 # QML modules are loaded by name at run time, so no library pulls them in. Fonts: digits need one.
 packages_window="qml6-module-qtqml qml6-module-qtqml-models qml6-module-qtqml-workerscript qml6-module-qtquick \
