@@ -3,20 +3,27 @@
 
 #include <chrono>
 #include <cstddef>
+#include <cstdint>
+#include <functional>
+#include <optional>
+#include <set>
 
 #include "platform/clock.h"
 #include "store/metric_validator.h"
 
 namespace probeview {
 
-// Tells when a store that fills from a service has got what there is to get: when something has come, and then no
-// metric of another kind for a while. Main thread.
+// Tells when a store that fills from a service has got what there is to get: every metric that the service's sources
+// can fill. Where the service does not say what they can: when something has come, and then no metric of another kind
+// for a while. Main thread.
 class FillWatch {
  public:
   static constexpr std::chrono::nanoseconds quiet = std::chrono::seconds(3);
+  using FillableMetrics = std::function<std::optional<std::set<std::int64_t>>()>;
 
-  // Both must outlive the watch.
-  FillWatch(const MetricValidator& store, const Clock& clock) : store_(store), clock_(clock) {}
+  // Store and clock must outlive the watch. The service is asked once, when the first metric has come.
+  FillWatch(const MetricValidator& store, const Clock& clock, FillableMetrics fillableMetrics)
+      : store_(store), clock_(clock), fillableMetrics_(std::move(fillableMetrics)) {}
 
   // To be asked often: it sees a kind come when it is asked.
   bool isFilled();
@@ -24,6 +31,9 @@ class FillWatch {
  private:
   const MetricValidator& store_;
   const Clock& clock_;
+  FillableMetrics fillableMetrics_;
+  // The dictionaries of the metrics that can be filled.
+  std::optional<std::set<DisplayDictionary>> expected_;
   std::size_t kinds_ = 0;
   std::chrono::nanoseconds lastChange_{};
 };

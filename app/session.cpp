@@ -16,7 +16,9 @@ RootNavigationController makeController(Front& front) {
 }  // namespace
 
 Session::Session(Front& front)
-    : navigation_(makeController(front)), fillWatch_(navigation_.myMetricValidator, systemClock()) {}
+    : navigation_(makeController(front)), fillWatch_(navigation_.myMetricValidator, systemClock(), [this] {
+        return navigation_.myRadixWrapper->fillableMetrics();
+      }) {}
 
 StatusText Session::statusText() const {
   return [this] { return statusLine_.text(navigation_.myRadixWrapper->serviceStatus()); };

@@ -8,6 +8,7 @@
 #include <vector>
 
 #include "platform/serial_queue.h"
+#include "radix/service_commands.h"
 #include "values/printer.h"
 
 namespace probeview {
@@ -162,6 +163,25 @@ void RadixWrapper::setDelegate(std::weak_ptr<RadixWrapperDelegate> delegate) {
 
 ServiceStatus RadixWrapper::serviceStatus() const {
   return {radix::client::Connection(radixManager_), shared_->lastRecord};
+}
+
+std::optional<std::set<std::int64_t>> RadixWrapper::fillableMetrics() const {
+  radix::client::ObjectHandle reply;
+  const auto result = radix::client::PerformCommand(radixManager_, radix::kCommandShowStatus, {}, reply);
+  if (result.status != 0 || reply == nullptr) return std::nullopt;
+  const Dictionary report = radix::client::nativeDictionary(*reply);
+  const Value* sources = report.find("sources");
+  if (sources == nullptr || sources->list() == nullptr) return std::nullopt;
+  std::set<std::int64_t> metrics;
+  for (const Value& source : *sources->list()) {
+    const Value* identifiers = source.dictionary() == nullptr ? nullptr : source.dictionary()->find("metric_ids");
+    // A service that does not say it of one source has not said it at all.
+    if (identifiers == nullptr || identifiers->list() == nullptr) return std::nullopt;
+    for (const Value& identifier : *identifiers->list()) {
+      if (identifier.int64()) metrics.insert(*identifier.int64());
+    }
+  }
+  return metrics;
 }
 
 }  // namespace probeview

@@ -7,6 +7,7 @@
 #include <cstdint>
 #include <memory>
 #include <optional>
+#include <set>
 #include <string>
 #include <string_view>
 
@@ -73,6 +74,8 @@ class RadixWrapper {
 
   // Main thread.
   ServiceStatus serviceStatus() const;
+  // The identifiers of the metrics that the service's sources can fill; absent when it does not say. Asks the service.
+  std::optional<std::set<std::int64_t>> fillableMetrics() const;
 
  private:
   // What the event handlers need; they may still run while the wrapper is being destroyed.

@@ -2,6 +2,7 @@
 #include "service/status_report.h"
 
 #include <chrono>
+#include <utility>
 
 #include "service/service.h"
 
@@ -15,8 +16,11 @@ Value milliseconds(std::chrono::nanoseconds time) {
 }
 
 Dictionary describe(const SourceSlot& source) {
+  List identifiers;
+  for (const std::int64_t metric : source.metrics()) identifiers.append(metric);
   Dictionary entry{{"origin", Value::text(source.origin())},
                    {"metrics", count(source.metrics().size())},
+                   {"metric_ids", std::move(identifiers)},
                    {"records", count(source.records())},
                    {"records_per_second", source.recordsPerSecond()},
                    {"withheld", count(source.withheld())}};

@@ -10,6 +10,7 @@
 #include "app/application.h"
 #include "app/fill_watch.h"
 #include "app/root_navigation_controller.h"
+#include "messages/metric_identifiers.h"
 #include "platform/resources.h"
 #include "radix/manager.h"
 #include "tests/ui/testing.h"
@@ -227,18 +228,45 @@ TEST(AppDelegateLife, TheApplicationKnowsItsDelegateByTheNameOfItsClass) {
   EXPECT_EQ(makeApplicationDelegate("OtherDelegate"), nullptr);
 }
 
-TEST(FillWatching, AStoreIsFilledWhenNoMetricOfAnotherKindHasComeForThreeSeconds) {
+class FillWatching : public testing::Test {
+ protected:
   ManualLoop clock;
   testing_ui::RememberedLines log;
-  testing_ui::HandFilledStore store(log, log);
-  FillWatch watch(store, clock);
+  testing_ui::HandFilledStore store{log, log};
+  int timesAsked = 0;
+
+  FillWatch watchFor(std::optional<std::set<std::int64_t>> fillable) {
+    return FillWatch(store, clock, [this, fillable] {
+      ++timesAsked;
+      return fillable;
+    });
+  }
+  void comes(DisplayDictionary which) { store.filled[which] = Dictionary{}; }
+};
+
+TEST_F(FillWatching, AStoreIsFilledWhenEveryMetricThatTheSourcesCanFillHasCome) {
+  // The last one is a metric that nobody handles.
+  auto watch = watchFor(std::set<std::int64_t>{K_LTE_RRC_STATE, K_CELLULAR_MM_CTXT, K_LTE_RLF});
+  EXPECT_FALSE(watch.isFilled());
+  comes(DisplayDictionary::myLTERRCStateDict);
+  EXPECT_FALSE(watch.isFilled());
+  comes(DisplayDictionary::myGMMContextDict);
+  clock.advance(1min);
+  EXPECT_FALSE(watch.isFilled()) << "silence is not enough";
+  comes(DisplayDictionary::myMMContextDict);
+  EXPECT_TRUE(watch.isFilled());
+  EXPECT_EQ(timesAsked, 1);
+}
+
+TEST_F(FillWatching, WhereTheServiceDoesNotSayAStoreIsFilledWhenNoOtherMetricHasComeForThreeSeconds) {
+  auto watch = watchFor(std::nullopt);
   clock.advance(1min);
   EXPECT_FALSE(watch.isFilled()) << "nothing has come at all";
-  store.filled[DisplayDictionary::myLTERRCStateDict] = Dictionary{};
+  comes(DisplayDictionary::myLTERRCStateDict);
   EXPECT_FALSE(watch.isFilled());
   clock.advance(2999ms);
   EXPECT_FALSE(watch.isFilled());
-  store.filled[DisplayDictionary::myMMContextDict] = Dictionary{};
+  comes(DisplayDictionary::myMMContextDict);
   EXPECT_FALSE(watch.isFilled());
   clock.advance(2999ms);
   store.filled[DisplayDictionary::myMMContextDict] = Dictionary{{"again", Value(true)}};

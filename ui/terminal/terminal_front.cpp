@@ -114,6 +114,11 @@ int TerminalFront::run(NavigationStack& navigation, const StatusText& status) {
   ::keypad(stdscr, TRUE);
   ::nodelay(stdscr, TRUE);
   ::set_escdelay(escapeDelayMilliseconds);
+  // Some terminals send arrows this way whatever they are told; read as a lone Esc they would lead back.
+  ::define_key("\x1b[A", KEY_UP);
+  ::define_key("\x1b[B", KEY_DOWN);
+  ::define_key("\x1b[C", KEY_RIGHT);
+  ::define_key("\x1b[D", KEY_LEFT);
   ::curs_set(0);
   addFatalErrorFlush(leaveScreen);
 

@@ -1,0 +1,92 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// The real programs, as a person starts them.
+#include <gtest/gtest.h>
+
+#include <cstdio>
+
+#include "tests/app/radixd_process.h"
+#include "ui/varnet_view_items.h"
+
+namespace probeview {
+namespace {
+
+struct Outcome {
+  int status;
+  std::string output;
+};
+
+// Runs a shell command; what it writes to standard output.
+Outcome run(const std::string& command) {
+  std::FILE* pipe = ::popen(("exec </dev/null; " + command).c_str(), "r");
+  if (!pipe) return {-1, ""};
+  std::string output;
+  char buffer[4096];
+  for (std::size_t count = 0; (count = std::fread(buffer, 1, sizeof buffer, pipe)) > 0;) output.append(buffer, count);
+  const int status = ::pclose(pipe);
+  return {WIFEXITED(status) ? WEXITSTATUS(status) : -1, output};
+}
+
+const std::string probeview = PROBEVIEW;
+const std::string probectl = PROBECTL;
+
+TEST(Programs, PrintShowsEveryPageOnceWhenEveryMetricHasComeAndEndsWell) {
+  RadixdProcess radixd("scenario:city,seed=1");
+  ASSERT_TRUE(radixd.start());
+  const auto shown = run(probeview + " --print 2>/dev/null");
+  EXPECT_EQ(shown.status, 0);
+  std::size_t headings = 0;
+  for (std::size_t at = shown.output.find("\nprobeview › "); at != std::string::npos;
+       at = shown.output.find("\nprobeview › ", at + 1)) {
+    ++headings;
+  }
+  EXPECT_EQ(headings, 42u);
+  EXPECT_EQ(shown.output.find("pushing metric file\n"), 0u) << "the console log comes first";
+  EXPECT_NE(shown.output.find("\nQuerying SIM files\n"), std::string::npos);
+  EXPECT_NE(shown.output.find("\nReceived Valid Metric\n"), std::string::npos);
+  EXPECT_NE(shown.output.find("\n  state "), std::string::npos);
+  EXPECT_NE(shown.output.find("\nscenario:city · "), std::string::npos);
+}
+
+TEST(Programs, TheConsoleLogGoesToTheFileThatIsNamed) {
+  RadixdProcess radixd("scenario:city,seed=1");
+  ASSERT_TRUE(radixd.start());
+  const TemporaryFolder folder;
+  const auto shown = run(probeview + " --print --log " + folder.path() + "/log 2>/dev/null");
+  EXPECT_EQ(shown.status, 0);
+  EXPECT_EQ(shown.output.find("probeview › Device Info › IMSI\n"), 0u);
+  EXPECT_EQ(run("head -n 2 " + folder.path() + "/log").output, "pushing metric file\nQuerying SIM files\n");
+}
+
+TEST(Programs, AReaderThatGoesAwayEndsThePrintingInPeace) {
+  RadixdProcess radixd("scenario:city,seed=1");
+  ASSERT_TRUE(radixd.start());
+  // bash: the status of the first program of the pipe.
+  const auto shown = run("bash -c '" + probeview + " --print 2>/dev/null | head -n 1; exit ${PIPESTATUS[0]}'");
+  EXPECT_EQ(shown.status, 0);
+  EXPECT_EQ(shown.output, "pushing metric file\n");
+}
+
+TEST(Programs, ProbectlPrintsOnePageAndNothingElse) {
+  RadixdProcess radixd("scenario:city,seed=1");
+  ASSERT_TRUE(radixd.start());
+  const auto shown = run(probectl + " --socket " + radixd.socket() + " pages LTE RRC State 2>&1");
+  EXPECT_EQ(shown.status, 0);
+  EXPECT_EQ(shown.output.find("probeview › LTE › RRC State\n  timestamp "), 0u);
+}
+
+TEST(Programs, ProbectlNamesThePagesThatThereAre) {
+  const auto shown = run(probectl + " pages LTE Tx Pwr 2>&1");
+  EXPECT_EQ(shown.status, 2);
+  EXPECT_NE(shown.output.find("there is no page \"LTE Tx Pwr\""), std::string::npos);
+  for (const auto& key : navigablePageKeys()) EXPECT_NE(shown.output.find("  " + key + "\n"), std::string::npos);
+}
+
+TEST(Programs, TheTerminalPagesNeedATerminal) {
+  const auto shown = run(probeview + " --terminal 2>&1");
+  EXPECT_EQ(shown.status, 1);
+  EXPECT_NE(shown.output.find("--print"), std::string::npos);
+}
+
+}  // namespace
+}  // namespace probeview
