@@ -77,6 +77,8 @@ Service::Service(Worker& worker, ServiceLog log, Settings settings)
       sessionSettings_{.serviceName = settings_.name,
                        .version = settings_.version,
                        .oldestVersion = settings_.oldestVersion,
+                       .greetingTime = settings_.greetingTime,
+                       .leavingTime = settings_.leavingTime,
                        .outbox = settings_.outbox},
       started_(worker.clock().monotonicTime()),
       alive_(std::make_shared<bool>(true)) {}

@@ -32,6 +32,9 @@ class Service final : Session::Host {
     std::uint32_t oldestVersion = radix::oldestProtocolVersion;
     // Clients that are served at once; those past it are told so.
     std::size_t mostClients = 128;
+    // How long a client may take to greet, and to go away after it was refused.
+    std::chrono::milliseconds greetingTime{5000};
+    std::chrono::milliseconds leavingTime{1000};
     Outbox::Limits outbox{};
   };
 

@@ -11,9 +11,6 @@ namespace {
 
 using radix::Status;
 
-// How long a client may take to greet, and to go away after it was refused.
-constexpr std::chrono::seconds greetingTime{5};
-constexpr std::chrono::seconds leavingTime{1};
 constexpr std::size_t longestClientName = 64;
 // Frames that leave together; a queue that has grown this long does not wait for the end of the turn.
 constexpr std::size_t framesPerFlush = 64;
@@ -39,9 +36,9 @@ Session::Session(std::uint64_t number, Worker& worker, ServiceLog& log, Host& ho
 Session::~Session() { *alive_ = false; }
 
 void Session::start() {
-  deadline_ = worker_.after(greetingTime, [this] {
-    log_.write(LogLevel::Warning,
-               description() + " did not greet within " + std::to_string(greetingTime.count()) + " s and was let go");
+  deadline_ = worker_.after(settings_.greetingTime, [this] {
+    log_.write(LogLevel::Warning, description() + " did not greet within " +
+                                      std::to_string(settings_.greetingTime.count()) + " ms and was let go");
     end();
   });
   link_->start(*this);
@@ -179,7 +176,7 @@ void Session::refuse(Status status, const std::string& reason) {
   delivery_ = false;
   host_.deliveryChanged(*this, false);
   // The link is closed by the client once it has read this: closing first could take the words away from it.
-  deadline_ = worker_.after(leavingTime, [this] { end(); });
+  deadline_ = worker_.after(settings_.leavingTime, [this] { end(); });
   outbox_.addWord(radix::encode(radix::Hello{.version = settings_.version,
                                              .oldestVersion = settings_.oldestVersion,
                                              .name = settings_.serviceName,

@@ -50,6 +50,8 @@ class Session final : radix::LinkListener, radix::FrameHandler {
     std::string serviceName;
     std::uint32_t version = radix::protocolVersion;
     std::uint32_t oldestVersion = radix::oldestProtocolVersion;
+    std::chrono::milliseconds greetingTime{};
+    std::chrono::milliseconds leavingTime{};
     Outbox::Limits outbox{};
   };
 

@@ -1,0 +1,500 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// The client's connection against a service that a test plays itself, on a manual loop.
+#include "radix/service_connection.h"
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include <deque>
+#include <memory>
+#include <vector>
+
+#include "platform/manual_loop.h"
+#include "radix/connection_manager.h"
+#include "radix/in_process_link.h"
+
+namespace radix::client {
+namespace {
+
+using probeview::Dictionary;
+using probeview::ManualLoop;
+using probeview::Value;
+using std::chrono::milliseconds;
+using std::chrono::nanoseconds;
+using std::chrono::seconds;
+using ::testing::ElementsAre;
+using ::testing::HasSubstr;
+using ::testing::IsEmpty;
+using ::testing::SizeIs;
+
+// The other end of one connection.
+class PlayedService final : LinkListener, FrameHandler {
+ public:
+  explicit PlayedService(std::unique_ptr<Link> link) : link_(std::move(link)) { link_->start(*this); }
+
+  template <typename Sentence>
+  void say(const Sentence& sentence) {
+    const FrameBytes frame = encode(sentence);
+    EXPECT_EQ(link_->send({&frame, 1}), 1U);
+  }
+  void sayBytes(std::vector<std::uint8_t> bytes) {
+    const FrameBytes frame = std::make_shared<const std::vector<std::uint8_t>>(std::move(bytes));
+    EXPECT_EQ(link_->send({&frame, 1}), 1U);
+  }
+  template <typename Sentence>
+  bool trySay(const Sentence& sentence) {
+    const FrameBytes frame = encode(sentence);
+    return link_->send({&frame, 1}) == 1;
+  }
+  void greet() { say(Hello{.name = "played"}); }
+  void answer(std::size_t index, std::int32_t status = 0, std::string message = {}) {
+    say(Reply{.sequence = commands.at(index).sequence, .status = status, .message = std::move(message)});
+  }
+  void hangUp() { link_.reset(); }
+
+  std::vector<Hello> hellos;
+  std::vector<Command> commands;
+  std::vector<bool> deliveries;
+  std::vector<Ping> pings;
+  bool closed = false;
+
+ private:
+  void onFrame(std::span<const std::uint8_t> frame) override { EXPECT_TRUE(decodeFrame(frame, *this)); }
+  void onOverlongFrame(std::size_t) override { ADD_FAILURE(); }
+  void onBatchEnd() override {}
+  void onWritable() override {}
+  void onClosed() override { closed = true; }
+  void onHello(Hello hello) override { hellos.push_back(std::move(hello)); }
+  void onCommand(Command command) override { commands.push_back(std::move(command)); }
+  void onDelivery(Delivery delivery) override { deliveries.push_back(delivery.on); }
+  void onPing(Ping ping) override { pings.push_back(ping); }
+
+  std::unique_ptr<Link> link_;
+};
+
+class ServiceConnectionTest : public ::testing::Test {
+ protected:
+  enum class Mood { Absent, Busy, There, Silent };
+
+  ServiceConnectionTest() { restart(); }
+  ~ServiceConnectionTest() override {
+    manager_.reset();
+    loop_.run();
+  }
+
+  void restart(ServiceConnection::Identity identity = {.clientName = "client"}) {
+    manager_ = makeConnectionManager(loop_, std::make_unique<TestConnector>(*this), std::move(identity),
+                                     {std::shared_ptr<void>(), &loop_});
+  }
+
+  Result perform(std::string_view command = "kCommandTest", const Dictionary& arguments = {}) {
+    ObjectHandle reply;
+    return PerformCommand(manager_, command, arguments, reply);
+  }
+
+  Result push(std::string_view text) {
+    return perform(kCommandAddConfiguration,
+                   {{kKeyPayload, Value::bytes({reinterpret_cast<const std::uint8_t*>(text.data()), text.size()})}});
+  }
+
+  // Answers each command with 0 as it comes, from now on.
+  void answerAll() {
+    answering_ = loop_.every(milliseconds(1), [this] {
+      while (!services_.empty() && answered_ < current().commands.size()) current().answer(answered_++);
+    });
+  }
+
+  PlayedService& current() { return *services_.back(); }
+
+  std::vector<milliseconds> attemptTimes() const {
+    std::vector<milliseconds> times;
+    for (const nanoseconds time : attempts_) {
+      times.push_back(std::chrono::duration_cast<milliseconds>(time - attempts_.front()));
+    }
+    return times;
+  }
+
+  ManualLoop loop_;
+  Mood mood_ = Mood::There;
+  std::vector<nanoseconds> attempts_;
+  std::vector<std::unique_ptr<PlayedService>> services_;
+  std::size_t answered_ = 0;
+  probeview::ScheduledTaskHandle answering_;
+  ManagerHandle manager_;
+
+  class TestConnector final : public Connector {
+   public:
+    explicit TestConnector(ServiceConnectionTest& test) : test_(test) {}
+    ConnectResult connect() override {
+      test_.attempts_.push_back(test_.loop_.monotonicTime());
+      switch (test_.mood_) {
+        case Mood::Absent:
+          return {nullptr, false, "nobody there"};
+        case Mood::Busy:
+          return {nullptr, true, "too busy"};
+        case Mood::There:
+        case Mood::Silent:
+          break;
+      }
+      auto [near, far] = makeInProcessLinks(test_.loop_);
+      test_.services_.push_back(std::make_unique<PlayedService>(std::move(far)));
+      test_.answered_ = 0;
+      if (test_.mood_ == Mood::There) test_.services_.back()->greet();
+      return {std::move(near), false, {}};
+    }
+
+   private:
+    ServiceConnectionTest& test_;
+  };
+};
+
+TEST_F(ServiceConnectionTest, ItGreetsWithItsNameAndVersion) {
+  loop_.run();
+  ASSERT_THAT(current().hellos, SizeIs(1));
+  EXPECT_EQ(current().hellos[0].name, "client");
+  EXPECT_EQ(current().hellos[0].version, protocolVersion);
+  EXPECT_EQ(current().hellos[0].oldestVersion, oldestProtocolVersion);
+  EXPECT_TRUE(Connection(manager_).connected);
+  EXPECT_EQ(Connection(manager_).serviceName, "played");
+}
+
+TEST_F(ServiceConnectionTest, ACommandIsAnsweredWithStatusMessageAndContent) {
+  loop_.run();
+  const auto answering = loop_.after(milliseconds(5), [this] {
+    ASSERT_THAT(current().commands, SizeIs(1));
+    EXPECT_EQ(current().commands[0].name, "kCommandTest");
+    EXPECT_EQ(decodeDictionary(current().commands[0].arguments), (Dictionary{{"a", std::int64_t{-1}}}));
+    current().say(Reply{.sequence = current().commands[0].sequence,
+                        .status = 5,
+                        .message = "because",
+                        .content = encodeDictionary({{"b", true}})});
+  });
+  ObjectHandle reply;
+  const Result result = PerformCommand(manager_, "kCommandTest", {{"a", std::int64_t{-1}}}, reply);
+  EXPECT_EQ(result.status, 5);
+  EXPECT_EQ(result.message, "because");
+  EXPECT_EQ(nativeDictionary(*reply), (Dictionary{{"b", true}}));
+}
+
+TEST_F(ServiceConnectionTest, ACommandWaitsTwoSecondsAndALateReplyIsForgotten) {
+  loop_.run();
+  const auto start = loop_.monotonicTime();
+  const Result result = perform();
+  EXPECT_EQ(result.status, static_cast<int>(Status::TimedOut));
+  EXPECT_EQ(result.message, "the baseband service did not answer in time");
+  EXPECT_EQ(loop_.monotonicTime() - start, seconds(2));
+  current().answer(0, 77);
+  loop_.run();
+  answered_ = 1;
+  answerAll();
+  EXPECT_EQ(perform().status, 0);
+}
+
+TEST_F(ServiceConnectionTest, ACommandRightAfterCreationWaitsForTheConnection) {
+  mood_ = Mood::There;
+  answerAll();
+  EXPECT_EQ(perform().status, 0);
+}
+
+TEST_F(ServiceConnectionTest, WithoutAServiceACommandFailsAtOnceAndSaysSo) {
+  mood_ = Mood::Absent;
+  const auto start = loop_.monotonicTime();
+  const Result result = perform();
+  EXPECT_EQ(result.status, static_cast<int>(Status::NoService));
+  EXPECT_EQ(result.message, "nobody there");
+  EXPECT_EQ(loop_.monotonicTime(), start);
+}
+
+TEST_F(ServiceConnectionTest, ItTriesAgainAfterAHundredMillisecondsDoublingToASecond) {
+  mood_ = Mood::Absent;
+  loop_.advance(seconds(5));
+  EXPECT_THAT(attemptTimes(),
+              ElementsAre(milliseconds(0), milliseconds(100), milliseconds(300), milliseconds(700), milliseconds(1500),
+                          milliseconds(2500), milliseconds(3500), milliseconds(4500)));
+}
+
+TEST_F(ServiceConnectionTest, AfterASuccessTheDelaysBeginAnew) {
+  mood_ = Mood::Absent;
+  loop_.advance(seconds(5));
+  mood_ = Mood::There;
+  loop_.advance(seconds(1));
+  ASSERT_TRUE(Connection(manager_).connected);
+  mood_ = Mood::Absent;
+  attempts_.clear();
+  current().hangUp();
+  loop_.run();
+  EXPECT_FALSE(Connection(manager_).connected);
+  const auto lost = loop_.monotonicTime();
+  loop_.advance(milliseconds(150));
+  ASSERT_THAT(attempts_, SizeIs(1));
+  EXPECT_EQ(attempts_[0] - lost, milliseconds(100));
+}
+
+TEST_F(ServiceConnectionTest, ACommandTriesAtOnceAsTheServiceMayJustHaveStarted) {
+  mood_ = Mood::Absent;
+  loop_.advance(seconds(5));
+  mood_ = Mood::There;
+  answerAll();
+  const auto start = loop_.monotonicTime();
+  EXPECT_EQ(perform().status, 0);
+  EXPECT_LT(loop_.monotonicTime() - start, milliseconds(10));
+}
+
+TEST_F(ServiceConnectionTest, AServiceWithAFullQueueIsTriedAgainUntilTheCommandsDeadline) {
+  mood_ = Mood::Busy;
+  answerAll();
+  const auto relief = loop_.after(milliseconds(1500), [this] { mood_ = Mood::There; });
+  EXPECT_EQ(perform().status, 0);
+  EXPECT_GT(attempts_.size(), 100U);
+}
+
+TEST_F(ServiceConnectionTest, AServiceThatStaysBusyFailsTheCommandAtItsDeadlineWithTheReason) {
+  mood_ = Mood::Busy;
+  const auto start = loop_.monotonicTime();
+  const Result result = perform();
+  EXPECT_EQ(result.status, static_cast<int>(Status::TimedOut));
+  EXPECT_EQ(result.message, "too busy");
+  EXPECT_EQ(loop_.monotonicTime() - start, seconds(2));
+}
+
+TEST_F(ServiceConnectionTest, AServiceThatNeverGreetsIsGivenUpAndTriedAgain) {
+  mood_ = Mood::Silent;
+  loop_.advance(milliseconds(2050));
+  EXPECT_FALSE(Connection(manager_).connected);
+  EXPECT_THAT(Connection(manager_).trouble, HasSubstr("did not greet"));
+  EXPECT_TRUE(current().closed);
+  loop_.advance(milliseconds(100));
+  EXPECT_THAT(attempts_, SizeIs(2));
+}
+
+TEST_F(ServiceConnectionTest, AConnectionThatEndsFailsTheCommandsThatWait) {
+  loop_.run();
+  const auto end = loop_.after(milliseconds(5), [this] {
+    mood_ = Mood::Absent;
+    current().hangUp();
+  });
+  const Result result = perform();
+  EXPECT_EQ(result.status, static_cast<int>(Status::NoService));
+  EXPECT_EQ(result.message, "the baseband service went away before it answered");
+}
+
+TEST_F(ServiceConnectionTest, ConfigurationAndDeliveryAreRestoredInThisOrderBeforeAnythingElse) {
+  answerAll();
+  ASSERT_EQ(push("[metrics]").status, 0);
+  EventsOn(manager_);
+  loop_.run();
+  answering_.reset();
+  current().hangUp();
+  loop_.advance(milliseconds(100));
+  ASSERT_THAT(services_, SizeIs(2));
+  ASSERT_THAT(current().commands, SizeIs(1));
+  EXPECT_EQ(current().commands[0].name, kCommandAddConfiguration);
+  EXPECT_EQ(current().commands[0].arguments, services_[0]->commands[0].arguments);
+  EXPECT_THAT(current().deliveries, ElementsAre(true));
+}
+
+TEST_F(ServiceConnectionTest, AConfigurationThatWasRefusedIsNotRestoredButTheOneBeforeIs) {
+  answerAll();
+  ASSERT_EQ(push("first").status, 0);
+  answering_.reset();
+  const auto refusing = loop_.after(milliseconds(5), [this] { current().answer(1, 3, "no"); });
+  ASSERT_EQ(push("second").status, 3);
+  current().hangUp();
+  loop_.advance(milliseconds(100));
+  ASSERT_THAT(current().commands, SizeIs(1));
+  EXPECT_EQ(current().commands[0].arguments, services_[0]->commands[0].arguments);
+}
+
+TEST_F(ServiceConnectionTest, AConfigurationThatWasClearedIsNotRestoredEvenIfTheServiceWasAway) {
+  answerAll();
+  ASSERT_EQ(push("first").status, 0);
+  mood_ = Mood::Absent;
+  current().hangUp();
+  loop_.run();
+  EXPECT_NE(perform(kCommandClearConfiguration).status, 0);
+  mood_ = Mood::There;
+  loop_.advance(seconds(1));
+  EXPECT_THAT(current().commands, IsEmpty());
+}
+
+TEST_F(ServiceConnectionTest, LossesThatTheServiceTellsAreAddedUp) {
+  loop_.run();
+  current().say(Dropped{3});
+  current().say(Dropped{4});
+  loop_.run();
+  EXPECT_EQ(Connection(manager_).lostEvents, 7U);
+}
+
+TEST_F(ServiceConnectionTest, ATriggerEventReachesItsHandlerWithItsKeysAndGroup) {
+  Dictionary got;
+  Group group = 0;
+  RegisterEventHandler(manager_, kEventTrigger, [&](const ObjectHandle& event, Group one) {
+    got = nativeDictionary(*event);
+    group = one;
+  });
+  EventsOn(manager_);
+  loop_.run();
+  current().say(Event{.kind = EventKind::Trigger,
+                      .time = 5,
+                      .origin = "o",
+                      .group = 6,
+                      .triggerId = 0x7F0013,
+                      .triggerRef = 9999,
+                      .triggerType = 1});
+  loop_.run();
+  const Dictionary expected{{"kKeyTriggerID", std::int64_t{0x7F0013}},
+                            {"kKeyTriggerRef", std::int64_t{9999}},
+                            {"kKeyTriggerType", std::int64_t{1}},
+                            {"kKeyTime", std::int64_t{5}},
+                            {"kKeyOrigin", Value::text("o")}};
+  EXPECT_EQ(got, expected);
+  EXPECT_EQ(group, 6);
+}
+
+TEST_F(ServiceConnectionTest, EventsThatAreStillOnTheirWayAfterEventsOffAreNotHandedOver) {
+  int events = 0;
+  RegisterEventHandler(manager_, kEventMetric, [&](const ObjectHandle&, Group) { ++events; });
+  EventsOn(manager_);
+  loop_.run();
+  current().say(Event{.metricId = 1});
+  EventsOff(manager_);
+  loop_.run();
+  EXPECT_EQ(events, 0);
+  EventsOn(manager_);
+  current().say(Event{.metricId = 1});
+  loop_.run();
+  EXPECT_EQ(events, 1);
+}
+
+TEST_F(ServiceConnectionTest, AHandlerMayRegisterAnotherInItsOwnPlace) {
+  std::vector<int> order;
+  EventsOn(manager_);
+  RegisterEventHandler(manager_, kEventMetric, [&](const ObjectHandle&, Group) {
+    order.push_back(1);
+    RegisterEventHandler(manager_, kEventMetric, [&](const ObjectHandle&, Group) { order.push_back(2); });
+  });
+  loop_.run();
+  current().say(Event{.metricId = 1});
+  current().say(Event{.metricId = 2});
+  loop_.run();
+  EXPECT_THAT(order, ElementsAre(1, 2));
+}
+
+TEST_F(ServiceConnectionTest, APingIsAnswered) {
+  loop_.run();
+  current().say(Ping{.number = 5});
+  loop_.run();
+  ASSERT_THAT(current().pings, SizeIs(1));
+  EXPECT_EQ(current().pings[0].number, 5U);
+  EXPECT_TRUE(current().pings[0].isAnswer);
+}
+
+TEST_F(ServiceConnectionTest, AServiceThatSendsWhatIsNoFrameIsLeftAndTriedAgain) {
+  loop_.run();
+  current().sayBytes({0x0A, 0x7F});
+  loop_.run();
+  EXPECT_TRUE(current().closed);
+  EXPECT_THAT(Connection(manager_).trouble, HasSubstr("no frame"));
+  loop_.advance(milliseconds(100));
+  EXPECT_TRUE(Connection(manager_).connected);
+}
+
+TEST_F(ServiceConnectionTest, AnOverlongFrameIsLeftToo) {
+  loop_.run();
+  current().sayBytes(std::vector<std::uint8_t>(longestFrame + 1));
+  loop_.run();
+  EXPECT_THAT(Connection(manager_).trouble, HasSubstr("a frame of 131073 bytes"));
+}
+
+TEST_F(ServiceConnectionTest, UnknownFramesOfALaterServiceAreIgnored) {
+  loop_.run();
+  current().sayBytes({0x7A, 0x01, 'x'});
+  loop_.run();
+  EXPECT_TRUE(Connection(manager_).connected);
+}
+
+TEST_F(ServiceConnectionTest, ARefusalIsWhatCommandsAnswerWith) {
+  mood_ = Mood::Silent;
+  const auto refusing = loop_.after(milliseconds(1), [this] {
+    current().say(Hello{.name = "played", .refusalStatus = 9, .refusal = "only others may connect"});
+  });
+  const Result result = perform();
+  EXPECT_EQ(result.status, 9);
+  EXPECT_EQ(result.message, "only others may connect");
+}
+
+TEST_F(ServiceConnectionTest, AServiceOlderThanTheClientLikesIsLeftWithTheAdviceToUpdateIt) {
+  restart({.clientName = "new", .version = 5, .oldestVersion = 3});
+  const Result result = perform();
+  EXPECT_EQ(result.status, static_cast<int>(Status::VersionMismatch));
+  EXPECT_THAT(result.message, HasSubstr("update the service"));
+}
+
+TEST_F(ServiceConnectionTest, AServiceThatNeedsALaterClientIsLeftWithTheAdviceToUpdateTheClient) {
+  mood_ = Mood::Silent;
+  const auto greeting =
+      loop_.after(milliseconds(1), [this] { current().say(Hello{.version = 9, .oldestVersion = 2, .name = "later"}); });
+  EXPECT_THAT(perform().message, HasSubstr("update the client"));
+}
+
+TEST_F(ServiceConnectionTest, AServiceOfALaterVersionThatStillKnowsOursIsTaken) {
+  mood_ = Mood::Silent;
+  const auto greeting = loop_.after(milliseconds(1), [this] {
+    current().say(Hello{.version = 9, .oldestVersion = 1, .name = "later"});
+    answerAll();
+  });
+  EXPECT_EQ(perform().status, 0);
+}
+
+TEST_F(ServiceConnectionTest, WhenTheHandlersDoNotKeepUpTheRestWaitsInTheServiceAndCommandsStillWork) {
+  // The handlers' queue is one that only this test moves.
+  auto queue = std::make_shared<ManualLoop>();
+  manager_ = makeConnectionManager(loop_, std::make_unique<TestConnector>(*this), {.clientName = "slow"}, queue);
+  int events = 0;
+  RegisterEventHandler(manager_, kEventMetric, [&](const ObjectHandle&, Group) { ++events; });
+  EventsOn(manager_);
+  loop_.run();
+  int sent = 0;
+  for (int round = 0; round < 100; ++round) {
+    for (int count = 0; count < 100 && current().trySay(Event{.metricId = 1}); ++count) ++sent;
+    loop_.run();
+  }
+  // Not all went out: the client stopped reading.
+  EXPECT_LT(sent, 5000);
+  EXPECT_GE(sent, 4096);
+  // A command's reply stands behind what was not read.
+  answered_ = 0;
+  answerAll();
+  EXPECT_EQ(perform().status, 0);
+  queue->run();
+  loop_.run();
+  queue->run();
+  EXPECT_EQ(events, sent);
+  EXPECT_TRUE(current().trySay(Event{.metricId = 1}));
+  loop_.run();
+  queue->run();
+  EXPECT_EQ(events, sent + 1);
+}
+
+TEST_F(ServiceConnectionTest, AsManyCommandsAsTheLimitMayWaitAtOnceAndOneMoreIsRefused) {
+  loop_.run();
+  auto connection = std::make_shared<ServiceConnection>(
+      loop_, std::make_unique<TestConnector>(*this), ServiceConnection::Identity{.clientName = "many"},
+      ServiceConnection::Events{.events = [](auto) {}, .state = [](const auto&) {}});
+  connection->start();
+  std::vector<std::shared_ptr<PendingCommand>> commands;
+  for (std::size_t number = 0; number <= mostCommandsAtOnce; ++number) {
+    auto command = std::make_shared<PendingCommand>();
+    command->name = "kCommandTest";
+    command->deadline = loop_.monotonicTime() + seconds(2);
+    command->done = loop_.makeGate();
+    commands.push_back(command);
+    connection->perform(command);
+  }
+  EXPECT_EQ(commands.back()->result.status, static_cast<int>(Status::TooMany));
+  EXPECT_EQ(commands[mostCommandsAtOnce - 1]->result.status, 0);
+}
+
+}  // namespace
+}  // namespace radix::client

@@ -1,0 +1,103 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// The small parts of the service: the union of plans, the last records, rates, the log.
+#include <gtest/gtest.h>
+
+#include <memory>
+#include <vector>
+
+#include "service/last_records.h"
+#include "service/log.h"
+#include "service/plans.h"
+#include "service/rate_meter.h"
+#include "tests/service/harness/scripted_source.h"
+
+namespace probeview {
+namespace {
+
+using std::chrono::milliseconds;
+using std::chrono::nanoseconds;
+using std::chrono::seconds;
+
+TEST(Plans, WithoutAnyThereIsNone) { EXPECT_EQ(unite({}), std::nullopt); }
+
+TEST(Plans, TheUnionHasEachMetricAtTheShortestPeriodWithOnChangeAboveAll) {
+  const MetricPlan first{{{1, milliseconds(500)}, {2, std::nullopt}, {3, milliseconds(7)}}};
+  const MetricPlan second{{{1, milliseconds(200)}, {2, milliseconds(1)}, {4, std::nullopt}}};
+  const std::vector<const MetricPlan*> plans{&first, &second};
+  const auto all = unite(plans);
+  ASSERT_TRUE(all);
+  const decltype(MetricPlan::metrics) expected{
+      {1, milliseconds(200)}, {2, std::nullopt}, {3, milliseconds(7)}, {4, std::nullopt}};
+  EXPECT_EQ(all->metrics, expected);
+}
+
+TEST(Plans, AnEmptyPlanIsAPlan) {
+  const MetricPlan nothing;
+  const std::vector<const MetricPlan*> plans{&nothing};
+  const auto all = unite(plans);
+  ASSERT_TRUE(all);
+  EXPECT_TRUE(all->metrics.empty());
+}
+
+std::vector<std::int64_t> metricsOf(const LastRecords& records) {
+  std::vector<std::int64_t> metrics;
+  for (const auto& [arrival, record] : records.records()) metrics.push_back(record.metricId);
+  return metrics;
+}
+
+TEST(LastRecords, KeepTheLastOfEachMetricInTheOrderOfArrival) {
+  LastRecords records;
+  const auto old = std::make_shared<const std::vector<std::uint8_t>>(1);
+  const auto fresh = std::make_shared<const std::vector<std::uint8_t>>(2);
+  records.keep(5, old);
+  records.keep(3, old);
+  records.keep(5, fresh);
+  EXPECT_EQ(metricsOf(records), (std::vector<std::int64_t>{3, 5}));
+  EXPECT_EQ(records.records().rbegin()->second.frame, fresh);
+}
+
+TEST(LastRecords, KeepAsManyMetricsAsTheLimitSaysAndNotOneMore) {
+  LastRecords records;
+  const auto frame = std::make_shared<const std::vector<std::uint8_t>>(1);
+  for (std::size_t metric = 0; metric < LastRecords::mostMetrics; ++metric) {
+    records.keep(static_cast<std::int64_t>(metric), frame);
+  }
+  EXPECT_EQ(records.records().size(), LastRecords::mostMetrics);
+  records.keep(-1, frame);
+  EXPECT_EQ(records.records().size(), LastRecords::mostMetrics);
+  records.keep(0, frame);
+  EXPECT_EQ(metricsOf(records).back(), 0);
+}
+
+TEST(RateMeter, IsTheMeanOfTheLastTenWholeSeconds) {
+  RateMeter meter;
+  const nanoseconds start = seconds(100);
+  for (int second = 0; second < 30; ++second) {
+    meter.add(start + seconds(second), second < 20 ? 100 : 5);
+  }
+  EXPECT_DOUBLE_EQ(meter.perSecond(start + seconds(30), start), 5.0);
+  EXPECT_DOUBLE_EQ(meter.perSecond(start + seconds(35), start), 2.5);
+  EXPECT_DOUBLE_EQ(meter.perSecond(start + seconds(60), start), 0.0);
+}
+
+TEST(RateMeter, OfSomethingYoungerIsTheMeanOfWhatThereIs) {
+  RateMeter meter;
+  meter.add(seconds(100), 30);
+  EXPECT_DOUBLE_EQ(meter.perSecond(seconds(100), seconds(100)), 0.0);
+  EXPECT_DOUBLE_EQ(meter.perSecond(seconds(101), seconds(100)), 30.0);
+  EXPECT_DOUBLE_EQ(meter.perSecond(seconds(103), seconds(100)), 10.0);
+}
+
+TEST(ServiceLog, WritesWhatIsImportantEnoughAndALineStaysALine) {
+  KeptLines lines;
+  ServiceLog log(lines, LogLevel::Warning);
+  log.write(LogLevel::Error, "a");
+  log.write(LogLevel::Warning, "b\nradixd: error: forged\x1b[31m");
+  log.write(LogLevel::Info, "c");
+  EXPECT_EQ(lines.lines,
+            (std::vector<std::string>{"radixd: error: a", "radixd: warning: b?radixd: error: forged?[31m"}));
+}
+
+}  // namespace
+}  // namespace probeview

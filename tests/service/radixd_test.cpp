@@ -1,0 +1,269 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// The real program, in a process of its own.
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+#include <sys/resource.h>
+#include <sys/socket.h>
+#include <sys/stat.h>
+#include <sys/un.h>
+
+#include <cstring>
+#include <fstream>
+#include <random>
+
+#include "platform/event_loop.h"
+#include "radix/client.h"
+#include "radix/service_commands.h"
+#include "radix/socket_connector.h"
+#include "radix/socket_manager.h"
+#include "radix/status.h"
+#include "tests/service/harness/radixd_process.h"
+#include "tests/service/harness/raw_client.h"
+#include "tests/service/harness/temporary_folder.h"
+
+namespace probeview {
+namespace {
+
+using ::testing::HasSubstr;
+using ::testing::Not;
+
+constexpr std::chrono::seconds patience{20};
+
+// Two rows of a log of our own making: PLMN 001/01, invented cells.
+constexpr char drive[] =
+    "Timestamp,Longitude,Latitude,Speed,Operatorname,CellID,NetworkMode,RSRP,RSRQ,SNR,CQI,RSSI,DL_bitrate,UL_bitrate,"
+    "State,PINGAVG,PINGMIN,PINGMAX,PINGSTDEV,PINGLOSS,CELLHEX,NODEHEX,LACHEX,RAWCELLID,NRxRSRP,NRxRSRQ\n"
+    "2024.03.05_12.00.00,0.0,0.0,0,A,1,LTE,-90,-10,12.0,10,-60,1,1,D,-,-,-,-,-,1,64,1A2B,25601,-100,-14\n"
+    "2024.03.05_12.00.01,0.0,0.0,0,A,1,LTE,-91,-11,11.0,10,-61,1,1,I,-,-,-,-,-,1,64,1A2B,25601,-101,-15\n";
+
+class Radixd : public ::testing::Test {
+ protected:
+  Radixd() { std::ofstream(trace_) << drive; }
+
+  std::vector<std::string> arguments(std::vector<std::string> more = {}) const {
+    std::vector<std::string> all{"--socket", socket_, "--source", "trace:" + trace_ + ",loop"};
+    all.insert(all.end(), more.begin(), more.end());
+    return all;
+  }
+
+  radix::SocketSurroundings surroundings() const {
+    radix::SocketSurroundings surroundings;
+    surroundings.namedSocket = socket_;
+    return surroundings;
+  }
+
+  radix::client::ManagerHandle manager() {
+    return radix::client::makeSocketManager("test", {std::shared_ptr<void>(), &loop_}, surroundings());
+  }
+
+  int status(const radix::client::ManagerHandle& manager) {
+    radix::client::ObjectHandle reply;
+    return radix::client::PerformCommand(manager, radix::kCommandShowStatus, {}, reply).status;
+  }
+
+  bool exists(const std::string& path) const {
+    struct stat status;
+    return ::lstat(path.c_str(), &status) == 0;
+  }
+
+  TemporaryFolder folder_;
+  std::string socket_ = folder_.path() + "/radixd.sock";
+  std::string trace_ = folder_.path() + "/drive.csv";
+  EventLoop loop_;
+};
+
+TEST_F(Radixd, ListensSaysSoAndEndsCleanlyOnEitherSignal) {
+  for (const int signal : {SIGTERM, SIGINT}) {
+    RadixdProcess radixd(arguments());
+    ASSERT_TRUE(radixd.waitForLog("listening at " + socket_)) << radixd.log();
+    struct stat made;
+    ASSERT_EQ(::lstat(socket_.c_str(), &made), 0);
+    EXPECT_EQ(made.st_mode & 07777, 0600U);
+    EXPECT_EQ(made.st_uid, ::geteuid());
+    EXPECT_EQ(status(manager()), 0);
+    radixd.send(signal);
+    EXPECT_EQ(radixd.waitForEnd(), 0);
+    EXPECT_THAT(radixd.log(), HasSubstr("radixd: info: ending\n"));
+    EXPECT_FALSE(exists(socket_));
+    EXPECT_FALSE(exists(socket_ + ".lock"));
+  }
+}
+
+TEST_F(Radixd, ASecondInstanceOnALiveSocketRefusesWithAClearError) {
+  RadixdProcess first(arguments());
+  ASSERT_TRUE(first.waitForLog("listening"));
+  RadixdProcess second(arguments());
+  EXPECT_EQ(second.waitForEnd(), 1);
+  EXPECT_EQ(second.log(),
+            "radixd: error: another radixd already has " + socket_ + "; stop it or name another --socket\n");
+  EXPECT_EQ(status(manager()), 0);
+}
+
+TEST_F(Radixd, AfterItWasKilledTheStaleSocketIsReplaced) {
+  {
+    RadixdProcess killed(arguments());
+    ASSERT_TRUE(killed.waitForLog("listening"));
+    killed.send(SIGKILL);
+    EXPECT_EQ(killed.waitForEnd(), -SIGKILL);
+  }
+  EXPECT_TRUE(exists(socket_));
+  RadixdProcess next(arguments());
+  EXPECT_TRUE(next.waitForLog("listening")) << next.log();
+  EXPECT_EQ(status(manager()), 0);
+}
+
+TEST_F(Radixd, KilledAndStartedAgainUnderARunningClientItGoesOnWithConfigurationAndDeliveryRestored) {
+  auto radixd = std::make_unique<RadixdProcess>(arguments());
+  ASSERT_TRUE(radixd->waitForLog("listening"));
+  const auto client = manager();
+  std::vector<std::int64_t> metrics;
+  radix::client::RegisterEventHandler(client, radix::kEventMetric, [&](const auto& event, radix::client::Group) {
+    metrics.push_back(*radix::client::nativeDictionary(*event).find(radix::kKeyMetricID)->int64());
+  });
+  const std::string configuration = "[metrics]\nK_LTE_RRC_STATE = \"on change\"\n";
+  radix::client::ObjectHandle reply;
+  ASSERT_EQ(radix::client::PerformCommand(
+                client, radix::kCommandAddConfiguration,
+                {{radix::kKeyPayload,
+                  Value::bytes({reinterpret_cast<const std::uint8_t*>(configuration.data()), configuration.size()})}},
+                reply)
+                .status,
+            0);
+  radix::client::EventsOn(client);
+  ASSERT_TRUE(loop_.runUntil([&] { return !metrics.empty(); }, patience));
+
+  radixd->send(SIGKILL);
+  radixd->waitForEnd();
+  const auto look = loop_.every(std::chrono::milliseconds(5), [] {});
+  ASSERT_TRUE(loop_.runUntil([&] { return !radix::client::Connection(client).connected; }, patience));
+  EXPECT_EQ(status(client), static_cast<int>(radix::Status::NoService));
+
+  metrics.clear();
+  radixd = std::make_unique<RadixdProcess>(arguments());
+  ASSERT_TRUE(radixd->waitForLog("listening"));
+  const auto started = std::chrono::steady_clock::now();
+  ASSERT_TRUE(loop_.runUntil([&] { return !metrics.empty(); }, patience));
+  EXPECT_LT(std::chrono::steady_clock::now() - started, std::chrono::seconds(6));
+  for (const std::int64_t metric : metrics) EXPECT_EQ(metric, 0x3C4E04);
+}
+
+TEST_F(Radixd, FiftyClientsConnectAtOnceAndAllAreServed) {
+  RadixdProcess radixd(arguments());
+  ASSERT_TRUE(radixd.waitForLog("listening"));
+  // Stopped, so that all of them stand in the queue of the socket before the first is accepted.
+  radixd.send(SIGSTOP);
+  std::vector<std::unique_ptr<RawClient>> crowd;
+  for (int number = 0; number < 50; ++number) {
+    auto result = radix::makeSocketConnector(loop_, surroundings())->connect();
+    ASSERT_TRUE(result.link) << "client " << number << ": " << result.error;
+    crowd.push_back(std::make_unique<RawClient>(std::move(result.link)));
+    crowd.back()->say(radix::Hello{.name = "crowd"});
+    crowd.back()->say(radix::Delivery{true});
+  }
+  radixd.send(SIGCONT);
+  for (const auto& client : crowd) {
+    EXPECT_TRUE(loop_.runUntil([&] { return client->hello && !client->events.empty(); }, patience));
+  }
+}
+
+TEST_F(Radixd, WithoutDescriptorsItStaysUpAndServesAgainWhenThereAreSome) {
+  RadixdProcess radixd(arguments(), [] {
+    // Whatever ran this test may have left descriptors open.
+    ::close_range(3, ~0U, 0);
+    const rlimit few{16, 16};
+    ::setrlimit(RLIMIT_NOFILE, &few);
+  });
+  ASSERT_TRUE(radixd.waitForLog("listening")) << radixd.log();
+  std::vector<std::unique_ptr<RawClient>> crowd;
+  for (int number = 0; number < 30; ++number) {
+    crowd.push_back(std::make_unique<RawClient>(radix::makeSocketConnector(loop_, surroundings())->connect().link));
+    crowd.back()->say(radix::Hello{.name = "crowd"});
+  }
+  EXPECT_TRUE(radixd.waitForLog("cannot accept a connection: Too many open files; trying again soon"));
+  crowd.erase(crowd.begin(), crowd.begin() + 25);
+  for (const auto& client : crowd) {
+    EXPECT_TRUE(loop_.runUntil([&] { return client->hello.has_value(); }, patience));
+  }
+}
+
+TEST_F(Radixd, TakesTheSocketThatASystemManagerHandsOverAndLeavesItInPlace) {
+  FileDescriptor socket(::socket(AF_UNIX, SOCK_SEQPACKET | SOCK_CLOEXEC, 0));
+  sockaddr_un address{};
+  address.sun_family = AF_UNIX;
+  std::memcpy(address.sun_path, socket_.data(), socket_.size());
+  ASSERT_EQ(::bind(socket.number(), reinterpret_cast<sockaddr*>(&address), sizeof address), 0);
+  ASSERT_EQ(::listen(socket.number(), 16), 0);
+  const int handed = socket.number();
+  RadixdProcess radixd({"--source", "trace:" + trace_}, [handed] {
+    // As a system manager does: the first descriptor after the standard ones, and whom it is for.
+    if (handed == 3) {
+      ::fcntl(3, F_SETFD, 0);
+    } else {
+      ::dup2(handed, 3);
+    }
+    ::setenv("LISTEN_FDS", "1", 1);
+    ::setenv("LISTEN_PID", std::to_string(::getpid()).c_str(), 1);
+  });
+  ASSERT_TRUE(radixd.waitForLog("listening at a socket of the system manager")) << radixd.log();
+  EXPECT_EQ(status(manager()), 0);
+  radixd.send(SIGTERM);
+  EXPECT_EQ(radixd.waitForEnd(), 0);
+  EXPECT_TRUE(exists(socket_));
+}
+
+TEST_F(Radixd, ATraceOfRandomBytesIsRefusedWithWhatIsWrong) {
+  std::mt19937 random(5);
+  std::ofstream noise(trace_, std::ios::binary);
+  for (int count = 0; count < 100000; ++count) noise.put(static_cast<char>(random()));
+  noise.close();
+  RadixdProcess radixd(arguments());
+  EXPECT_EQ(radixd.waitForEnd(), 1);
+  EXPECT_THAT(radixd.log(), HasSubstr("radixd: error: the source 'trace:" + trace_ + ",loop' cannot be had: "));
+  EXPECT_FALSE(exists(socket_));
+}
+
+TEST_F(Radixd, ACommandLineThatIsNotUnderstoodEndsWithStatusTwoAndASourceThatIsNotThereWithOne) {
+  EXPECT_EQ(RadixdProcess({"--no-such-option"}).waitForEnd(), 2);
+  EXPECT_EQ(RadixdProcess({"--log-level", "loud"}).waitForEnd(), 2);
+  RadixdProcess unknown({"--socket", socket_, "--source", "crystal-ball"});
+  EXPECT_EQ(unknown.waitForEnd(), 1);
+  EXPECT_THAT(unknown.log(), HasSubstr("there is no source of the kind 'crystal-ball'"));
+}
+
+TEST_F(Radixd, TheLogLevelSaysHowMuchIsWritten) {
+  RadixdProcess quiet(arguments({"--log-level", "error"}));
+  // Nothing is written, so it is known to be there when it answers.
+  const auto client = manager();
+  const auto deadline = std::chrono::steady_clock::now() + patience;
+  while (status(client) != 0) ASSERT_LT(std::chrono::steady_clock::now(), deadline);
+  quiet.send(SIGTERM);
+  EXPECT_EQ(quiet.waitForEnd(), 0);
+  EXPECT_EQ(quiet.log(), "");
+}
+
+TEST_F(Radixd, SleepsWhileNobodyIsThere) {
+  RadixdProcess radixd(arguments());
+  ASSERT_TRUE(radixd.waitForLog("can fill"));
+  const auto switches = [&] {
+    std::ifstream file("/proc/" + std::to_string(radixd.process()) + "/status");
+    std::string line;
+    long total = 0;
+    while (std::getline(file, line)) {
+      if (line.find("voluntary_ctxt_switches") == 0) total = std::stol(line.substr(line.find(':') + 1));
+    }
+    return total;
+  };
+  // A moment to fall asleep in, then a second in which nothing may wake it.
+  bool late = false;
+  auto moment = loop_.after(std::chrono::milliseconds(200), [&] { late = true; });
+  loop_.runUntil([&] { return late; }, patience);
+  const long before = switches();
+  late = false;
+  moment = loop_.after(std::chrono::seconds(1), [&] { late = true; });
+  loop_.runUntil([&] { return late; }, patience);
+  EXPECT_EQ(switches(), before);
+}
+
+}  // namespace
+}  // namespace probeview
