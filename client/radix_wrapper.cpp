@@ -63,10 +63,10 @@ struct RadixWrapper::Shared {
     shared->systemLog.line(line);
     if (shared->delegate.get().expired()) return;
     shared->mainQueue.post([shared, content = std::move(content), operation, isRecord] {
-      const std::shared_ptr<RadixWrapperDelegate> delegate = shared->delegate.get().lock();
-      if (delegate == nullptr) return;
+      const std::shared_ptr<RadixWrapperDelegate> receiver = shared->delegate.get().lock();
+      if (receiver == nullptr) return;
       if (isRecord) shared->noteRecord(*content);
-      (*delegate.*operation)(content.get());
+      (*receiver.*operation)(content.get());
     });
   }
 

@@ -17,6 +17,9 @@ template <typename... Visitors>
 struct Overloaded : Visitors... {
   using Visitors::operator()...;
 };
+// clang 14 does not deduce the arguments of an aggregate by itself.
+template <typename... Visitors>
+Overloaded(Visitors...) -> Overloaded<Visitors...>;
 
 const Dictionary& entryOf(const List& entries, std::size_t section, std::string_view key) {
   requireIndex("entry", section, entries.size(), key);
