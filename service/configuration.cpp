@@ -83,13 +83,49 @@ std::optional<std::int64_t> metricOf(std::string_view reference) {
   return metric != nullptr ? std::optional(metric->id) : std::nullopt;
 }
 
+// What the library is given to read: every character outside ASCII is U+FFFD there. No name of a metric has one, they
+// stay harmless in comments, and version 3.3.0 takes a wrong turn at those that its table of blanks does not expect.
+std::string withoutForeignCharacters(std::string_view utf8) {
+  std::string text;
+  text.reserve(utf8.size());
+  for (const char character : utf8) {
+    const auto byte = static_cast<unsigned char>(character);
+    if (byte < 0x80) {
+      text += character;
+    } else if (byte >= 0xC0) {
+      text += "\xEF\xBF\xBD";  // for the first byte of a sequence; the others are left out
+    }
+  }
+  return text;
+}
+
+// The number of bytes before the first sequence that is not UTF-8.
+std::size_t validPrefix(std::string_view text) {
+  std::string valid;
+  appendValidUtf8(text, valid);
+  const auto same = static_cast<std::size_t>(std::ranges::mismatch(text, valid).in1 - text.begin());
+  if (same == text.size()) return same;
+  // The faulty sequence may begin like the replacement that took its place.
+  const std::string_view before = text.substr(0, same);
+  return same - (before.ends_with("\xEF\xBF") ? 2 : before.ends_with("\xEF") ? 1 : 0);
+}
+
 class Parser {
  public:
   ConfigurationResult parse(std::string_view text) {
+    if (text.starts_with("\xEF\xBB\xBF")) text.remove_prefix(3);
+    if (const std::size_t valid = validPrefix(text); valid < text.size()) {
+      const std::string_view before = text.substr(0, valid);
+      const std::size_t lineBegin = before.rfind('\n') + 1;  // 0 where there is no line end
+      const auto isFirstByte = [](char character) { return (static_cast<unsigned char>(character) & 0xC0) != 0x80; };
+      return refusal(static_cast<std::uint32_t>(std::ranges::count(before, '\n') + 1),
+                     static_cast<std::uint32_t>(std::ranges::count_if(before.substr(lineBegin), isFirstByte) + 1),
+                     "this is not UTF-8");
+    }
     if (std::ranges::count(text, '.') > mostDots) {
       return refusal(1, 1, "more than " + std::to_string(mostDots) + " dots: this is no metric configuration");
     }
-    toml::parse_result parsed = toml::parse(text);
+    toml::parse_result parsed = toml::parse(withoutForeignCharacters(text));
     if (parsed.failed()) {
       const toml::parse_error& error = parsed.error();
       return refusal(error.source().begin.line, error.source().begin.column, oneLine(error.description()));

@@ -112,6 +112,23 @@ TEST(Configuration, ASectionWhoseNameBeginsWithNoLetterIsRefusedLikeAnyOtherSynt
   }
 }
 
+TEST(Configuration, CharactersOutsideAsciiAreWelcomeInCommentsAndRefusedInNames) {
+  const Configuration configuration =
+      parse("\xEF\xBB\xBF# Gr\u00fc\u00dfe \ufefe\n[metrics]\nK_LTE_RRC_STATE = 5 # \u3000\n");
+  EXPECT_EQ(configuration.plan.metrics.size(), 1u);
+  for (const char* text : {"\n\u00e9 = 1\n", "\n\ufefe\n", "\n\u2e4f = 1", "\n[\u0499]\n", "\nx = \u00e9\n"}) {
+    EXPECT_EQ(refusal(text).line, 2u) << text;
+  }
+}
+
+TEST(Configuration, WhatIsNotUtf8IsRefusedWithItsPlace) {
+  const ConfigurationResult result = refusal("# \u00e9\n# \u00e9\xff\n");
+  EXPECT_EQ(result.error, "line 2, column 4: this is not UTF-8");
+  for (const char* text : {"\xc3", "\xef", "\xef\xbf", "\xef\x41", "\xef\xbf\x41", "\xef\xbf\xc3"}) {
+    EXPECT_EQ(refusal(std::string("#") + text).error, "line 1, column 2: this is not UTF-8");
+  }
+}
+
 TEST(Configuration, WhatCannotBeMeantIsRefusedWithLineAndColumn) {
   const struct {
     const char* text;
