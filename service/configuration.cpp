@@ -104,7 +104,7 @@ std::size_t validPrefix(std::string_view text) {
   std::string valid;
   appendValidUtf8(text, valid);
   const auto same = static_cast<std::size_t>(std::ranges::mismatch(text, valid).in1 - text.begin());
-  if (same == text.size()) return same;
+  if (valid == text) return text.size();
   // The faulty sequence may begin like the replacement that took its place.
   const std::string_view before = text.substr(0, same);
   return same - (before.ends_with("\xEF\xBF") ? 2 : before.ends_with("\xEF") ? 1 : 0);
