@@ -1,0 +1,135 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// The manual pages and the completion know every subcommand and option that the programs have.
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include <array>
+#include <cstdio>
+#include <memory>
+#include <regex>
+#include <set>
+
+#include "messages/metric_identifiers.h"
+#include "tests/support/golden.h"
+#include "tests/tools/run_probectl.h"
+
+namespace probeview {
+namespace {
+
+using ::testing::Contains;
+using ::testing::HasSubstr;
+
+// As the page is read: without the escapes of its hyphens.
+std::string manual(const std::string& name) {
+  return std::regex_replace(contentOf("packaging/man/" + name), std::regex(R"(\\-)"), "-");
+}
+
+std::string outputOf(const std::string& command) {
+  std::string output;
+  const std::unique_ptr<FILE, int (*)(FILE*)> pipe(popen(command.c_str(), "r"), pclose);
+  std::array<char, 4096> buffer;
+  while (pipe && std::fgets(buffer.data(), buffer.size(), pipe.get()) != nullptr) output += buffer.data();
+  return output;
+}
+
+// The words that a help text lists as options.
+std::set<std::string> optionsOf(const std::string& help) {
+  std::set<std::string> options;
+  const std::regex option(R"((?:^|\n)  (?:-\w,)?(--[a-z-]+))");
+  for (std::sregex_iterator match(help.begin(), help.end(), option), end; match != end; ++match) {
+    options.insert((*match)[1]);
+  }
+  return options;
+}
+
+// The part of a page that stands under a subcommand's own headings.
+std::string sectionsOf(const std::string& page, const std::string& subcommand) {
+  std::string text;
+  std::istringstream lines(page);
+  std::string line;
+  bool inside = false;
+  while (std::getline(lines, line)) {
+    if (line.starts_with(".SS ") || line.starts_with(".SH ")) {
+      inside = line.starts_with(".SS " + subcommand + " ") || line == ".SS " + subcommand;
+    }
+    if (inside) text += line + "\n";
+  }
+  return text;
+}
+
+void requireDocumented(const CLI::App& command, const std::string& path, const std::string& page,
+                       const std::string& completion) {
+  for (const CLI::App* subcommand : command.get_subcommands([](const CLI::App*) { return true; })) {
+    const std::string name = path.empty() ? subcommand->get_name() : path + " " + subcommand->get_name();
+    const bool hasSubcommands = !subcommand->get_subcommands([](const CLI::App*) { return true; }).empty();
+    const std::string section = sectionsOf(page, name);
+    if (!hasSubcommands) {
+      EXPECT_NE(section, "") << name << " is missing in the manual";
+    }
+    EXPECT_THAT(completion, HasSubstr(subcommand->get_name()));
+    for (const CLI::Option* option : subcommand->get_options()) {
+      for (const std::string& longName : option->get_lnames()) {
+        if (longName == "help") continue;
+        EXPECT_THAT(section, HasSubstr("--" + longName)) << name;
+        EXPECT_THAT(completion, HasSubstr("--" + longName)) << name;
+      }
+    }
+    requireDocumented(*subcommand, name, page, completion);
+  }
+}
+
+TEST(Manual, ProbectlsPageAndCompletionKnowEverySubcommandAndOption) {
+  std::istringstream input;
+  std::ostringstream output;
+  Tool tool{.input = input, .output = output, .errors = output, .socketPath = {}, .run = {}};
+  const std::unique_ptr<CLI::App> grammar = makeProbectlGrammar(tool);
+  const std::string page = manual("probectl.1");
+  const std::string completion = contentOf("packaging/completion/probectl");
+  requireDocumented(*grammar, "", page, completion);
+  for (const std::string& option : optionsOf(probectl({"--help"}).output)) {
+    EXPECT_THAT(page, HasSubstr(option));
+    EXPECT_THAT(completion, HasSubstr(option));
+  }
+}
+
+TEST(Manual, TheOtherProgramsPagesKnowEveryOption) {
+  const struct {
+    const char* program;
+    const char* page;
+  } cases[] = {{RADIXD, "radixd.8"}, {PROBEVIEW, "probeview.1"}};
+  for (const auto& each : cases) {
+    const std::set<std::string> options = optionsOf(outputOf(std::string(each.program) + " --help"));
+    EXPECT_THAT(options, Contains("--version"));
+    for (const std::string& option : options) EXPECT_THAT(manual(each.page), HasSubstr(option)) << each.page;
+  }
+}
+
+TEST(Manual, EachPageStatesItsExitStatuses) {
+  for (const char* page : {"probectl.1", "radixd.8", "probeview.1"}) {
+    EXPECT_THAT(manual(page), HasSubstr(".SH EXIT STATUS\n.TP\n.B 0\n")) << page;
+  }
+}
+
+TEST(Completion, OffersSubcommandsOptionsAndEveryMetric) {
+  const auto offered = [](const std::string& words) {
+    // The last word is the one that is being typed.
+    return outputOf("bash -c '. packaging/completion/probectl; COMP_WORDS=(" + words +
+                    "); COMP_CWORD=$((${#COMP_WORDS[@]} - 1)); _probectl; echo \"${COMPREPLY[@]}\"' 2>&1");
+  };
+  EXPECT_EQ(offered("probectl \"\""), "status watch pages query config decode store --socket --version --help\n");
+  EXPECT_EQ(offered("probectl st"), "status store\n");
+  EXPECT_EQ(offered("probectl --socket /tmp/x wa"), "watch\n");
+  EXPECT_EQ(offered("probectl watch --p"), "--personal\n");
+  EXPECT_EQ(offered("probectl config \"\""), "push clear --help\n");
+  EXPECT_EQ(offered("probectl config push resources/kiv"), "resources/kiv_test_lte.deviceconfig\n");
+  EXPECT_EQ(offered("probectl query K_SIM"), "K_SIM_FILE_INFO\n");
+  EXPECT_EQ(offered("probectl watch --count \"\""), "\n");
+  const std::string metrics = offered("probectl decode K_");
+  for (const MetricIdentifier& metric : metricIdentifiers()) {
+    EXPECT_THAT(" " + metrics, testing::ContainsRegex(" " + std::string(metric.name) + "[ \n]"));
+  }
+}
+
+}  // namespace
+}  // namespace probeview
