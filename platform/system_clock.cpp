@@ -18,8 +18,9 @@ class SystemClock final : public Clock {
 }  // namespace
 
 const Clock& systemClock() {
-  static const SystemClock clock;
-  return clock;
+  // Never destroyed: a loop on another thread may still ask for the time while the process ends.
+  static const auto* clock = new SystemClock;
+  return *clock;
 }
 
 }  // namespace probeview
