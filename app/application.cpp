@@ -8,10 +8,10 @@
 namespace probeview {
 
 int applicationMain(std::string_view delegateClassName, Front& front,
-                    const std::function<void(Session&)>& beforeShowing) {
+                    const std::function<void(MetricSession&)>& beforeShowing) {
   const auto delegate = makeApplicationDelegate(delegateClassName);
   if (!delegate) fatalError("there is no application delegate \"" + std::string(delegateClassName) + "\"");
-  Session session(front);
+  MetricSession session(front);
   delegate->window = &front;
   if (!delegate->didFinishLaunchingWithOptions()) return 1;
   session.navigation().viewDidLoad();

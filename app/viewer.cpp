@@ -71,7 +71,7 @@ int runViewer(const ViewerOptions& options, const MakeWindow& makeWindow, std::o
     errors << error << "\n";
     return 1;
   }
-  return applicationMain("AppDelegate", *front, [&](Session& session) {
+  return applicationMain("AppDelegate", *front, [&](MetricSession& session) {
     if (options.pageKey) openPage(session.navigation(), *options.pageKey);
     if (auto* print = dynamic_cast<PrintFront*>(front.get())) {
       print->waitUntil([&session] { return session.isFilled(); });

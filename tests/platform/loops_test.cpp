@@ -10,6 +10,7 @@
 #include <thread>
 #include <vector>
 
+#include "platform/detachable_queue.h"
 #include "platform/event_loop.h"
 #include "platform/loop_thread.h"
 #include "platform/manual_loop.h"
@@ -282,6 +283,17 @@ TEST(ThreadGate, WaitingEndsAtTheDeadlineWhenNobodyOpens) {
   EXPECT_FALSE(gate->wait(milliseconds(1)));
   gate->open();
   EXPECT_TRUE(gate->wait(hours(1)));
+}
+
+TEST(DetachableQueue, TasksAreHandedOnUntilItIsDetachedAndDroppedFromThenOn) {
+  ManualLoop loop;
+  DetachableQueue queue(loop);
+  int ran = 0;
+  queue.post([&] { ++ran; });
+  queue.detach();
+  queue.post([&] { ++ran; });
+  loop.run();
+  EXPECT_EQ(ran, 1);
 }
 
 }  // namespace

@@ -3,6 +3,7 @@
 
 #include "app/fill_watch.h"
 #include "app/root_navigation_controller.h"
+#include "platform/detachable_queue.h"
 #include "ui/front.h"
 #include "ui/status_line.h"
 
@@ -11,10 +12,12 @@ namespace probeview {
 // A metric session of this process, whatever shows it: the wrapper, the store and the root controller, made on the
 // front's main queue. One per process, because wrapper and store are. Another console or system log is named before.
 // Main thread.
-class Session {
+class MetricSession {
  public:
   // Names the front's queue as the program's main queue; the front must outlive the session.
-  explicit Session(Front& front);
+  explicit MetricSession(Front& front);
+  // The wrapper goes on receiving until the process has ended; nothing of it reaches the front's queue any more.
+  ~MetricSession();
 
   RootNavigationController& navigation() { return navigation_; }
   // Why the pages move or stand still. The session must outlive it.
@@ -23,6 +26,7 @@ class Session {
   bool isFilled() { return fillWatch_.isFilled(); }
 
  private:
+  DetachableQueue& mainQueue_;
   RootNavigationController navigation_;
   StatusLine statusLine_;
   FillWatch fillWatch_;

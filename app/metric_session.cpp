@@ -1,0 +1,30 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "app/metric_session.h"
+
+#include "platform/main_queue.h"
+
+namespace probeview {
+
+namespace {
+
+// Named before the controller, whose properties make the wrapper, is made.
+DetachableQueue& nameMainQueue(Front& front) {
+  auto* queue = new DetachableQueue(front.mainQueue());
+  setMainQueue(*queue, front.scheduler());
+  return *queue;
+}
+
+}  // namespace
+
+MetricSession::MetricSession(Front& front)
+    : mainQueue_(nameMainQueue(front)), fillWatch_(navigation_.myMetricValidator, systemClock(), [this] {
+        return navigation_.myRadixWrapper->fillableMetrics();
+      }) {}
+
+MetricSession::~MetricSession() { mainQueue_.detach(); }
+
+StatusText MetricSession::statusText() const {
+  return [this] { return statusLine_.text(navigation_.myRadixWrapper->serviceStatus()); };
+}
+
+}  // namespace probeview
