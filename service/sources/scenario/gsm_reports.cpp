@@ -8,6 +8,9 @@
 namespace probeview::scenario {
 namespace {
 
+// System information counts some differences in steps.
+constexpr std::uint32_t kDecibelsPerStep = 2;
+
 // The power control level of the largest power in the band (3GPP TS 45.005, 4.1.1).
 std::uint32_t largestPowerLevel(const Carrier& carrier) { return carrier.band == 1800 ? 0 : 5; }
 
@@ -41,9 +44,9 @@ void report(const Phone& phone, KCellularGsmIdleConfig& message) {
   message.setLac(cell.areaCode);
   message.setCi(cell.identity);
   message.setBsic(cell.physicalIdentity);
-  message.setDtxFromBs(1);          // the phone shall use discontinuous transmission
-  message.setRadioLinkTimeout(20);  // SACCH blocks
-  message.setMultibRep(2);          // neighbours of the other band to report
+  message.setDtxFromBs(1);         // the phone shall use discontinuous transmission
+  message.setRadioLinkTimeout(4);  // 20 SACCH blocks
+  message.setMultibRep(2);         // neighbours of the other band to report
   message.setGsmBand(static_cast<std::uint32_t>(bandCode(carrier)));
   message.setMsTxpwr(largestPowerLevel(carrier));
   message.setRxAccMin(units::gsmRxLev.toUnsigned(GsmSelection::kRxLevAccessMin));
@@ -56,7 +59,7 @@ void report(const Phone& phone, KCellularGsmIdleConfig& message) {
   message.setAcc(0);     // no access class is barred
   message.setBsPaMfrms(4);
   message.setCsPagemode(0);
-  message.setMaxRetransCs(4);
+  message.setMaxRetransCs(2);  // 4 times
   message.setEmergCallAllowed(1);
   message.setAttachAllowed(1);
   message.setHalfRateSupported(1);
@@ -100,7 +103,6 @@ void report(const Phone& phone, KCellularGsmGrrEventMeasCr& message) {
   }
   for (const CellMeasurement& measured : phone.gsm().neighbours.umts) {
     UmtsNcellMeas& neighbour = message.addUmtsNcellMeas();
-    neighbour.setCellType(0);  // FDD
     neighbour.setCpichSc(network.cells[measured.cell].physicalIdentity);
     neighbour.setDlUarfcn(network.carrierOf(measured.cell).channel);
     neighbour.setCpichRscp(units::utraRscp.toUnsigned(measured.strength));
@@ -124,8 +126,8 @@ void report(const Phone& phone, KCellularGsmGprsConfig& message) {
   message.setRac(cell.routingAreaCode);
   message.setSpPgCy(true);
   message.setNco(0);  // the phone chooses its cells itself
-  message.setNom(1);  // network mode of operation II: circuit and packet services page apart
-  message.setCrHyst(GsmSelection::kReselectHysteresis);
+  message.setNom(2);  // circuit and packet services page apart
+  message.setCrHyst(GsmSelection::kReselectHysteresis / kDecibelsPerStep);
   message.setAccThr(6);
   message.setExtUplTbfSupported(true);
   message.setPriorityClass(0);

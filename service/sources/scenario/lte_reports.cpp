@@ -15,6 +15,9 @@ std::uint32_t bandwidthIndex(const Carrier& carrier) {
   return units::lteBandwidthIndex(bandwidthMegahertz(carrier)).value_or(0);
 }
 
+// System information counts levels in steps of 2 dB (3GPP TS 36.331, 6.3.4: Q-RxLevMin, ReselectionThreshold).
+constexpr int kDecibelsPerStep = 2;
+
 void fill(RsrpRsrqSinr& values, const Network& network, const LteSample& sample) {
   values.setPhyCellId(network.cells[sample.cell].physicalIdentity);
   values.setRsrp0(units::lteSampleRsrp.toSigned(sample.rsrp[0]));
@@ -73,29 +76,29 @@ void report(const Phone& phone, KCellularLteSelReselCellInfo& message) {
   const Carrier& serving = network.carrierOf(*phone.lte().serving);
   // Band 3 reaches into band 9, which phones of another region know the carrier by (3GPP TS 36.331, 6.3.1).
   if (serving.band == 3) message.addMultiBandInfo(9);
-  message.setImsEmergencySupport(phone.registration().eps().voiceOverIms ? 1 : 0);
+  message.setImsEmergencySupport(network.hasVoiceOverIms(*phone.lte().serving) ? 1 : 0);
   message.setAcBarringForEmergency(0);
-  message.setQRxLevMin(LteSelection::kQRxLevMin);
+  message.setQRxLevMin(LteSelection::kQRxLevMin / kDecibelsPerStep);
   message.setQQualMin(LteSelection::kQQualMin);
   message.setQHyst(LteSelection::kHysteresis);
-  message.setSNonIntraSearchP(LteSelection::kNonIntraSearchP);
+  message.setSNonIntraSearchP(LteSelection::kNonIntraSearchP / kDecibelsPerStep);
   message.setSNonIntraSearchQ(LteSelection::kNonIntraSearchQ);
-  message.setSIntraSearchP(LteSelection::kIntraSearchP);
+  message.setSIntraSearchP(LteSelection::kIntraSearchP / kDecibelsPerStep);
   message.setSIntraSearchQ(LteSelection::kIntraSearchQ);
-  message.setThreshServingLowP(LteSelection::kServingLowP);
+  message.setThreshServingLowP(LteSelection::kServingLowP / kDecibelsPerStep);
   message.setPriorityOperatingFreq(serving.priority);
   std::set<std::uint32_t> listed{serving.channel};
   for (const Carrier& carrier : network.carriers) {
     if (carrier.technology != Technology::kLte || !listed.insert(carrier.channel).second) continue;
     NbrEutra& neighbour = message.addNbrEutra();
     neighbour.setEarfcn(carrier.channel);
-    neighbour.setQRxlevMin(LteSelection::kQRxLevMin);
+    neighbour.setQRxlevMin(LteSelection::kQRxLevMin / kDecibelsPerStep);
     neighbour.setQQualMin(LteSelection::kQQualMin);
     neighbour.setQOffset(0);
     neighbour.setPmax(LteSelection::kMaximumPower);
     neighbour.setDlBw(bandwidthIndex(carrier));
-    neighbour.setThresXHighP(LteSelection::kCandidateHighP);
-    neighbour.setThresXLowP(LteSelection::kCandidateLowP);
+    neighbour.setThresXHighP(LteSelection::kCandidateHighP / kDecibelsPerStep);
+    neighbour.setThresXLowP(LteSelection::kCandidateLowP / kDecibelsPerStep);
     neighbour.setThresXHighQ(LteSelection::kCandidateHighQ);
     neighbour.setThresXLowQ(LteSelection::kCandidateLowQ);
     neighbour.setPriority(carrier.priority);

@@ -4,6 +4,7 @@
 // 001/01 (ITU-T E.212, annex A), so that nothing here can be taken for a network that exists.
 #pragma once
 
+#include <algorithm>
 #include <cstddef>
 #include <cstdint>
 #include <optional>
@@ -85,6 +86,9 @@ struct Network {
 
   // What the cell's reference signal is radiated with, in dBm.
   double referenceDbm(CellIndex cell) const { return carrierOf(cell).referenceDbm + cells[cell].powerOffset; }
+  bool hasVoiceOverIms(CellIndex cell) const {
+    return std::find(voiceAreaCodes.begin(), voiceAreaCodes.end(), cells[cell].areaCode) != voiceAreaCodes.end();
+  }
   const Carrier& carrierOf(CellIndex cell) const { return carriers[cells[cell].carrier]; }
   Technology technologyOf(CellIndex cell) const { return carrierOf(cell).technology; }
 };

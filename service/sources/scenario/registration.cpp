@@ -263,7 +263,7 @@ void Registration::accept(Milliseconds now, Facts& facts) {
       eps_.groupIdentity = kGroupIdentity;
       eps_.groupCode = 1 + area / 2;
       if (!eps_.temporaryIdentity || random_.chance(0.4)) eps_.temporaryIdentity = newIdentity();
-      eps_.voiceOverIms = contains(network_.voiceAreaCodes, cell.areaCode);
+      eps_.voiceOverIms = network_.hasVoiceOverIms(*cell_);
       if (done != Procedure::kPeriodicAreaUpdate) updateLocation(true);
       break;
     }

@@ -65,8 +65,8 @@ Bytes administrativeData() { return {0x00, 0x00, 0x00, kNetworkCodeDigits}; }
 // Services that the card offers, bit 1 of byte 1 being service 1 (31.102, 4.2.8).
 Bytes serviceTable() {
   Bytes bytes(12, 0);
-  // Short messages, fixed dialling, the service provider's name, GSM access, the network's name, EPS mobility
-  // management information.
+  // Fixed dialling, short messages and their parameters, the service provider's name, GSM access and its security
+  // context, the network's name, EPS mobility management information.
   for (const unsigned service : {2U, 10U, 12U, 19U, 27U, 38U, 45U, 85U}) {
     bytes[(service - 1) / 8] = static_cast<std::uint8_t>(bytes[(service - 1) / 8] | 1U << ((service - 1) % 8));
   }

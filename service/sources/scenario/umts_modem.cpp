@@ -20,7 +20,7 @@ void UmtsModem::change(UmtsConnection to, const Circumstances& c) {
   state_.connection = to;
   since_ = c.now;
   c.facts.learn(Fact::kUmtsConnection, c.now);
-  configure(c);
+  if (state_.camped()) configure(c);
   if (!state_.connected()) c.facts.end(Fact::kUmtsTransmitPower);
 }
 
