@@ -3,3 +3,4 @@
 probeview_fuzz(configuration KNOWS configuration)
 probeview_fuzz(trace KNOWS trace_source)
 probeview_fuzz(batch KNOWS tools)
+probeview_fuzz(store KNOWS store client radix platform values)
