@@ -83,7 +83,7 @@ class Session final : radix::LinkListener, radix::FrameHandler {
   // Whether the last records are due to it now: at its first listening with each configuration. Asking settles it.
   bool takeLastRecordsDue();
 
-  // Queues the record; it leaves at the end of this turn of the loop, together with the others.
+  // Queues the record; it leaves soon, together with others.
   void send(std::int64_t metricId, const radix::FrameBytes& frame, std::chrono::nanoseconds now);
 
  private:
@@ -103,7 +103,9 @@ class Session final : radix::LinkListener, radix::FrameHandler {
   // Tells the client why and ends the conversation.
   void refuse(radix::Status status, const std::string& reason);
   void end();
-  void flushSoon();
+  // At the end of this turn of the loop; records that follow others closely wait a little for company.
+  void flushWords();
+  void flushRecords(std::chrono::nanoseconds now);
   void flush();
   std::string description() const;
 
@@ -130,6 +132,8 @@ class Session final : radix::LinkListener, radix::FrameHandler {
   RateMeter rate_;
   bool blocked_ = false;
   bool flushPosted_ = false;
+  ScheduledTaskHandle flushTimer_;
+  std::chrono::nanoseconds lastFlush_{};
   bool reading_ = true;
   // Seen by posted tasks, which may run after the session has gone.
   std::shared_ptr<bool> alive_;

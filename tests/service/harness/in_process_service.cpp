@@ -42,7 +42,8 @@ class InProcessService final : public TestService {
     return true;
   }
 
-  void settle() override { loop_.run(); }
+  // Long enough for records that wait for company.
+  void settle() override { loop_.advance(std::chrono::milliseconds(1)); }
   void onService(const std::function<void()>& task) override { task(); }
 
   void kill() override {
