@@ -58,7 +58,7 @@ int runPicturesProgram(int argc, char** argv, std::ostream& output, std::ostream
   int noArguments = 1;
   const auto front = qt::makePicturesFront(noArguments, argv, options, errors);
   return applicationMain("AppDelegate", *front,
-                         [&](Session& session) { front->waitUntil([&session] { return session.isFilled(); }); });
+                         [&](MetricSession& session) { front->waitUntil([&session] { return session.isFilled(); }); });
 }
 
 }  // namespace probeview

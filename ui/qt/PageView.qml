@@ -20,6 +20,20 @@ FocusScope {
             return;
         list.currentIndex = row;
         list.positionViewAtIndex(row, ListView.Contain);
+        // The header of the section stays on top of its rows: the row must not be behind it.
+        const item = list.itemAtIndex(row);
+        if (!item)
+            return;
+        topHeader.title = titleOf(item.ListView.section, view.page.titleRevision);
+        list.contentY = Math.max(list.originY, Math.min(list.contentY, item.y - topHeader.height));
+    }
+
+    // Only measures.
+    SectionHeader {
+        id: topHeader
+        visible: false
+        width: list.width
+        inset: list.inset
     }
 
     Rectangle {
@@ -47,7 +61,7 @@ FocusScope {
         Accessible.name: view.page ? view.page.title : ""
 
         section.property: "section"
-        section.labelPositioning: ViewSection.InlineLabels
+        section.labelPositioning: ViewSection.InlineLabels | ViewSection.CurrentLabelAtStart
         section.delegate: SectionHeader {
             required property string section
 
@@ -146,7 +160,6 @@ FocusScope {
         list.contentY = Math.max(first, Math.min(last, list.contentY + distance));
         const reached = list.indexAt(list.width / 2, list.contentY + (distance > 0 ? list.height - Theme.rowHeight
                                                                                   : Theme.rowHeight));
-        if (reached >= 0)
-            list.currentIndex = reached;
+        select(reached);
     }
 }

@@ -20,6 +20,7 @@ constexpr std::chrono::milliseconds portalPatience{50};
 class WindowFront final : public Front {
  public:
   WindowFront(int& argc, char** argv) : application_(argc, argv), appearance_(sessionBus()) {
+    chooseRenderer();
     QGuiApplication::setDesktopFileName(QStringLiteral("probeview"));
   }
 

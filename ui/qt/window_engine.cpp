@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "ui/qt/window_engine.h"
 
+#include <QOpenGLContext>
 #include <QQmlComponent>
 #include <QQmlError>
 #include <QQuickStyle>
@@ -10,6 +11,12 @@
 namespace probeview::qt {
 
 void prepareWindows() { QQuickStyle::setStyle(QStringLiteral("Fusion")); }
+
+void chooseRenderer() {
+  if (qEnvironmentVariableIsSet("QT_QUICK_BACKEND")) return;
+  QOpenGLContext context;
+  if (!context.create()) QQuickWindow::setGraphicsApi(QSGRendererInterface::Software);
+}
 
 Window::Window(Viewer& viewer) {
   engine_.addImportPath(QStringLiteral("qrc:/"));

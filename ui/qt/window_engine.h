@@ -13,6 +13,10 @@ namespace probeview::qt {
 // the environment prefers.
 void prepareWindows();
 
+// To be called once the application is there, before the first window: draws without OpenGL where there is none,
+// instead of not at all. What QT_QUICK_BACKEND asks for stands above.
+void chooseRenderer();
+
 // A window, with the engine that runs its QML. Not visible yet.
 class Window {
  public:

@@ -85,6 +85,31 @@ TEST_F(WindowKeyboard, TheMarkedRowComesIntoSight) {
   EXPECT_EQ(current(), 59);
 }
 
+TEST_F(WindowKeyboard, TheMarkedRowIsNeverBehindTheHeaderThatStaysOnTop) {
+  auto page = std::make_unique<testing_ui::HandPage>();
+  for (int section = 0; section < 3; ++section) {
+    page->content.sections.push_back(testing_ui::sectionOfRows(15));
+    page->content.sections.back().title = "Neighbor " + std::to_string(section);
+  }
+  showPage(std::move(page));
+  press(Qt::Key_End);
+  for (int step = 44; step >= 0; --step) {
+    rest();
+    ASSERT_EQ(current(), step);
+    auto* marked = list()->property("currentItem").value<QQuickItem*>();
+    const QRectF place = marked->mapRectToItem(list(), marked->boundingRect());
+    for (auto* text : textsIn(list())) {
+      if (text->objectName() != QLatin1String("sectionTitle")) continue;
+      auto* header = text->parentItem();
+      const QRectF covered = header->mapRectToItem(list(), header->boundingRect()).adjusted(0, 0.5, 0, -0.5);
+      EXPECT_FALSE(covered.intersects(place)) << textOf(text) << " covers row " << step;
+    }
+    EXPECT_GE(place.top(), 0);
+    EXPECT_LE(place.bottom(), list()->height());
+    press(Qt::Key_Up);
+  }
+}
+
 TEST_F(WindowKeyboard, ARowThatIsNotShownIsSkipped) {
   auto page = std::make_unique<testing_ui::HandPage>();
   page->content.sections = {testing_ui::sectionOfRows(1), {"no rows here", {}}, testing_ui::sectionOfRows(1)};
