@@ -88,8 +88,6 @@ class LteModem {
   explicit LteModem(const Network& network) : network_(network) {}
 
   const LteState& state() const { return state_; }
-  // Since when the condition of the handover that was last made, or is awaited, has been true.
-  Milliseconds handoverConditionSince() const { return handover_.since(); }
 
   // Camps on a cell, or arrives in it with a connection.
   void enter(CellIndex cell, Manner manner, const Circumstances& c);

@@ -6,7 +6,6 @@
 #include <algorithm>
 #include <cmath>
 #include <cstdint>
-#include <functional>
 #include <optional>
 #include <vector>
 
@@ -75,8 +74,6 @@ class Pending {
     return candidate_.has_value() && now - since_ >= time;
   }
   void clear() { candidate_.reset(); }
-  // Since when the candidate has been wished for.
-  Milliseconds since() const { return since_; }
 
  private:
   std::optional<CellIndex> candidate_;

@@ -30,12 +30,10 @@ class Phone {
 
   Milliseconds now() const { return now_; }
   const Network& network() const { return world_.network; }
-  const Route& route() const { return world_.route; }
   const Surroundings& surroundings() const { return surroundings_; }
   const Facts& facts() const { return facts_; }
   // The technology in service.
   std::optional<Technology> technology() const { return technology_; }
-  const LteModem& lteModem() const { return lte_; }
   const LteState& lte() const { return lte_.state(); }
   const UmtsState& umts() const { return umts_.state(); }
   const GsmState& gsm() const { return gsm_.state(); }

@@ -189,6 +189,11 @@ void Registration::advance(Milliseconds now, bool connected, Facts& facts) {
   }
   if (!connected && !packetInGsm) {
     ends_ = -1;  // the connection broke; the procedure waits for the next
+    if (procedure_ == Procedure::kLocationUpdate) mobility_.failure = ProcedureFailure::kLowerLayers;
+    if (procedure_ == Procedure::kGprsAttach || procedure_ == Procedure::kRoutingAreaUpdate) {
+      gprs_.failure = ProcedureFailure::kLowerLayers;
+    }
+    touch(procedure_, now, facts);
     return;
   }
   if (now >= ends_) finish(now, facts);

@@ -26,7 +26,7 @@ enum class Service : std::int32_t {
 };
 enum class LocationUpdate : std::int32_t { kUpdated = 1, kNotUpdated = 2, kRoamingNotAllowed = 3 };
 enum class PacketUpdate : std::int32_t { kUpdated = 0, kNotUpdated = 1, kRoamingNotAllowed = 2 };  // GPRS and EPS
-enum class ProcedureFailure : std::int32_t { kNone = 0, kLowerLayers = 1, kLimitedService = 3, kRejected = 11 };
+enum class ProcedureFailure : std::int32_t { kNone = 0, kLowerLayers = 1, kRejected = 11 };
 enum class Reject : std::int32_t {
   kNone = 0,
   kNoSuitableCellInLocationArea = 15,  // of a tracking area, for EPS

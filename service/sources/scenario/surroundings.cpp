@@ -2,7 +2,6 @@
 #include "service/sources/scenario/surroundings.h"
 
 #include <algorithm>
-#include <limits>
 
 #include "service/sources/scenario/decibel.h"
 
@@ -53,11 +52,6 @@ void Surroundings::measure(Technology technology, Point where, double weight) {
   }
   sumCarriers(technology);
   rank(technology);
-}
-
-void Surroundings::forget(Technology technology) {
-  for (const CellIndex cell : cells_[static_cast<std::size_t>(technology)]) filtered_[cell] = kNotHeard;
-  heard_[static_cast<std::size_t>(technology)].clear();
 }
 
 void Surroundings::sumCarriers(Technology technology) {

@@ -31,8 +31,6 @@ class Surroundings {
   // Measures all cells of the technology at a place. The weight of the new measurement in the filtered level is that
   // of layer 3 filtering (3GPP TS 36.331, 5.5.3.2), 1 forgets the past; a cell that was not heard before starts afresh.
   void measure(Technology technology, Point where, double weight);
-  // Forgets what was measured of a technology, so that old levels are not taken for new ones.
-  void forget(Technology technology);
 
   // RSRP, CPICH RSCP or RxLev in dBm, filtered and within the technology's range.
   double strength(CellIndex cell) const;
