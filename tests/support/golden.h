@@ -8,15 +8,14 @@
 
 #include <unistd.h>
 
-#include <array>
-#include <cstdio>
 #include <cstdlib>
 #include <filesystem>
 #include <fstream>
-#include <memory>
 #include <sstream>
 #include <string>
 #include <string_view>
+
+#include "tests/support/output_of.h"
 
 namespace probeview {
 
@@ -33,10 +32,7 @@ inline std::string differenceTo(const std::filesystem::path& golden, std::string
       std::filesystem::path(::testing::TempDir()) / (golden.filename().string() + "." + std::to_string(getpid()));
   std::ofstream(other, std::ios::binary) << actual;
   const std::string command = "diff -u '" + golden.string() + "' '" + other.string() + "' | cut -c 1-400";
-  std::string difference;
-  const std::unique_ptr<FILE, int (*)(FILE*)> pipe(popen(command.c_str(), "r"), pclose);
-  std::array<char, 4096> buffer;
-  while (pipe && std::fgets(buffer.data(), buffer.size(), pipe.get()) != nullptr) difference += buffer.data();
+  const std::string difference = outputOf(command);
   std::filesystem::remove(other);
   return difference;
 }

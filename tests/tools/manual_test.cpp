@@ -4,14 +4,13 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
-#include <array>
-#include <cstdio>
 #include <memory>
 #include <regex>
 #include <set>
 
 #include "messages/metric_identifiers.h"
 #include "tests/support/golden.h"
+#include "tests/support/output_of.h"
 #include "tests/tools/run_probectl.h"
 
 namespace probeview {
@@ -23,14 +22,6 @@ using ::testing::HasSubstr;
 // As the page is read: without the escapes of its hyphens.
 std::string manual(const std::string& name) {
   return std::regex_replace(contentOf("packaging/man/" + name), std::regex(R"(\\-)"), "-");
-}
-
-std::string outputOf(const std::string& command) {
-  std::string output;
-  const std::unique_ptr<FILE, int (*)(FILE*)> pipe(popen(command.c_str(), "r"), pclose);
-  std::array<char, 4096> buffer;
-  while (pipe && std::fgets(buffer.data(), buffer.size(), pipe.get()) != nullptr) output += buffer.data();
-  return output;
 }
 
 // The words that a help text lists as options.
