@@ -33,7 +33,10 @@ std::string ageText(std::chrono::nanoseconds age) {
 std::string StatusLine::text(const ServiceStatus& status) const {
   const auto& [connection, lastRecord] = status;
   if (!connection.connected) {
-    if (!connection.everConnected) return "Waiting for the baseband service";
+    // Why it does not come is worth its place: who waits may be waiting at the wrong socket.
+    if (!connection.everConnected) {
+      return "Waiting for the baseband service" + (connection.trouble.empty() ? "" : " · " + connection.trouble);
+    }
     return "Baseband service away since " + localTime(connection.since) +
            (lastRecord ? ", showing what was last known" : ", nothing received yet");
   }

@@ -15,7 +15,7 @@ namespace probeview {
 //
 //   scenario:city · 0.4 s ago
 //   Connected to the baseband service, nothing received yet
-//   Waiting for the baseband service
+//   Waiting for the baseband service · you may not connect to the baseband service at /run/radixd/radix.sock
 //   Baseband service away since 12:03:10, showing what was last known
 class StatusLine {
  public:

@@ -63,6 +63,14 @@ TEST_F(Status, BeforeTheServiceWasEverThereItWaits) {
   EXPECT_EQ(line.text(ServiceStatus{}), "Waiting for the baseband service");
 }
 
+TEST_F(Status, WhileItWaitsItSaysWhyIfItKnows) {
+  ServiceStatus status;
+  status.connection.trouble = "you may not connect to the baseband service at /run/radixd/radix.sock";
+  EXPECT_EQ(line.text(status),
+            "Waiting for the baseband service · you may not connect to the baseband service at "
+            "/run/radixd/radix.sock");
+}
+
 TEST_F(Status, AServiceThatHasSentNothingYetIsConnected) {
   EXPECT_EQ(line.text(connected()), "Connected to the baseband service, nothing received yet");
 }
