@@ -98,10 +98,6 @@ bool SourceSlot::query(std::int64_t metricId) {
 double SourceSlot::recordsPerSecond() const { return rate_.perSecond(worker_.clock().monotonicTime(), started_); }
 
 void SourceSlot::emit(MetricRecord record) {
-  if (emitting_) {
-    withhold(record, "it was emitted while another record was on its way");
-    return;
-  }
   if (record.payload.size() > longestPayload) {
     withhold(record, "its payload has " + std::to_string(record.payload.size()) + " bytes, more than " +
                          std::to_string(longestPayload));
@@ -116,9 +112,7 @@ void SourceSlot::emit(MetricRecord record) {
   ++records_;
   rate_.add(worker_.clock().monotonicTime());
   lastRecord_ = record.time;
-  emitting_ = true;
   taker_(std::move(record));
-  emitting_ = false;
 }
 
 void SourceSlot::withhold(const MetricRecord& record, const std::string& reason) {
@@ -142,7 +136,6 @@ void SourceSlot::guarded(const char* occasion, const std::function<void()>& call
 }
 
 void SourceSlot::fail(const char* occasion, const std::string& reason) {
-  emitting_ = false;
   failure_ = std::string("failed ") + occasion + ": " + reason;
   log_.write(LogLevel::Error, (origin_.empty() ? "a source" : origin_) + " " + failure_ + "; it runs no more");
   // Not from inside its own code.

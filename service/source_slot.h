@@ -61,7 +61,6 @@ class SourceSlot final : MetricSink {
   std::string origin_;
   std::vector<std::int64_t> metrics_;
   std::string failure_;
-  bool emitting_ = false;
   std::uint64_t records_ = 0;
   std::uint64_t withheld_ = 0;
   RateMeter rate_;

@@ -242,6 +242,30 @@ TEST_F(Radixd, TheLogLevelSaysHowMuchIsWritten) {
   EXPECT_EQ(quiet.log(), "");
 }
 
+TEST_F(Radixd, GoesOnWhenNobodyCanTakeItsLog) {
+  for (const char* where : {"/dev/full", "closed"}) {
+    RadixdProcess radixd(arguments(), [where] {
+      const std::string target = where;
+      if (target == "closed") {
+        // A pipe that nobody reads.
+        int ends[2];
+        if (::pipe(ends) != 0) ::_exit(1);
+        ::close(ends[0]);
+        ::dup2(ends[1], STDERR_FILENO);
+        ::close(ends[1]);
+      } else {
+        const int full = ::open(where, O_WRONLY);
+        ::dup2(full, STDERR_FILENO);
+      }
+    });
+    const auto client = manager();
+    const auto deadline = std::chrono::steady_clock::now() + patience;
+    while (status(client) != 0) ASSERT_LT(std::chrono::steady_clock::now(), deadline) << where;
+    radixd.send(SIGTERM);
+    EXPECT_EQ(radixd.waitForEnd(), 0) << where;
+  }
+}
+
 TEST_F(Radixd, SleepsWhileNobodyIsThere) {
   RadixdProcess radixd(arguments());
   ASSERT_TRUE(radixd.waitForLog("can fill"));
