@@ -60,11 +60,6 @@ ApplicationWindow {
         stack.pop();
     }
 
-    function backByKey() {
-        keyboardUsed = true;
-        back();
-    }
-
     header: TitleBar {
         context: stack.depth > 2 ? stack.get(stack.depth - 2).page.title : ""
         title: stack.currentItem ? stack.currentItem.page.title : ""
@@ -115,14 +110,15 @@ ApplicationWindow {
         pushExit: Transition { Slide { from: 0; to: -stack.width / 4 } }
         popEnter: Transition { Slide { from: -stack.width / 4; to: 0 } }
         popExit: Transition { Slide { from: 0; to: stack.width } }
+    }
 
-        Keys.onEscapePressed: window.backByKey()
-        Keys.onBackPressed: window.backByKey()
-        Keys.onPressed: event => {
-            if (event.key === Qt.Key_Left && (event.modifiers & Qt.AltModifier)) {
-                window.backByKey();
-                event.accepted = true;
-            }
+    // Wherever the keyboard is, the list or the back button.
+    Shortcut {
+        sequences: ["Esc", "Alt+Left", "Back"]
+        autoRepeat: false
+        onActivated: {
+            window.keyboardUsed = true;
+            window.back();
         }
     }
 

@@ -103,7 +103,28 @@ void PageModel::reload() {
 }
 
 void PageModel::follow(const PageSnapshot& after) {
-  for (const auto& edit : snapshotDifference(shown_, after)) apply(edit, after);
+  // Changed rows of a section are announced as one stretch: a list view takes longer to hear of a thousand changes than
+  // to read the few rows in sight once more.
+  std::optional<std::pair<int, int>> changed;
+  const auto announce = [&] {
+    if (changed) announceChange(changed->first, changed->second);
+    changed.reset();
+  };
+  std::size_t section = 0;
+  for (const auto& edit : snapshotDifference(shown_, after)) {
+    if (edit.kind != SnapshotEdit::Kind::ChangeRows || edit.section != section) announce();
+    section = edit.section;
+    if (edit.kind != SnapshotEdit::Kind::ChangeRows) {
+      apply(edit, after);
+      continue;
+    }
+    applyEdit(shown_, edit, after);
+    const int first = start(section) + static_cast<int>(edit.first);
+    const int last = first + static_cast<int>(edit.count) - 1;
+    changed =
+        changed ? std::pair(std::min(changed->first, first), std::max(changed->second, last)) : std::pair(first, last);
+  }
+  announce();
 }
 
 void PageModel::apply(const SnapshotEdit& edit, const PageSnapshot& after) {
@@ -134,12 +155,8 @@ void PageModel::apply(const SnapshotEdit& edit, const PageSnapshot& after) {
       if (filled) announceChange(first, first);
       return;
     }
-    case Kind::ChangeRows: {
-      const int first = start(edit.section) + static_cast<int>(edit.first);
-      applyEdit(shown_, edit, after);
-      announceChange(first, first + count - 1);
-      return;
-    }
+    case Kind::ChangeRows:
+      return;  // see follow()
     case Kind::ChangeTitle:
       applyEdit(shown_, edit, after);
       ++titleRevision_;

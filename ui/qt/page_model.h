@@ -67,6 +67,7 @@ class PageModel final : public QAbstractListModel {
 
   void reload();
   void follow(const PageSnapshot& after);
+  // Of the kinds that make rows or titles come and go.
   void apply(const SnapshotEdit& edit, const PageSnapshot& after);
   // How many rows of the Qt list a section takes; where a section's first one is.
   static int extent(const PageSnapshot::Section& section);

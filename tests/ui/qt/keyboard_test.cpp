@@ -135,5 +135,16 @@ TEST_F(WindowKeyboard, TabReachesTheBackButtonAndReturnPressesIt) {
   EXPECT_TRUE(list()->hasActiveFocus()) << "the list has the keyboard again";
 }
 
+TEST_F(WindowKeyboard, EscapeGoesBackFromTheBackButtonToo) {
+  show();
+  clickRow("LTE");
+  rest();
+  press(Qt::Key_Tab);
+  ASSERT_TRUE(part(window().contentItem(), "backButton")->hasActiveFocus());
+  press(Qt::Key_Escape);
+  rest();
+  EXPECT_EQ(stack->depth(), 1u);
+}
+
 }  // namespace
 }  // namespace probeview

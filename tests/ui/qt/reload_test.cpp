@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
-#include <QElapsedTimer>
 #include <algorithm>
+#include <ctime>
 
 #include "tests/ui/qt/window_testing.h"
 
@@ -216,21 +216,27 @@ TEST_F(WindowReload, TheStatusLineIsAskedAnewEverySecondAndStandsOutsideTheList)
   EXPECT_GE(status()->mapToScene({}).y(), list()->mapToScene(QPointF(0, list()->height())).y());
 }
 
-TEST_F(WindowReload, AReloadOfTenThousandRowsCostsLittle) {
-  auto& page = showRows(10000, 30000);
-  const auto before = standing();
-  auto& rows = page.content.sections[0].rows;
-  for (std::size_t row = 0; row < rows.size(); row += 2) rows[row].detail = "new";
-  for (int row = 0; row < 20; ++row) rows.insert(rows.begin() + 11 * row, valueRow("new " + std::to_string(row), "x"));
-  QElapsedTimer watch;
-  watch.start();
-  page.reload();
-  const auto reload = static_cast<double>(watch.nsecsElapsed()) / 1e6;
-  rest();
-  RecordProperty("reload_ms", std::to_string(reload));
-  EXPECT_EQ(standing(), before);
-  // About 10 ms on a desktop; the limit only catches a cost that grows with the square of the rows.
-  EXPECT_LT(reload, 1000);
+TEST_F(WindowReload, AReloadCostsLittle) {
+  for (const std::size_t count : {std::size_t{1000}, std::size_t{10000}}) {
+    SCOPED_TRACE(count);
+    auto& page = showRows(count, 20000);
+    const auto before = standing();
+    auto& rows = page.content.sections[0].rows;
+    // Every second value is new, and some rows come.
+    for (std::size_t row = 0; row < rows.size(); row += 2) rows[row].detail = "new";
+    for (int row = 0; row < 20; ++row) {
+      rows.insert(rows.begin() + 11 * row, valueRow("new " + std::to_string(row), "x"));
+    }
+    // Processor time: how busy the machine is otherwise must not count.
+    const auto begin = std::clock();
+    page.reload();
+    const double milliseconds = 1000.0 * static_cast<double>(std::clock() - begin) / CLOCKS_PER_SEC;
+    RecordProperty("reload_of_" + std::to_string(count) + "_rows_ms", std::to_string(milliseconds));
+    rest();
+    EXPECT_EQ(standing(), before);
+    // A millisecond per thousand rows is usual; the limit only catches a cost that grows with the square of the rows.
+    EXPECT_LT(milliseconds, 1000);
+  }
 }
 
 }  // namespace
