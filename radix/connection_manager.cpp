@@ -20,8 +20,16 @@ using probeview::Worker;
 
 // Events that wait on the handlers' queue before no more are read, and before reading goes on. The rest waits in the
 // service, which then drops the oldest of each metric instead of letting the memory of this process grow.
+// A large payload counts as several events: what waits stays below some megabytes.
 constexpr std::size_t mostEventsWaiting = 4096;
 constexpr std::size_t fewEventsWaiting = 1024;
+constexpr std::size_t bytesOfOneEvent = 2048;
+
+std::size_t weightOf(const std::vector<Event>& events) {
+  std::size_t weight = 0;
+  for (const Event& event : events) weight += 1 + event.payload.size() / bytesOfOneEvent;
+  return weight;
+}
 
 Value number(std::int64_t value) { return value; }
 
@@ -64,8 +72,9 @@ class EventRoad : public std::enable_shared_from_this<EventRoad> {
 
   // On the worker.
   void deliver(std::vector<Event> events, const std::shared_ptr<ServiceConnection>& connection) {
-    const std::size_t before = waiting_.fetch_add(events.size());
-    if (before + events.size() > mostEventsWaiting && !stopped_.exchange(true)) connection->setEventsWelcome(false);
+    const std::size_t weight = weightOf(events);
+    const std::size_t before = waiting_.fetch_add(weight);
+    if (before + weight > mostEventsWaiting && !stopped_.exchange(true)) connection->setEventsWelcome(false);
     queue_->post(
         [self = shared_from_this(), batch = std::move(events),
          weak = std::weak_ptr<ServiceConnection>(connection)]() mutable { self->handle(batch, std::move(weak)); });
@@ -83,7 +92,8 @@ class EventRoad : public std::enable_shared_from_this<EventRoad> {
       if (found == handlers->end() || !found->second) continue;
       found->second(makeEventObject(event), event.group);
     }
-    const std::size_t left = waiting_.fetch_sub(batch.size()) - batch.size();
+    const std::size_t weight = weightOf(batch);
+    const std::size_t left = waiting_.fetch_sub(weight) - weight;
     if (left > fewEventsWaiting || closed_ || !stopped_.exchange(false)) return;
     worker_.post([weak = std::move(connection)] {
       if (const auto here = weak.lock()) here->setEventsWelcome(true);

@@ -144,16 +144,21 @@ void ServiceConnection::finish(Waiting waiting, Status status, std::string messa
 
 void ServiceConnection::restore() {
   if (configuration_) {
-    send(encode(Command{.sequence = ++lastSequence_, .name = kCommandAddConfiguration, .arguments = *configuration_}));
+    send(encode(Command{.sequence = nextSequence(), .name = kCommandAddConfiguration, .arguments = *configuration_}));
   }
   if (delivery_) send(encode(Delivery{true}));
+}
+
+std::uint32_t ServiceConnection::nextSequence() {
+  // 0 stands for a command that was not sent yet.
+  if (++lastSequence_ == 0) ++lastSequence_;
+  return lastSequence_;
 }
 
 void ServiceConnection::sendWaiting() {
   for (Waiting& one : waiting_) {
     if (one.sequence != 0) continue;
-    if (++lastSequence_ == 0) ++lastSequence_;
-    one.sequence = lastSequence_;
+    one.sequence = nextSequence();
     send(encode(Command{.sequence = one.sequence, .name = one.command->name, .arguments = one.command->arguments}));
   }
 }

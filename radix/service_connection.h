@@ -95,6 +95,7 @@ class ServiceConnection final : public std::enable_shared_from_this<ServiceConne
   void failAll(Status status, const std::string& reason);
   void finish(Waiting waiting, Status status, std::string message);
   void restore();
+  std::uint32_t nextSequence();
   void sendWaiting();
   void send(FrameBytes frame);
   void flush();

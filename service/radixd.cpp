@@ -82,7 +82,8 @@ std::vector<ListeningSocket::Result> openSockets(const Options& options) {
     }
     path = std::move(own.path);
   }
-  results.push_back(ListeningSocket::make(path));
+  results.push_back(ListeningSocket::make(
+      path, path == radix::systemSocketPath ? ListeningSocket::Sharing::Group : ListeningSocket::Sharing::User));
   return results;
 }
 

@@ -83,7 +83,11 @@ Service::Service(Worker& worker, ServiceLog log, Settings settings)
       started_(worker.clock().monotonicTime()),
       alive_(std::make_shared<bool>(true)) {}
 
-Service::~Service() { *alive_ = false; }
+Service::~Service() {
+  *alive_ = false;
+  // First, as a source may still report while it is stopped.
+  sources_.clear();
+}
 
 void Service::addSource(std::unique_ptr<MetricSource> source) {
   sources_.push_back(std::make_unique<SourceSlot>(std::move(source), worker_, log_,

@@ -15,7 +15,6 @@
 #include <utility>
 
 #include "radix/socket_link.h"
-#include "radix/socket_path.h"
 
 namespace probeview {
 
@@ -98,7 +97,7 @@ std::optional<Credentials> peerCredentials(int socket) {
   return result;
 }
 
-ListeningSocket::Result ListeningSocket::make(const std::string& path) {
+ListeningSocket::Result ListeningSocket::make(const std::string& path, Sharing sharing) {
   sockaddr_un address{};
   address.sun_family = AF_UNIX;
   if (path.empty()) return {nullptr, "the socket's path is empty"};
@@ -122,9 +121,8 @@ ListeningSocket::Result ListeningSocket::make(const std::string& path) {
 
   made->socket_ = makeSocket();
   if (!made->socket_) return {nullptr, "cannot make a socket: " + systemError()};
-  const bool isSystems = path == radix::systemSocketPath;
   // The mode is right from the first moment; this process has no other thread yet that makes files.
-  const mode_t before = ::umask(isSystems ? 0117 : 0177);
+  const mode_t before = ::umask(sharing == Sharing::Group ? 0117 : 0177);
   const int bound = ::bind(made->socket_.number(), reinterpret_cast<const sockaddr*>(&address), sizeof address);
   const int trouble = errno;
   ::umask(before);
@@ -134,7 +132,7 @@ ListeningSocket::Result ListeningSocket::make(const std::string& path) {
     return {nullptr, "cannot listen at " + path + ": " + systemError()};
   }
   made->access_.owner = ::geteuid();
-  if (isSystems) made->access_.group = ::getegid();
+  if (sharing == Sharing::Group) made->access_.group = ::getegid();
   return {std::move(made), {}};
 }
 

@@ -46,9 +46,12 @@ class ListeningSocket {
     std::string error;  // what, where and what to do
   };
 
-  // Makes the socket at the path: mode 0600; 0660 with the process's group for the system's own path. What a service
-  // that is no more has left there is replaced; a service that lives, and anything that is no socket, is not.
-  static Result make(const std::string& path);
+  // Whose the socket is: the user's alone (mode 0600), or the process's group's, too (0660), as a system's service is.
+  enum class Sharing { User, Group };
+
+  // Makes the socket at the path. What a service that is no more has left there is replaced; a service that lives, and
+  // anything that is no socket, is not.
+  static Result make(const std::string& path, Sharing sharing = Sharing::User);
   // Takes over an open descriptor.
   static Result adopt(int descriptor);
 

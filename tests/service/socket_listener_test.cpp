@@ -70,6 +70,14 @@ TEST_F(ListeningSocketTest, IsTheUsersAloneWhateverTheUmask) {
   EXPECT_EQ(result.socket->access().group, std::nullopt);
 }
 
+TEST_F(ListeningSocketTest, OfASystemIsItsGroupsToo) {
+  const auto result = ListeningSocket::make(path_, ListeningSocket::Sharing::Group);
+  ASSERT_TRUE(result.socket) << result.error;
+  EXPECT_EQ(statusOf(path_).st_mode & 07777, 0660U);
+  EXPECT_EQ(statusOf(path_).st_gid, ::getegid());
+  EXPECT_EQ(result.socket->access().group, ::getegid());
+}
+
 TEST_F(ListeningSocketTest, LeavesNothingBehind) {
   ListeningSocket::make(path_).socket.reset();
   EXPECT_FALSE(exists(path_));
