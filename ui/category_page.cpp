@@ -48,7 +48,7 @@ const Dictionary* fieldsOf(const CategoryPageRule& rule, const MetricValidator& 
 CategoryPage::CategoryPage(std::string key, const MetricValidator& metricValidator, LineSink& consoleLog)
     : key_(std::move(key)), rule_(categoryPageRule(key_)), metricValidator_(metricValidator), consoleLog_(consoleLog) {}
 
-std::size_t CategoryPage::numberOfSections() {
+std::size_t CategoryPage::numberOfSectionsInTableView() {
   if (rule_.sections == SectionRule::One) return 1;
   return std::get<EntryListSource>(rule_.source)(metricValidator_).size();
 }
@@ -66,7 +66,7 @@ std::size_t CategoryPage::numberOfRowsInSection(std::size_t section) {
   return 1;
 }
 
-void CategoryPage::cellForRow(std::size_t section, std::size_t row, ListCell& cell) {
+void CategoryPage::cellForRowAtIndexPath(std::size_t section, std::size_t row, ListCell& cell) {
   cell.identifier = SecondLevelViewController::cellIdentifier;
   if (rule_.cells == CellRule::ComeBackLater) {
     cell.text = "Come back later";

@@ -18,10 +18,10 @@ class CategoryPage final : public ListContent {
  public:
   CategoryPage(std::string key, const MetricValidator& metricValidator, LineSink& consoleLog);
 
-  std::size_t numberOfSections() override;
+  std::size_t numberOfSectionsInTableView() override;
   std::optional<std::string> titleForHeaderInSection(std::size_t section) override;
   std::size_t numberOfRowsInSection(std::size_t section) override;
-  void cellForRow(std::size_t section, std::size_t row, ListCell& cell) override;
+  void cellForRowAtIndexPath(std::size_t section, std::size_t row, ListCell& cell) override;
 
  private:
   const std::string key_;

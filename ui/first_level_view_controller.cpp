@@ -12,13 +12,13 @@ FirstLevelViewController::FirstLevelViewController(const PageEnvironment& enviro
 
 std::string FirstLevelViewController::title() const { return seguedThroughRow.value_or(""); }
 
-std::size_t FirstLevelViewController::numberOfSections() { return 1; }
+std::size_t FirstLevelViewController::numberOfSectionsInTableView() { return 1; }
 
 std::optional<std::string> FirstLevelViewController::titleForHeaderInSection(std::size_t) { return std::nullopt; }
 
 std::size_t FirstLevelViewController::numberOfRowsInSection(std::size_t) { return categories().size(); }
 
-void FirstLevelViewController::cellForRow(std::size_t, std::size_t row, ListCell& cell) {
+void FirstLevelViewController::cellForRowAtIndexPath(std::size_t, std::size_t row, ListCell& cell) {
   const auto& names = categories();
   requireIndex("row", row, names.size(), *seguedThroughRow);
   cell.identifier = cellIdentifier;

@@ -23,12 +23,12 @@ class ListContent {
  public:
   virtual ~ListContent() = default;
 
-  virtual std::size_t numberOfSections() = 0;
+  virtual std::size_t numberOfSectionsInTableView() = 0;
   // Absent: the section has no header.
   virtual std::optional<std::string> titleForHeaderInSection(std::size_t section) = 0;
   virtual std::size_t numberOfRowsInSection(std::size_t section) = 0;
   // Fills a cell that comes cleared. A section or row past the end stops the program.
-  virtual void cellForRow(std::size_t section, std::size_t row, ListCell& cell) = 0;
+  virtual void cellForRowAtIndexPath(std::size_t section, std::size_t row, ListCell& cell) = 0;
 };
 
 }  // namespace probeview

@@ -25,8 +25,10 @@ class ListPage : public ListContent {
   // For the navigation bar; never part of the list.
   virtual std::string title() const = 0;
 
-  virtual double heightForRow(std::size_t /*section*/, std::size_t /*row*/) const { return automaticDimension; }
-  virtual double estimatedHeightForRow(std::size_t /*section*/, std::size_t /*row*/) const {
+  virtual double heightForRowAtIndexPath(std::size_t /*section*/, std::size_t /*row*/) const {
+    return automaticDimension;
+  }
+  virtual double estimatedHeightForRowAtIndexPath(std::size_t /*section*/, std::size_t /*row*/) const {
     return automaticDimension;
   }
 

@@ -31,13 +31,14 @@ std::size_t PageSnapshot::rowCount() const {
 
 PageSnapshot takeSnapshot(ListContent& content) {
   PageSnapshot snapshot;
-  const std::size_t sectionCount = content.numberOfSections();
+  const std::size_t sectionCount = content.numberOfSectionsInTableView();
   snapshot.sections.reserve(sectionCount);
   for (std::size_t section = 0; section < sectionCount; ++section) {
     auto& taken = snapshot.sections.emplace_back();
     taken.title = content.titleForHeaderInSection(section);
     taken.rows.resize(content.numberOfRowsInSection(section));
-    for (std::size_t row = 0; row < taken.rows.size(); ++row) content.cellForRow(section, row, taken.rows[row]);
+    for (std::size_t row = 0; row < taken.rows.size(); ++row)
+      content.cellForRowAtIndexPath(section, row, taken.rows[row]);
   }
   return snapshot;
 }

@@ -14,8 +14,8 @@ SecondLevelViewController::SecondLevelViewController(const PageEnvironment& envi
 
 std::string SecondLevelViewController::title() const { return seguedThroughRow.value_or(""); }
 
-std::size_t SecondLevelViewController::numberOfSections() {
-  return CategoryPage(key(), myMetricValidator, consoleLog_).numberOfSections();
+std::size_t SecondLevelViewController::numberOfSectionsInTableView() {
+  return CategoryPage(key(), myMetricValidator, consoleLog_).numberOfSectionsInTableView();
 }
 
 std::optional<std::string> SecondLevelViewController::titleForHeaderInSection(std::size_t section) {
@@ -26,13 +26,15 @@ std::size_t SecondLevelViewController::numberOfRowsInSection(std::size_t section
   return CategoryPage(key(), myMetricValidator, consoleLog_).numberOfRowsInSection(section);
 }
 
-void SecondLevelViewController::cellForRow(std::size_t section, std::size_t row, ListCell& cell) {
-  CategoryPage(key(), myMetricValidator, consoleLog_).cellForRow(section, row, cell);
+void SecondLevelViewController::cellForRowAtIndexPath(std::size_t section, std::size_t row, ListCell& cell) {
+  CategoryPage(key(), myMetricValidator, consoleLog_).cellForRowAtIndexPath(section, row, cell);
 }
 
-double SecondLevelViewController::heightForRow(std::size_t, std::size_t) const { return automaticDimension; }
+double SecondLevelViewController::heightForRowAtIndexPath(std::size_t, std::size_t) const { return automaticDimension; }
 
-double SecondLevelViewController::estimatedHeightForRow(std::size_t, std::size_t) const { return automaticDimension; }
+double SecondLevelViewController::estimatedHeightForRowAtIndexPath(std::size_t, std::size_t) const {
+  return automaticDimension;
+}
 
 void SecondLevelViewController::viewDidLoad() {
   ListPage::viewDidLoad();

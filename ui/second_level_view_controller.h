@@ -28,12 +28,12 @@ class SecondLevelViewController final : public ListPage {
   const MetricValidator& myMetricValidator;
 
   std::string title() const override;
-  std::size_t numberOfSections() override;
+  std::size_t numberOfSectionsInTableView() override;
   std::optional<std::string> titleForHeaderInSection(std::size_t section) override;
   std::size_t numberOfRowsInSection(std::size_t section) override;
-  void cellForRow(std::size_t section, std::size_t row, ListCell& cell) override;
-  double heightForRow(std::size_t section, std::size_t row) const override;
-  double estimatedHeightForRow(std::size_t section, std::size_t row) const override;
+  void cellForRowAtIndexPath(std::size_t section, std::size_t row, ListCell& cell) override;
+  double heightForRowAtIndexPath(std::size_t section, std::size_t row) const override;
+  double estimatedHeightForRowAtIndexPath(std::size_t section, std::size_t row) const override;
 
   // Starts the timer. It ends with the page, and nothing else stops it: a covered page goes on reloading.
   void viewDidLoad() override;

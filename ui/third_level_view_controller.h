@@ -17,10 +17,10 @@ class ThirdLevelViewController final : public ListPage {
   VarnetViewItems tableViewFields;
 
   std::string title() const override { return "Detail"; }
-  std::size_t numberOfSections() override { return 1; }
+  std::size_t numberOfSectionsInTableView() override { return 1; }
   std::optional<std::string> titleForHeaderInSection(std::size_t) override { return std::nullopt; }
   std::size_t numberOfRowsInSection(std::size_t) override { return 1; }
-  void cellForRow(std::size_t, std::size_t, ListCell& cell) override { cell.identifier = cellIdentifier; }
+  void cellForRowAtIndexPath(std::size_t, std::size_t, ListCell& cell) override { cell.identifier = cellIdentifier; }
 };
 
 }  // namespace probeview

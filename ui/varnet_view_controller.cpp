@@ -9,7 +9,7 @@ namespace probeview {
 
 std::string VarnetViewController::title() const { return "probeview"; }
 
-std::size_t VarnetViewController::numberOfSections() { return 1; }
+std::size_t VarnetViewController::numberOfSectionsInTableView() { return 1; }
 
 std::optional<std::string> VarnetViewController::titleForHeaderInSection(std::size_t) { return std::nullopt; }
 
@@ -17,7 +17,7 @@ std::size_t VarnetViewController::numberOfRowsInSection(std::size_t) {
   return launchViewItems().launchViewItemNames.size();
 }
 
-void VarnetViewController::cellForRow(std::size_t, std::size_t row, ListCell& cell) {
+void VarnetViewController::cellForRowAtIndexPath(std::size_t, std::size_t row, ListCell& cell) {
   const auto& names = launchViewItems().launchViewItemNames;
   requireIndex("row", row, names.size(), "the launch list");
   cell.identifier = cellIdentifier;

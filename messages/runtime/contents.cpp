@@ -124,7 +124,6 @@ void TableWalker::copy(PBCodable& target, const PBCodable& source, const Message
 void TableWalker::copyDeep(PBCodable& target, const PBCodable& source, const MessageDescriptor& descriptor,
                            Block* block) {
   if (block == nullptr && !descriptor.isFlat) target.noteOwnedMemory();
-  // A value whose bit was cleared comes along, so that it is back in the copy too when the bit is set again.
   target._has = source._has;
   // Without a block for all, each element gets one of its own.
   const auto copyElement = [block](const PBCodable& element, const MessageDescriptor& elementDescriptor) {
@@ -141,7 +140,7 @@ void TableWalker::copyDeep(PBCodable& target, const PBCodable& source, const Mes
       case FieldKind::Enumeration:
       case FieldKind::SInt32:
       case FieldKind::Bool:
-        copyScalar(target, source, row);
+        if (source.hasBit(row.number)) copyScalar(target, source, row);
         break;
       case FieldKind::Bytes:
       case FieldKind::Text: {

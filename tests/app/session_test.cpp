@@ -183,10 +183,10 @@ class WarnedPage final : public ListPage {
  public:
   explicit WarnedPage(int& warnings) : warnings_(warnings) {}
   std::string title() const override { return ""; }
-  std::size_t numberOfSections() override { return 0; }
+  std::size_t numberOfSectionsInTableView() override { return 0; }
   std::optional<std::string> titleForHeaderInSection(std::size_t) override { return std::nullopt; }
   std::size_t numberOfRowsInSection(std::size_t) override { return 0; }
-  void cellForRow(std::size_t, std::size_t, ListCell&) override {}
+  void cellForRowAtIndexPath(std::size_t, std::size_t, ListCell&) override {}
   void didReceiveMemoryWarning() override { ++warnings_; }
 
  private:

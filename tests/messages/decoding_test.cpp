@@ -412,7 +412,7 @@ TEST(Decoding, AMessageNeedsNoLogToDropAMetricField) {
   EXPECT_EQ(message.timestamp(), 5U);
 }
 
-TEST(Decoding, TheRsrqOfAnAbsentAverageHasNoKeyAndEachSampleIsADictionary) {
+TEST(Decoding, AnAbsentAverageHasNoKeyAndEachSampleIsADictionary) {
   KCellularLteRsrpRsrqSinr message;
   ASSERT_TRUE(decode(message, "7a 02 20 01  7a 02 20 03"));
   EXPECT_EQ(shown(message), R"(["inst_values": [["rsrp0": -1], ["rsrp0": -2]]])");
@@ -420,8 +420,8 @@ TEST(Decoding, TheRsrqOfAnAbsentAverageHasNoKeyAndEachSampleIsADictionary) {
 
 TEST(Decoding, TheGapsInTheNumberingAreSkipped) {
   KCellularWcdmaSelReselCellInfo reselection;
-  // fields 14 to 18 and 20 as varints, then the priority of the cell
-  ASSERT_TRUE(decode(reselection, "7001 7801 800101 880101 900101 a00101 a80107"));
+  // fields 14 to 20 as varints (19 goes the way of a metric's number), then the priority of the cell
+  ASSERT_TRUE(decode(reselection, "7001 7801 800101 880101 900101 980101 a00101 a80107"));
   EXPECT_EQ(shown(reselection), R"(["s_cell_prio": 7])");
   KCellularGsmScellInfo cell;
   ASSERT_TRUE(decode(cell, "1001 1801 6001 2001"));  // fields 2, 3, 12, then mcc

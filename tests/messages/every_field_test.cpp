@@ -380,7 +380,7 @@ TEST(Enumerations, TheRrcCausesFrom31To253HaveNoNameAnd254And255Do) {
   EXPECT_EQ(shown(message), R"(["cause": "KLTE_RRC_CAUSE_NA"])");
 }
 
-TEST(Enumerations, InvalidIsANameOfTheFrameType) {
+TEST(Enumerations, InvalidIsANameOfTheFrameTypeAndThreeIsUnknown) {
   NbrEutra message;
   message.setFrameType(2);
   EXPECT_EQ(shown(message), R"(["frame_type": "INVALID"])");
@@ -423,7 +423,7 @@ TEST(Enumerations, TheRejectCausesHaveGapsAnd111IsNamedInBothTables) {
   EXPECT_EQ(shown(emm), R"(["reject_cause": "EMM_CAUSE_PROTOCOL_ERROR_UNSPECIFIED"])");
 }
 
-TEST(MetricIdentifiers, Are31Of29Handled) {
+TEST(MetricIdentifiers, Are31OfWhich29AreHandled) {
   EXPECT_EQ(metricIdentifiers().size(), 31U);
   std::size_t handled = 0;
   for (const MetricIdentifier& metric : metricIdentifiers()) {

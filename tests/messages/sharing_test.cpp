@@ -283,10 +283,13 @@ TEST(Sharing, AClearedBitReadsZeroAndSetAgainTheStoredValueIsBack) {
   message.setHasPrevStateDurMs(false);
   EXPECT_EQ(message.prevStateDurMs(), 0U);
   EXPECT_EQ(encodedHex(message), "");
-  const KCellularLteRrcState copy = message;
+  KCellularLteRrcState copy = message;
   message.setHasPrevStateDurMs(true);
   EXPECT_EQ(message.prevStateDurMs(), 7U);
   EXPECT_NE(copy, message);
+  // Only what is present is copied.
+  copy.setHasPrevStateDurMs(true);
+  EXPECT_EQ(copy.prevStateDurMs(), 0U);
 }
 
 TEST(Sharing, ValuesBehindAClearedBitDoNotCountInEqualityAndHash) {

@@ -37,6 +37,9 @@ class CategoryPages : public testing_ui::PagesTest {
     CategoryPage page(key, store, console);
     return outline(takeSnapshot(page));
   }
+  void receive(std::int64_t metricId, const std::vector<std::uint8_t>& payload) {
+    ASSERT_TRUE(store.metricsDidUpdate(Dictionary{{"kKeyMetricID", metricId}, {"kKeyPayload", Value::bytes(payload)}}));
+  }
   static Dictionary twoFields(std::string_view tag) {
     Dictionary dictionary;
     dictionary.set(Key::copy(std::string(tag) + "_second"), Value(std::int32_t{-7}));
@@ -187,7 +190,7 @@ TEST_F(CategoryPages, WithoutItsDictionaryTheLteServingCellPageComplainsOnceForE
   EXPECT_EQ(page.numberOfRowsInSection(0), 1u);
   EXPECT_EQ(console.lines.size(), 2u);
   ListCell cell;
-  page.cellForRow(0, 0, cell);
+  page.cellForRowAtIndexPath(0, 0, cell);
   EXPECT_EQ(console.lines.size(), 2u) << "its cell does not complain";
   store.filled[DisplayDictionary::myLTESCellInfoDict] = twoFields("field");
   takeSnapshot(page);
@@ -203,9 +206,42 @@ TEST_F(CategoryPages, NoOtherPageComplains) {
 
 TEST_F(CategoryPages, LteServingCellMeasShowsOnlyTheFirstEntryWithNoHeader) {
   CategoryPage page("LTE Serving Cell Meas", store, console);
-  EXPECT_EQ(page.numberOfSections(), 1u);
+  EXPECT_EQ(page.numberOfSectionsInTableView(), 1u);
   EXPECT_EQ(page.titleForHeaderInSection(0), std::nullopt);
   EXPECT_EQ(page.numberOfRowsInSection(0), store.myLTE().RsrpRsrqSinr[0].dictionary()->size());
+}
+
+TEST_F(CategoryPages, ALteNeighbourPageWithThreeEntriesShowsThreeSectionsEachWithOneRowPerField) {
+  // Three nbr_eutra: earfcn 1300; earfcn 1300 and priority 7; earfcn 1300, priority 7 and frame_type 1.
+  receive(0x3CD30E, {0xaa, 0x01, 0x03, 0x08, 0x94, 0x0a,              //
+                     0xaa, 0x01, 0x05, 0x08, 0x94, 0x0a, 0x58, 0x07,  //
+                     0xaa, 0x01, 0x07, 0x08, 0x94, 0x0a, 0x58, 0x07, 0x60, 0x01});
+  CategoryPage page("LTE EUTRA Neighbor Info", store, console);
+  const auto snapshot = takeSnapshot(page);
+  ASSERT_EQ(snapshot.sections.size(), 3u);
+  for (std::size_t index = 0; index < 3; ++index) {
+    EXPECT_EQ(snapshot.sections[index].title, "EUTRA Neighbor " + std::to_string(index));
+    EXPECT_EQ(snapshot.sections[index].rows.size(), index + 1);
+    EXPECT_EQ(snapshot.sections[index].rows[0].text, "earfcn");
+    EXPECT_EQ(snapshot.sections[index].rows[0].detail, "1300");
+  }
+  EXPECT_EQ(snapshot.sections[2].rows[2].detail, "TDD");
+}
+
+TEST_F(CategoryPages, UmtsServingCellMeasHasOneSectionPerEntryAndEveryRowReadsComeBackLater) {
+  // Two rx_info: rssi -1; rssi -1 and snr 1.
+  receive(0x3CD102, {0x1a, 0x02, 0x08, 0x01, 0x1a, 0x04, 0x08, 0x01, 0x20, 0x02});
+  CategoryPage page("UMTS Serving Cell Meas", store, console);
+  const auto snapshot = takeSnapshot(page);
+  ASSERT_EQ(snapshot.sections.size(), 2u);
+  for (std::size_t index = 0; index < 2; ++index) {
+    EXPECT_EQ(snapshot.sections[index].title, "RxInfo " + std::to_string(index));
+    EXPECT_EQ(snapshot.sections[index].rows.size(), index + 1);
+    for (const auto& row : snapshot.sections[index].rows) {
+      EXPECT_EQ(row.text, "Come back later");
+      EXPECT_EQ(row.detail, "Come back later");
+    }
+  }
 }
 
 TEST_F(CategoryPages, TheHeaderIsThePrefixAndTheSectionsNumberCountedFromZero) {
@@ -247,29 +283,30 @@ TEST_F(CategoryPages, ASectionPastTheEndOfAListStopsTheProgram) {
   CategoryPage page("LTE Tx Power", store, console);
   ListCell cell;
   EXPECT_EQ(stopReason([&] { page.numberOfRowsInSection(1); }), "entry 1 asked of LTE Tx Power, which has 1");
-  EXPECT_EQ(stopReason([&] { page.cellForRow(1, 0, cell); }), "entry 1 asked of LTE Tx Power, which has 1");
+  EXPECT_EQ(stopReason([&] { page.cellForRowAtIndexPath(1, 0, cell); }), "entry 1 asked of LTE Tx Power, which has 1");
 }
 
 TEST_F(CategoryPages, ARowPastTheEndOfItsFieldsStopsTheProgram) {
   ListCell cell;
-  EXPECT_EQ(stopReason([&] { CategoryPage("LTE Tx Power", store, console).cellForRow(0, 1, cell); }),
+  EXPECT_EQ(stopReason([&] { CategoryPage("LTE Tx Power", store, console).cellForRowAtIndexPath(0, 1, cell); }),
             "row 1 asked of LTE Tx Power, which has 1");
-  EXPECT_EQ(stopReason([&] { CategoryPage("LTE Sel Resel Parameters", store, console).cellForRow(0, 20, cell); }),
-            "row 20 asked of LTE Sel Resel Parameters, which has 20");
+  EXPECT_EQ(
+      stopReason([&] { CategoryPage("LTE Sel Resel Parameters", store, console).cellForRowAtIndexPath(0, 20, cell); }),
+      "row 20 asked of LTE Sel Resel Parameters, which has 20");
   store.filled[DisplayDictionary::myLTERRCStateDict] = twoFields("field");
-  EXPECT_EQ(stopReason([&] { CategoryPage("LTE RRC State", store, console).cellForRow(0, 2, cell); }),
+  EXPECT_EQ(stopReason([&] { CategoryPage("LTE RRC State", store, console).cellForRowAtIndexPath(0, 2, cell); }),
             "row 2 asked of LTE RRC State, which has 2");
 }
 
 TEST_F(CategoryPages, APageThatFallsBackHasAnAnswerForEveryRow) {
   ListCell cell;
-  CategoryPage("Device Info IMSI", store, console).cellForRow(7, 9, cell);
+  CategoryPage("Device Info IMSI", store, console).cellForRowAtIndexPath(7, 9, cell);
   EXPECT_EQ(cell, (ListCell{"SecondClickView", "Come back later", "Come back later"}));
 }
 
 TEST_F(CategoryPages, AnAbsentDictionaryLeavesTheCellAsItCame) {
   ListCell cell{"", "left", "alone"};
-  CategoryPage("GSM Idle Config", store, console).cellForRow(0, 0, cell);
+  CategoryPage("GSM Idle Config", store, console).cellForRowAtIndexPath(0, 0, cell);
   EXPECT_EQ(cell, (ListCell{"SecondClickView", "left", "alone"}));
 }
 
@@ -289,10 +326,10 @@ TEST_F(CategoryPages, ValuesAreShownInTheirOneTextForm) {
 TEST_F(CategoryPages, WithoutTechnologyOrCategoryEveryQuestionStopsTheProgram) {
   const auto stopsAtEveryQuestion = [](SecondLevelViewController& page) {
     ListCell cell;
-    EXPECT_TRUE(stopReason([&] { page.numberOfSections(); }));
+    EXPECT_TRUE(stopReason([&] { page.numberOfSectionsInTableView(); }));
     EXPECT_TRUE(stopReason([&] { page.titleForHeaderInSection(0); }));
     EXPECT_TRUE(stopReason([&] { page.numberOfRowsInSection(0); }));
-    EXPECT_TRUE(stopReason([&] { page.cellForRow(0, 0, cell); }));
+    EXPECT_TRUE(stopReason([&] { page.cellForRowAtIndexPath(0, 0, cell); }));
   };
   SecondLevelViewController page(environment);
   stopsAtEveryQuestion(page);
@@ -307,8 +344,8 @@ TEST_F(CategoryPages, WithoutTechnologyOrCategoryEveryQuestionStopsTheProgram) {
 
 TEST_F(CategoryPages, RowsAreAsHighAsTheirContentNeeds) {
   const SecondLevelViewController page(environment);
-  EXPECT_EQ(page.heightForRow(0, 0), automaticDimension);
-  EXPECT_EQ(page.estimatedHeightForRow(0, 0), automaticDimension);
+  EXPECT_EQ(page.heightForRowAtIndexPath(0, 0), automaticDimension);
+  EXPECT_EQ(page.estimatedHeightForRowAtIndexPath(0, 0), automaticDimension);
 }
 
 }  // namespace

@@ -29,7 +29,7 @@ class FirstLists : public testing_ui::PagesTest {
 
 TEST_F(FirstLists, TheLaunchPageShowsExactlyFourRowsInOrder) {
   VarnetViewController launch;
-  EXPECT_EQ(launch.numberOfSections(), 1u);
+  EXPECT_EQ(launch.numberOfSectionsInTableView(), 1u);
   EXPECT_EQ(launch.titleForHeaderInSection(0), std::nullopt);
   EXPECT_EQ(labels(launch), (Names{"Device Info", "LTE", "UMTS", "GSM"}));
 }
@@ -37,7 +37,7 @@ TEST_F(FirstLists, TheLaunchPageShowsExactlyFourRowsInOrder) {
 TEST_F(FirstLists, TheLaunchPagesCellsAreOfTheKindLaunchViewAndHaveNoDetail) {
   VarnetViewController launch;
   ListCell cell;
-  launch.cellForRow(0, 1, cell);
+  launch.cellForRowAtIndexPath(0, 1, cell);
   EXPECT_EQ(cell, (ListCell{"LaunchView", "LTE", std::nullopt}));
 }
 
@@ -49,7 +49,7 @@ TEST_F(FirstLists, TappingATechnologyShowsItsCategoriesAsManyAsItHas) {
     const ListCell tapped{"LaunchView", technology, std::nullopt};
     FirstLevelViewController page(environment);
     launch.prepareForNavigation(&tapped, page);
-    EXPECT_EQ(page.numberOfSections(), 1u);
+    EXPECT_EQ(page.numberOfSectionsInTableView(), 1u);
     EXPECT_EQ(page.titleForHeaderInSection(0), std::nullopt);
     EXPECT_EQ(page.numberOfRowsInSection(0), count) << technology;
     EXPECT_EQ(labels(page), VarnetViewItems().firstLevelViewItems.at(technology));
@@ -59,7 +59,7 @@ TEST_F(FirstLists, TappingATechnologyShowsItsCategoriesAsManyAsItHas) {
 TEST_F(FirstLists, TheCategoryListsCellsAreOfTheKindFirstClickViewAndHaveNoDetail) {
   first.seguedThroughRow = "GSM";
   ListCell cell;
-  first.cellForRow(0, 3, cell);
+  first.cellForRowAtIndexPath(0, 3, cell);
   EXPECT_EQ(cell, (ListCell{"FirstClickView", "Idle Config", std::nullopt}));
 }
 
@@ -117,24 +117,25 @@ TEST_F(FirstLists, AnotherSenderOrDestinationIsLeftAlone) {
 TEST_F(FirstLists, ACategoryListThatWasToldNoTechnologyStopsTheProgram) {
   ListCell cell;
   EXPECT_TRUE(testing_ui::stopReason([&] { first.numberOfRowsInSection(0); }));
-  EXPECT_TRUE(testing_ui::stopReason([&] { first.cellForRow(0, 0, cell); }));
-  EXPECT_EQ(first.numberOfSections(), 1u);
+  EXPECT_TRUE(testing_ui::stopReason([&] { first.cellForRowAtIndexPath(0, 0, cell); }));
+  EXPECT_EQ(first.numberOfSectionsInTableView(), 1u);
 }
 
 TEST_F(FirstLists, ACategoryListOfAnUnknownTechnologyStopsTheProgram) {
   ListCell cell;
   first.seguedThroughRow = "5G";
   EXPECT_TRUE(testing_ui::stopReason([&] { first.numberOfRowsInSection(0); }));
-  EXPECT_TRUE(testing_ui::stopReason([&] { first.cellForRow(0, 0, cell); }));
+  EXPECT_TRUE(testing_ui::stopReason([&] { first.cellForRowAtIndexPath(0, 0, cell); }));
 }
 
 TEST_F(FirstLists, ARowPastTheEndOfAListStopsTheProgram) {
   VarnetViewController launch;
   ListCell cell;
   first.seguedThroughRow = "Device Info";
-  EXPECT_EQ(testing_ui::stopReason([&] { launch.cellForRow(0, 4, cell); }),
+  EXPECT_EQ(testing_ui::stopReason([&] { launch.cellForRowAtIndexPath(0, 4, cell); }),
             "row 4 asked of the launch list, which has 4");
-  EXPECT_EQ(testing_ui::stopReason([&] { first.cellForRow(0, 3, cell); }), "row 3 asked of Device Info, which has 3");
+  EXPECT_EQ(testing_ui::stopReason([&] { first.cellForRowAtIndexPath(0, 3, cell); }),
+            "row 3 asked of Device Info, which has 3");
 }
 
 TEST_F(FirstLists, EveryPageBuildsItsOwnCopyOfTheItems) {

@@ -12,7 +12,7 @@ class RecordingContent final : public ListContent {
   std::vector<std::string> asked;
   std::vector<std::size_t> rows{2, 0, 1};
 
-  std::size_t numberOfSections() override {
+  std::size_t numberOfSectionsInTableView() override {
     asked.push_back("sections");
     return rows.size();
   }
@@ -25,7 +25,7 @@ class RecordingContent final : public ListContent {
     asked.push_back("rows " + std::to_string(section));
     return rows[section];
   }
-  void cellForRow(std::size_t section, std::size_t row, ListCell& cell) override {
+  void cellForRowAtIndexPath(std::size_t section, std::size_t row, ListCell& cell) override {
     asked.push_back("cell " + std::to_string(section) + " " + std::to_string(row));
     EXPECT_EQ(cell, ListCell{});
     cell.identifier = "Cell";

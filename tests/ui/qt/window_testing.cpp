@@ -8,7 +8,7 @@
 
 namespace probeview::testing_ui {
 
-std::size_t HandPage::numberOfSections() {
+std::size_t HandPage::numberOfSectionsInTableView() {
   ++timesAsked;
   return content.sections.size();
 }
@@ -16,7 +16,7 @@ std::optional<std::string> HandPage::titleForHeaderInSection(std::size_t section
   return content.sections.at(section).title;
 }
 std::size_t HandPage::numberOfRowsInSection(std::size_t section) { return content.sections.at(section).rows.size(); }
-void HandPage::cellForRow(std::size_t section, std::size_t row, ListCell& cell) {
+void HandPage::cellForRowAtIndexPath(std::size_t section, std::size_t row, ListCell& cell) {
   cell = content.sections.at(section).rows.at(row);
   cell.identifier = identifier;
 }

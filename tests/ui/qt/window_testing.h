@@ -32,10 +32,10 @@ class HandPage final : public ListPage {
   void reload() { reloadTask()(); }
 
   std::string title() const override { return name; }
-  std::size_t numberOfSections() override;
+  std::size_t numberOfSectionsInTableView() override;
   std::optional<std::string> titleForHeaderInSection(std::size_t section) override;
   std::size_t numberOfRowsInSection(std::size_t section) override;
-  void cellForRow(std::size_t section, std::size_t row, ListCell& cell) override;
+  void cellForRowAtIndexPath(std::size_t section, std::size_t row, ListCell& cell) override;
 };
 
 ListCell valueRow(std::string label, std::string value);

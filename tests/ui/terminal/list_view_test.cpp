@@ -56,12 +56,12 @@ class Page final : public ListPage {
   PageSnapshot content;
 
   std::string title() const override { return "page"; }
-  std::size_t numberOfSections() override { return content.sections.size(); }
+  std::size_t numberOfSectionsInTableView() override { return content.sections.size(); }
   std::optional<std::string> titleForHeaderInSection(std::size_t section) override {
     return content.sections[section].title;
   }
   std::size_t numberOfRowsInSection(std::size_t section) override { return content.sections[section].rows.size(); }
-  void cellForRow(std::size_t section, std::size_t row, ListCell& cell) override {
+  void cellForRowAtIndexPath(std::size_t section, std::size_t row, ListCell& cell) override {
     cell = content.sections[section].rows[row];
   }
   void reload() { reloadTask()(); }
