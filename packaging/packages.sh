@@ -7,7 +7,7 @@ qt6-base-dev qt6-base-dev-tools qt6-declarative-dev qt6-declarative-dev-tools li
 packages_window="qml6-module-qtqml qml6-module-qtqml-models qml6-module-qtqml-workerscript qml6-module-qtquick \
 qml6-module-qtquick-controls qml6-module-qtquick-layouts qml6-module-qtquick-templates qml6-module-qtquick-window \
 qt6-wayland fonts-dejavu-core"
-packages_test="libgtest-dev libgmock-dev libprotobuf-dev protobuf-compiler nlohmann-json3-dev python3 locales dbus"
+packages_test="libgtest-dev libgmock-dev libprotobuf-dev protobuf-compiler nlohmann-json3-dev python3 locales tzdata dbus"
 packages_deep="clang libclang-rt-14-dev valgrind libprotozero-dev nanopb libnanopb-dev"
 
 # Installs those of the packages named that are missing.
