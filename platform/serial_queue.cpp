@@ -53,13 +53,15 @@ SerialQueue::~SerialQueue() {
 }
 
 void SerialQueue::post(Task task) {
+  // The task may be the one that destroys this queue, and run before this call is over.
+  const std::shared_ptr<Shared> shared = shared_;
   bool wasEmpty;
   {
-    const std::lock_guard lock(shared_->mutex);
-    wasEmpty = shared_->tasks.empty();
-    shared_->tasks.push_back(std::move(task));
+    const std::lock_guard lock(shared->mutex);
+    wasEmpty = shared->tasks.empty();
+    shared->tasks.push_back(std::move(task));
   }
-  if (wasEmpty) shared_->changed.notify_one();
+  if (wasEmpty) shared->changed.notify_one();
 }
 
 void SerialQueue::waitUntilIdle() {
