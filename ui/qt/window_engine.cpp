@@ -10,7 +10,10 @@
 
 namespace probeview::qt {
 
-void prepareWindows() { QQuickStyle::setStyle(QStringLiteral("Fusion")); }
+void prepareWindows() {
+  const QString style = QStringLiteral("Fusion");
+  if (QQuickStyle::name() != style) QQuickStyle::setStyle(style);
+}
 
 void chooseRenderer() {
   if (qEnvironmentVariableIsSet("QT_QUICK_BACKEND")) return;

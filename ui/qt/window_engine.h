@@ -9,7 +9,7 @@
 
 namespace probeview::qt {
 
-// To be called once, before the first window: fixes the style that the window is drawn with, whatever the system or
+// To be called before the first window: fixes the style that the window is drawn with, whatever the system or
 // the environment prefers.
 void prepareWindows();
 

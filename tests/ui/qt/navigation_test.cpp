@@ -28,11 +28,10 @@ TEST_F(WindowNavigation, ClicksGoThroughTheListsToACategoryPage) {
 
 TEST_F(WindowNavigation, FingersGoTheSameWay) {
   show();
-  auto* finger = QTest::createTouchDevice();
   for (const auto* label : {"UMTS", "RRC Configuration"}) {
     const QPoint place = centre(row(label));
-    QTest::touchEvent(&window(), finger).press(0, place, &window());
-    QTest::touchEvent(&window(), finger).release(0, place, &window());
+    QTest::touchEvent(&window(), finger()).press(0, place, &window());
+    QTest::touchEvent(&window(), finger()).release(0, place, &window());
     rest();
   }
   EXPECT_EQ(title(), "RRC Configuration");

@@ -25,14 +25,13 @@ class WindowReload : public testing_ui::WindowTest {
   }
   // Throws the list with a finger, so that it goes on moving by itself.
   void flick() {
-    auto* finger = QTest::createTouchDevice();
     QPoint place(180, 600);
-    QTest::touchEvent(&window(), finger).press(0, place, &window());
+    QTest::touchEvent(&window(), finger()).press(0, place, &window());
     for (int step = 0; step < 8; ++step) {
       place -= QPoint(0, 30);
-      QTest::touchEvent(&window(), finger).move(0, place, &window());
+      QTest::touchEvent(&window(), finger()).move(0, place, &window());
     }
-    QTest::touchEvent(&window(), finger).release(0, place, &window());
+    QTest::touchEvent(&window(), finger()).release(0, place, &window());
   }
 };
 
@@ -159,16 +158,15 @@ TEST_F(WindowReload, AStartedFlickSurvivesAReloadWhichWaitsUntilTheListRests) {
 
 TEST_F(WindowReload, AReloadWhileAFingerHoldsTheListWaitsForTheFinger) {
   auto& page = showRows(100, 300);
-  auto* finger = QTest::createTouchDevice();
-  QTest::touchEvent(&window(), finger).press(0, QPoint(180, 500), &window());
-  for (int y = 470; y >= 290; y -= 30) QTest::touchEvent(&window(), finger).move(0, QPoint(180, y), &window());
+  QTest::touchEvent(&window(), finger()).press(0, QPoint(180, 500), &window());
+  for (int y = 470; y >= 290; y -= 30) QTest::touchEvent(&window(), finger()).move(0, QPoint(180, y), &window());
   // Qt delivers a finger's moves once per picture.
   ASSERT_TRUE(waitUntil([&] { return list()->property("moving").toBool(); }));
   const int asked = page.timesAsked;
   page.reload();
   EXPECT_EQ(page.timesAsked, asked);
-  QTest::touchEvent(&window(), finger).move(0, QPoint(180, 290), &window());
-  QTest::touchEvent(&window(), finger).release(0, QPoint(180, 290), &window());
+  QTest::touchEvent(&window(), finger()).move(0, QPoint(180, 290), &window());
+  QTest::touchEvent(&window(), finger()).release(0, QPoint(180, 290), &window());
   ASSERT_TRUE(waitUntil([&] { return !list()->property("moving").toBool(); }));
   EXPECT_EQ(page.timesAsked, asked + 1);
 }

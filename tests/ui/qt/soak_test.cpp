@@ -54,11 +54,11 @@ class Hand {
       constexpr Qt::Key keys[] = {Qt::Key_Down, Qt::Key_Up, Qt::Key_PageDown, Qt::Key_End, Qt::Key_Return};
       QTest::keyClick(&window, keys[below(5)]);
     } else if (choice < 95) {
-      QPoint finger = place;
-      QTest::touchEvent(&window, finger_).press(0, finger, &window);
+      QPoint tip = place;
+      QTest::touchEvent(&window, finger()).press(0, tip, &window);
       const QPoint step(0, below(2) == 0 ? -40 : 40);
-      for (int moves = 0; moves < 5; ++moves) QTest::touchEvent(&window, finger_).move(0, finger += step, &window);
-      QTest::touchEvent(&window, finger_).release(0, finger, &window);
+      for (int moves = 0; moves < 5; ++moves) QTest::touchEvent(&window, finger()).move(0, tip += step, &window);
+      QTest::touchEvent(&window, finger()).release(0, tip, &window);
     } else {
       window.resize(360 + below(900), 480 + below(500));
     }
@@ -68,7 +68,11 @@ class Hand {
   int below(int limit) { return std::uniform_int_distribution(0, limit - 1)(random_); }
 
   std::mt19937 random_;
-  QPointingDevice* finger_ = QTest::createTouchDevice();
+  // One for all hands, because Qt keeps devices for ever.
+  static QPointingDevice* finger() {
+    static QPointingDevice* const screen = QTest::createTouchDevice();
+    return screen;
+  }
 };
 
 TEST(WindowSoak, ARestlessHandStopsNothingLosesNothingAndLeaksNothing) {

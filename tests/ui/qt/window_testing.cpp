@@ -152,6 +152,11 @@ QPoint WindowTest::centre(const QQuickItem* item) {
   return item->mapToScene(QPointF(item->width() / 2, item->height() / 2)).toPoint();
 }
 
+QPointingDevice* WindowTest::finger() {
+  static QPointingDevice* const screen = QTest::createTouchDevice();
+  return screen;
+}
+
 void WindowTest::click(QQuickItem* item) {
   ASSERT_NE(item, nullptr);
   QTest::mouseClick(&window(), Qt::LeftButton, Qt::NoModifier, centre(item));

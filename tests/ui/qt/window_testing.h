@@ -74,6 +74,8 @@ class WindowTest : public PagesTest {
   static std::string textOf(QQuickItem* text);
 
   static QPoint centre(const QQuickItem* item);
+  // A touch screen; one for all tests, because Qt keeps devices for ever.
+  static QPointingDevice* finger();
   void click(QQuickItem* item);
   void clickRow(const std::string& label) { click(row(label)); }
   void press(Qt::Key key, Qt::KeyboardModifiers modifiers = Qt::NoModifier);
