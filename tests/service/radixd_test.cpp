@@ -168,6 +168,9 @@ TEST_F(Radixd, FiftyClientsConnectAtOnceAndAllAreServed) {
 }
 
 TEST_F(Radixd, WithoutDescriptorsItStaysUpAndServesAgainWhenThereAreSome) {
+#ifdef __SANITIZE_ADDRESS__
+  GTEST_SKIP() << "the sanitizer opens a pipe to look at memory and reports a fault of its own when it gets none";
+#endif
   RadixdProcess radixd(arguments(), [] {
     // Whatever ran this test may have left descriptors open.
     ::close_range(3, ~0U, 0);
