@@ -130,11 +130,15 @@ void ServiceConnection::failAll(Status status, const std::string& reason) {
   for (Waiting& one : failed) finish(std::move(one), status, reason);
 }
 
-void ServiceConnection::finish(Waiting waiting, Status status, std::string message) {
+void ServiceConnection::finish(Waiting waiting, Status status, std::string message, Judge judge) {
   PendingCommand& command = *waiting.command;
   command.result = {static_cast<std::int32_t>(status), std::move(message)};
   if (command.name == kCommandAddConfiguration) {
-    if (status == Status::Ok) configuration_ = command.arguments;
+    // What the service never judged is still wanted: it is asked again on the next connection.
+    if (judge == Judge::Nobody || status == Status::Ok) {
+      configuration_ = command.arguments;
+      unjudgedConfiguration_ = judge == Judge::Nobody ? waiting.sequence : 0;
+    }
   } else if (command.name == kCommandClearConfiguration) {
     // Wanted or not by the service: who clears a configuration does not want it back on the next connection.
     configuration_.reset();
@@ -144,7 +148,9 @@ void ServiceConnection::finish(Waiting waiting, Status status, std::string messa
 
 void ServiceConnection::restore() {
   if (configuration_) {
-    send(encode(Command{.sequence = nextSequence(), .name = kCommandAddConfiguration, .arguments = *configuration_}));
+    unjudgedConfiguration_ = nextSequence();
+    send(encode(
+        Command{.sequence = unjudgedConfiguration_, .name = kCommandAddConfiguration, .arguments = *configuration_}));
   }
   if (delivery_) send(encode(Delivery{true}));
 }
@@ -209,8 +215,12 @@ void ServiceConnection::onWritable() {
 
 void ServiceConnection::onClosed() {
   const auto self = shared_from_this();
-  lose(Status::NoService, phase_ == Phase::Ready ? "the baseband service went away before it answered"
-                                                 : "the baseband service closed the connection");
+  if (phase_ != Phase::Ready) {
+    lose(Status::NoService, "the baseband service closed the connection");
+  } else {
+    lose(Status::NoService,
+         waiting_.empty() ? "the baseband service went away" : "the baseband service went away before it answered");
+  }
 }
 
 void ServiceConnection::onHello(Hello hello) {
@@ -240,12 +250,18 @@ void ServiceConnection::onReply(Reply reply) {
   const auto found = std::find_if(waiting_.begin(), waiting_.end(), [&reply](const Waiting& one) {
     return one.sequence != 0 && one.sequence == reply.sequence;
   });
-  // Nobody waits for it any more, or it answers what was restored.
-  if (found == waiting_.end()) return;
+  if (found == waiting_.end()) {
+    // Nobody waits for it any more, or it answers what was restored: a configuration that is refused is not kept.
+    if (unjudgedConfiguration_ != 0 && reply.sequence == unjudgedConfiguration_) {
+      unjudgedConfiguration_ = 0;
+      if (static_cast<Status>(reply.status) != Status::Ok) configuration_.reset();
+    }
+    return;
+  }
   Waiting answered = std::move(*found);
   waiting_.erase(found);
   answered.command->reply = std::move(reply.content);
-  finish(std::move(answered), static_cast<Status>(reply.status), std::move(reply.message));
+  finish(std::move(answered), static_cast<Status>(reply.status), std::move(reply.message), Judge::Service);
   updateReading();
 }
 

@@ -71,6 +71,8 @@ class ServiceConnection final : public std::enable_shared_from_this<ServiceConne
 
  private:
   enum class Phase { Idle, Greeting, Ready };
+  // Who ended a command: the service with its reply, or nobody, as it did not come to that.
+  enum class Judge { Nobody, Service };
   struct Waiting {
     std::shared_ptr<PendingCommand> command;
     probeview::ScheduledTaskHandle deadline;
@@ -93,7 +95,7 @@ class ServiceConnection final : public std::enable_shared_from_this<ServiceConne
   // Ends the link, fails what waits for it and tries again later.
   void lose(Status status, const std::string& reason);
   void failAll(Status status, const std::string& reason);
-  void finish(Waiting waiting, Status status, std::string message);
+  void finish(Waiting waiting, Status status, std::string message, Judge judge = Judge::Nobody);
   void restore();
   std::uint32_t nextSequence();
   void sendWaiting();
@@ -122,6 +124,8 @@ class ServiceConnection final : public std::enable_shared_from_this<ServiceConne
 
   // What is restored on a new connection.
   std::optional<std::vector<std::uint8_t>> configuration_;
+  // The sequence number under which that was sent without a reply so far; 0: not sent, or taken.
+  std::uint32_t unjudgedConfiguration_ = 0;
   bool delivery_ = false;
 
   std::vector<Event> batch_;

@@ -306,6 +306,45 @@ TEST_F(ServiceConnectionTest, AConfigurationThatWasRefusedIsNotRestoredButTheOne
   EXPECT_EQ(current().commands[0].arguments, services_[0]->commands[0].arguments);
 }
 
+TEST_F(ServiceConnectionTest, AConfigurationPushedBeforeTheServiceIsThereIsSentWhenItComes) {
+  mood_ = Mood::Absent;
+  EXPECT_EQ(push("wish").status, static_cast<int>(Status::NoService));
+  mood_ = Mood::There;
+  loop_.advance(seconds(1));
+  ASSERT_THAT(current().commands, SizeIs(1));
+  EXPECT_EQ(current().commands[0].name, kCommandAddConfiguration);
+}
+
+TEST_F(ServiceConnectionTest, AConfigurationThatTheServiceDidNotAnswerInTimeIsRestored) {
+  loop_.run();
+  EXPECT_EQ(push("wish").status, static_cast<int>(Status::TimedOut));
+  current().hangUp();
+  loop_.advance(milliseconds(100));
+  ASSERT_THAT(services_, SizeIs(2));
+  EXPECT_THAT(current().commands, SizeIs(1));
+}
+
+TEST_F(ServiceConnectionTest, AConfigurationThatIsRefusedOnlyWhenRestoredIsNotTriedAgain) {
+  mood_ = Mood::Absent;
+  EXPECT_NE(push("wish").status, 0);
+  mood_ = Mood::There;
+  loop_.advance(seconds(1));
+  current().answer(0, 3, "no");
+  loop_.run();
+  current().hangUp();
+  loop_.advance(milliseconds(100));
+  ASSERT_THAT(services_, SizeIs(2));
+  EXPECT_THAT(current().commands, IsEmpty());
+}
+
+TEST_F(ServiceConnectionTest, AServiceThatGoesWhileNothingIsAskedJustWentAway) {
+  loop_.run();
+  mood_ = Mood::Silent;
+  current().hangUp();
+  loop_.run();
+  EXPECT_EQ(Connection(manager_).trouble, "the baseband service went away");
+}
+
 TEST_F(ServiceConnectionTest, AConfigurationThatWasClearedIsNotRestoredEvenIfTheServiceWasAway) {
   answerAll();
   ASSERT_EQ(push("first").status, 0);

@@ -477,6 +477,15 @@ TEST_P(Contract, AClientStartedBeforeTheServiceConnectsWhenItComes) {
   EXPECT_TRUE(until([&] { return client.events.size() == 1; }));
 }
 
+TEST_P(Contract, AConfigurationPushedWhileTheServiceIsAwayIsRestoredWhenItComes) {
+  world_->kill();
+  Client& client = connect();
+  EXPECT_EQ(push(client, "[metrics]\nK_LTE_RRC_STATE = 250\n").status, static_cast<int>(Status::NoService));
+  world_->restart();
+  ASSERT_TRUE(until([&] { return plan().has_value(); }));
+  EXPECT_EQ(plan()->metrics.at(K_LTE_RRC_STATE), milliseconds(250));
+}
+
 TEST_P(Contract, AfterARestartOfTheServiceConfigurationAndDeliveryAreRestored) {
   Client& client = connect();
   ASSERT_EQ(push(client, "[metrics]\nK_LTE_RRC_STATE = 250\n").status, 0);
