@@ -7,6 +7,7 @@
 
 #include "platform/guarded.h"
 #include "radix/object.h"
+#include "radix/service_commands.h"
 
 namespace radix::client {
 
@@ -147,7 +148,8 @@ class ConnectionManager final : public Manager {
       const Value* payload = arguments.find(kKeyPayload);
       const std::size_t given = payload != nullptr && payload->bytes() ? payload->bytes()->size() : size;
       return {static_cast<std::int32_t>(Status::TooLarge),
-              (command == kCommandAddConfiguration ? "the configuration has " : "the command has ") +
+              (command == kCommandAddConfiguration || command == kCommandSetBaseConfiguration ? "the configuration has "
+                                                                                              : "the command has ") +
                   std::to_string(given) + " bytes; at most " + std::to_string(longestFrame - (size - given)) +
                   " fit into one frame"};
     }

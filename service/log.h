@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include <bit>
+#include <cstdint>
 #include <string_view>
 
 #include "values/line_sink.h"
@@ -25,5 +27,9 @@ class ServiceLog {
 
 // The name of a level as it stands on the command line and in the log.
 std::string_view nameOf(LogLevel level);
+
+// Whether what has now happened so many times is worth a line: the first, the second, the fourth … time, so that
+// whoever does nothing else cannot fill the log.
+constexpr bool isWorthTelling(std::uint64_t times) { return std::has_single_bit(times); }
 
 }  // namespace probeview

@@ -5,6 +5,7 @@
 #include <string_view>
 #include <utility>
 
+#include "messages/metric_identifiers.h"
 #include "radix/client.h"
 #include "radix/service_commands.h"
 #include "radix/status.h"
@@ -20,8 +21,8 @@ namespace {
 using radix::Reply;
 using radix::Status;
 
-// More notes on one configuration than anybody reads in a log.
-constexpr std::size_t mostNotesLogged = 10;
+// More notes on one configuration than anybody reads.
+constexpr std::size_t mostNotesTold = 10;
 constexpr std::int64_t configurationPayloadType = 0;
 
 Reply answer(Status status, std::string message = {}) {
@@ -36,8 +37,17 @@ std::int64_t integerArgument(const Dictionary& arguments, std::string_view key) 
 
 struct PushedConfiguration {
   std::optional<Configuration> configuration;
-  Reply refusal;
+  // What its sender is told: why there is none, or what in it was ignored.
+  Reply reply;
 };
+
+// The notes that anybody gets to read, one a line.
+std::vector<std::string> notesToTell(const std::vector<std::string>& notes) {
+  std::vector<std::string> told(notes.begin(),
+                                notes.begin() + static_cast<std::ptrdiff_t>(std::min(notes.size(), mostNotesTold)));
+  if (notes.size() > mostNotesTold) told.push_back(std::to_string(notes.size() - mostNotesTold) + " notes more");
+  return told;
+}
 
 PushedConfiguration readConfiguration(const Dictionary& arguments, ServiceLog& log, const std::string& who) {
   const Value* payload = arguments.find(radix::kKeyPayload);
@@ -53,15 +63,12 @@ PushedConfiguration readConfiguration(const Dictionary& arguments, ServiceLog& l
     log.write(LogLevel::Warning, "the configuration of " + who + " was refused: " + result.error);
     return {{}, answer(Status::BadConfiguration, result.error)};
   }
-  const auto& notes = result.configuration->notes;
-  for (std::size_t index = 0; index < std::min(notes.size(), mostNotesLogged); ++index) {
-    log.write(LogLevel::Info, "the configuration of " + who + ": " + notes[index]);
+  std::string message;
+  for (const std::string& note : notesToTell(result.configuration->notes)) {
+    log.write(LogLevel::Info, "the configuration of " + who + ": " + note);
+    message += (message.empty() ? "" : "\n") + note;
   }
-  if (notes.size() > mostNotesLogged) {
-    log.write(LogLevel::Info,
-              "the configuration of " + who + ": " + std::to_string(notes.size() - mostNotesLogged) + " notes more");
-  }
-  return {std::move(result.configuration), answer(Status::Ok)};
+  return {std::move(result.configuration), answer(Status::Ok, std::move(message))};
 }
 
 std::string nameOf(const Session& session) {
@@ -101,8 +108,11 @@ void Service::addSource(std::unique_ptr<MetricSource> source) {
 void Service::accept(std::unique_ptr<radix::Link> link, Peer peer) {
   // Those who were refused stay for a moment; a crowd of them is not waited for.
   if (sessions_.size() >= 2 * settings_.mostClients) {
-    log_.write(LogLevel::Warning,
-               "a connection of process " + std::to_string(peer.process) + " was closed: there are too many already");
+    if (isWorthTelling(++closedAtOnce_)) {
+      log_.write(LogLevel::Warning, "a connection of process " + std::to_string(peer.process) +
+                                        " was closed: there are too many already (" + std::to_string(closedAtOnce_) +
+                                        " closed so far)");
+    }
     return;
   }
   sessions_.push_back(std::make_unique<Session>(++sessionsAccepted_, worker_, log_, static_cast<Session::Host&>(*this),
@@ -136,10 +146,10 @@ Reply Service::perform(Session& session, const radix::Command& command) {
 
 Reply Service::addConfiguration(Session& session, const Dictionary& arguments) {
   PushedConfiguration pushed = readConfiguration(arguments, log_, nameOf(session));
-  if (!pushed.configuration) return pushed.refusal;
+  if (!pushed.configuration) return pushed.reply;
   session.setConfiguration(std::move(pushed.configuration));
   updatePlan();
-  return pushed.refusal;
+  return pushed.reply;
 }
 
 Reply Service::clearConfiguration(Session& session) {
@@ -150,12 +160,12 @@ Reply Service::clearConfiguration(Session& session) {
 
 Reply Service::setBaseConfiguration(const Dictionary& arguments) {
   PushedConfiguration pushed = readConfiguration(arguments, log_, "the service");
-  if (!pushed.configuration) return pushed.refusal;
+  if (!pushed.configuration) return pushed.reply;
   baseConfiguration_ = std::move(pushed.configuration);
   log_.write(LogLevel::Info, "the service has a base configuration of " +
                                  std::to_string(baseConfiguration_->plan.metrics.size()) + " metrics");
   updatePlan();
-  return pushed.refusal;
+  return pushed.reply;
 }
 
 Reply Service::clearBaseConfiguration() {
@@ -169,15 +179,11 @@ Reply Service::queryMetric(Session& session, const Dictionary& arguments) {
   const std::int64_t trigger = integerArgument(arguments, radix::kKeyTriggerID);
   std::vector<std::int64_t> metrics;
   if (const std::int64_t metric = integerArgument(arguments, radix::kKeyMetricID); metric != 0) {
-    metrics.push_back(metric);
+    // An identifier that is no metric's may be that of a trigger: the two look alike to whoever asks.
+    if (!isMetric(metric)) metrics = metricsOfTrigger(session, metric);
+    if (metrics.empty()) metrics.push_back(metric);
   } else if (trigger != 0) {
-    // A client's own configuration says what its triggers mean; without one the service's does.
-    const auto& configuration = session.configuration() ? session.configuration() : baseConfiguration_;
-    if (configuration) {
-      if (const auto found = configuration->triggers.find(trigger); found != configuration->triggers.end()) {
-        metrics = found->second;
-      }
-    }
+    metrics = metricsOfTrigger(session, trigger);
     if (metrics.empty()) {
       return answer(Status::CannotFill, "no configuration says which metrics the trigger " + hexText(trigger) +
                                             " stands for: push one with it under [triggers]");
@@ -187,21 +193,49 @@ Reply Service::queryMetric(Session& session, const Dictionary& arguments) {
   }
 
   std::string missing;
+  std::string withoutValue;
   bool any = false;
+  List asked;
   for (const std::int64_t metric : metrics) {
     // Before the source is asked, as it may answer at once.
     const bool wanted = session.wants(metric);
     bool taken = false;
+    bool canFill = false;
     for (const auto& source : sources_) {
       if (!source->canFill(metric)) continue;
       if (!wanted) session.expectMetric(metric);
       taken = source->query(metric) || taken;
+      // Not one that has failed over the question.
+      canFill = canFill || source->canFill(metric);
     }
     any = any || taken;
-    if (!taken) missing += (missing.empty() ? "" : ", ") + metricText(metric);
+    if (taken) {
+      asked.append(metric);
+    } else {
+      std::string& list = canFill ? withoutValue : missing;
+      list += (list.empty() ? "" : ", ") + metricText(metric);
+    }
   }
-  if (!any) return answer(Status::CannotFill, "no source can fill " + missing);
-  return answer(Status::Ok, missing.empty() ? std::string() : "no source can fill " + missing);
+  std::string message = missing.empty() ? "" : "no source can fill " + missing;
+  if (!withoutValue.empty()) {
+    message += (message.empty() ? "" : "; ") + ("no source has a value of " + withoutValue + " yet");
+  }
+  Reply reply = answer(any ? Status::Ok : Status::CannotFill, std::move(message));
+  if (any) reply.content = radix::encodeDictionary({{"metrics", std::move(asked)}});
+  return reply;
+}
+
+bool Service::isMetric(std::int64_t identifier) const {
+  return metricWithId(identifier) != nullptr ||
+         std::any_of(sources_.begin(), sources_.end(), [&](const auto& source) { return source->canFill(identifier); });
+}
+
+std::vector<std::int64_t> Service::metricsOfTrigger(const Session& session, std::int64_t trigger) const {
+  // A client's own configuration says what its triggers mean; without one the service's does.
+  const auto& configuration = session.configuration() ? session.configuration() : baseConfiguration_;
+  if (!configuration) return {};
+  const auto found = configuration->triggers.find(trigger);
+  return found != configuration->triggers.end() ? found->second : std::vector<std::int64_t>();
 }
 
 Reply Service::showStatus() const {

@@ -58,6 +58,7 @@ class Service final : Session::Host {
   radix::Reply perform(Session& session, const radix::Command& command) override;
   void deliveryChanged(Session& session, bool switchedOn) override;
   void ended(Session& session) override;
+  std::uint64_t countSilent() override { return ++silentClients_; }
 
   radix::Reply addConfiguration(Session& session, const Dictionary& arguments);
   radix::Reply clearConfiguration(Session& session);
@@ -65,6 +66,10 @@ class Service final : Session::Host {
   radix::Reply clearBaseConfiguration();
   radix::Reply queryMetric(Session& session, const Dictionary& arguments);
   radix::Reply showStatus() const;
+  // Whether it is a metric's, by its name or because a source can fill it.
+  bool isMetric(std::int64_t identifier) const;
+  // Empty when no configuration that counts for the session says what the trigger stands for.
+  std::vector<std::int64_t> metricsOfTrigger(const Session& session, std::int64_t trigger) const;
 
   // Takes a record of a source to all who want it.
   void route(MetricRecord record);
@@ -81,6 +86,8 @@ class Service final : Session::Host {
   std::vector<std::unique_ptr<SourceSlot>> sources_;
   std::vector<std::unique_ptr<Session>> sessions_;
   std::uint64_t sessionsAccepted_ = 0;
+  std::uint64_t closedAtOnce_ = 0;
+  std::uint64_t silentClients_ = 0;
   LastRecords lastRecords_;
   std::optional<Configuration> baseConfiguration_;
   std::optional<MetricPlan> plan_;

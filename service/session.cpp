@@ -40,8 +40,11 @@ Session::~Session() { *alive_ = false; }
 
 void Session::start() {
   deadline_ = worker_.after(settings_.greetingTime, [this] {
-    log_.write(LogLevel::Warning, description() + " did not greet within " +
-                                      std::to_string(settings_.greetingTime.count()) + " ms and was let go");
+    if (const std::uint64_t silent = host_.countSilent(); isWorthTelling(silent)) {
+      log_.write(LogLevel::Warning, description() + " did not greet within " +
+                                        std::to_string(settings_.greetingTime.count()) + " ms and was let go (" +
+                                        std::to_string(silent) + " so far)");
+    }
     end();
   });
   link_->start(*this);

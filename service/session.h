@@ -44,6 +44,8 @@ class Session final : radix::LinkListener, radix::FrameHandler {
     virtual void deliveryChanged(Session& session, bool switchedOn) = 0;
     // The session is over: to be destroyed, but not from inside this call.
     virtual void ended(Session& session) = 0;
+    // One more that did not greet: how many there were so far, this one included.
+    virtual std::uint64_t countSilent() = 0;
   };
 
   struct Settings {

@@ -2,7 +2,6 @@
 #include "service/source_slot.h"
 
 #include <algorithm>
-#include <bit>
 #include <exception>
 #include <utility>
 
@@ -117,8 +116,7 @@ void SourceSlot::emit(MetricRecord record) {
 
 void SourceSlot::withhold(const MetricRecord& record, const std::string& reason) {
   ++withheld_;
-  // A source that does nothing else must not fill the log: the first, the second, the fourth … of them is told.
-  if (!std::has_single_bit(withheld_)) return;
+  if (!isWorthTelling(withheld_)) return;
   log_.write(LogLevel::Warning, origin_ + ": a record of " + metricText(record.metricId) + " was withheld, " + reason +
                                     " (" + std::to_string(withheld_) + " withheld so far)");
 }

@@ -42,7 +42,8 @@ ExitStatus push(const std::string& path, Tool& tool) {
       radix::kCommandSetBaseConfiguration,
       {{radix::kKeyAppID, std::int64_t{2}},
        {radix::kKeyPayload, Value::bytes({reinterpret_cast<const std::uint8_t*>(content.data()), content.size()})},
-       {radix::kKeyPayloadType, std::int64_t{0}}});
+       {radix::kKeyPayloadType, std::int64_t{0}}},
+      nullptr, path);
 }
 
 ExitStatus clear(Tool& tool) {

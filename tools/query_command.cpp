@@ -31,16 +31,22 @@ ExitStatus query(const Options& options, Tool& tool) {
   }
   ServiceClient client(tool);
   std::optional<Dictionary> answer;
+  // What was asked for: the metric, or a metric of the trigger that bears the identifier.
+  std::int64_t wanted = *metric;
   client.listen([&](const Dictionary& event) {
     const Value* id = event.find(radix::kKeyMetricID);
-    if (id != nullptr && id->int64() == metric) answer = event;
+    if (id != nullptr && id->int64() == wanted && !answer) answer = event;
   });
   // The last records come first; they are no answer.
   if (const ExitStatus status = client.drain(); status != ExitStatus::Success) return status;
   answer.reset();
   const Dictionary arguments{{radix::kKeyAppID, std::int64_t{2}}, {radix::kKeyMetricID, *metric}};
-  const ExitStatus status = client.perform(radix::kCommandQueryMetric, arguments);
+  Dictionary reply;
+  const ExitStatus status = client.perform(radix::kCommandQueryMetric, arguments, &reply);
   if (status != ExitStatus::Success) return status;
+  if (const Value* asked = reply.find("metrics"); asked != nullptr && asked->list() && !asked->list()->empty()) {
+    wanted = (*asked->list())[0].int64().value_or(wanted);
+  }
   if (!client.loop().runUntil([&answer] { return answer.has_value(); }, answerDeadline)) {
     tool.errors << "probectl: the service took the query, but no record came within " << answerDeadline.count()
                 << " s\n";

@@ -2,20 +2,29 @@
 #include "tools/service_client.h"
 
 #include <ostream>
+#include <sstream>
 #include <utility>
 
 #include "radix/service_commands.h"
+#include "radix/status.h"
 
 namespace probeview {
 
 ServiceClient::ServiceClient(Tool& tool)
     : tool_(tool), loop_(std::make_shared<EventLoop>()), manager_(radix::client::CreateManager("probectl", loop_)) {}
 
-ExitStatus ServiceClient::perform(std::string_view command, const Dictionary& arguments, Dictionary* reply) {
+ExitStatus ServiceClient::perform(std::string_view command, const Dictionary& arguments, Dictionary* reply,
+                                  const std::string& subject) {
   radix::client::ObjectHandle answer;
   const radix::client::Result result = radix::client::PerformCommand(manager_, command, arguments, answer);
-  if (result.status != 0) {
-    tool_.errors << "probectl: " << result.message << '\n';
+  // That there is no service has nothing to do with the subject.
+  const auto status = static_cast<radix::Status>(result.status);
+  const bool isAway = status == radix::Status::NoService || status == radix::Status::TimedOut;
+  const std::string prefix = subject.empty() || isAway ? "probectl: " : "probectl: " + subject + ": ";
+  std::istringstream lines(result.message);
+  for (std::string line; std::getline(lines, line);) tool_.errors << prefix << line << '\n';
+  if (status != radix::Status::Ok) {
+    if (result.message.empty()) tool_.errors << prefix << "the service refused with status " << result.status << '\n';
     return ExitStatus::Failure;
   }
   if (reply != nullptr && answer) *reply = radix::client::nativeDictionary(*answer);

@@ -19,8 +19,10 @@ class ServiceClient {
   explicit ServiceClient(Tool& tool);
 
   EventLoop& loop() { return *loop_; }
-  // Failure, with the reason written to the tool's errors, when the service refuses or is away.
-  ExitStatus perform(std::string_view command, const Dictionary& arguments, Dictionary* reply = nullptr);
+  // Failure, with the reason written to the tool's errors, when the service refuses or is away. What a service says
+  // that does as it was told is written there, too. The subject, such as a file, is what its words are about.
+  ExitStatus perform(std::string_view command, const Dictionary& arguments, Dictionary* reply = nullptr,
+                     const std::string& subject = {});
   // Has each event handed to the taker and begins to listen.
   void listen(std::function<void(const Dictionary& event)> take);
   // Waits until all events that the service had for this client have been handed over.

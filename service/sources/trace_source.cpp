@@ -147,7 +147,7 @@ class TraceSource final : public MetricSource {
     dueAfter_ = std::chrono::nanoseconds(static_cast<std::int64_t>(std::min(due, never)));
   }
 
-  void say(const std::string& what) { logLines_->line(origin_ + ": " + what); }
+  void say(const std::string& what) { logLines_->line(what); }
 
   std::string origin_;
   std::vector<std::int64_t> metrics_;

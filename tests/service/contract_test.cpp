@@ -294,6 +294,7 @@ TEST_P(Contract, AnUnknownMetricIsNotedAndIgnored) {
   EXPECT_EQ(push(client, "[metrics]\nK_NOBODY_KNOWS = 5\nK_LTE_RRC_STATE = 1000\n").status, 0);
   EXPECT_EQ(plan()->metrics.size(), 1U);
   EXPECT_EQ(logged("K_NOBODY_KNOWS"), 1U);
+  EXPECT_NE(push(client, "[metrics]\nK_NOBODY_KNOWS = 5\n").message.find("line 2"), std::string::npos);
 }
 
 TEST_P(Contract, ASyntaxErrorIsRefusedWithLineAndColumnAndChangesNothing) {
@@ -369,6 +370,9 @@ TEST_P(Contract, AQueriedMetricIsDeliveredAlsoWhenTheConfigurationDoesNotNameIt)
 }
 
 TEST_P(Contract, AQueryThatNoSourceCanFillIsRefusedWithTheMetricsName) {
+  world_->onService([&] { world_->script().metrics = {K_LTE_RRC_STATE}; });
+  world_->kill();
+  world_->restart();
   Client& client = connect();
   const Result result = query(client, 0, K_LTE_TX_POWER);
   EXPECT_EQ(result.status, static_cast<int>(Status::CannotFill));
@@ -378,6 +382,28 @@ TEST_P(Contract, AQueryThatNoSourceCanFillIsRefusedWithTheMetricsName) {
   const Result unknown = query(client, 5, 0);
   EXPECT_EQ(unknown.status, static_cast<int>(Status::CannotFill));
   EXPECT_NE(unknown.message.find("0x5"), std::string::npos);
+}
+
+TEST_P(Contract, AQueryOfAMetricWithoutAValueYetSaysSo) {
+  world_->onService([&] { world_->script().onQuery = [](std::int64_t) { return false; }; });
+  const Result result = query(connect(), 0, K_LTE_TX_POWER);
+  EXPECT_EQ(result.status, static_cast<int>(Status::CannotFill));
+  EXPECT_EQ(result.message, "no source has a value of K_LTE_TX_POWER (0x3CD302) yet");
+}
+
+TEST_P(Contract, AnIdentifierThatIsNoMetricsIsTakenForThatOfATrigger) {
+  Client& client = connect();
+  std::vector<std::int64_t> asked;
+  world_->onService([&] {
+    world_->script().onQuery = [&asked](std::int64_t metric) {
+      asked.push_back(metric);
+      return true;
+    };
+  });
+  EXPECT_EQ(query(client, 0, 0x7F0013).message, "no source can fill 0x7F0013");
+  ASSERT_EQ(push(client, "[triggers]\n0x7F0013 = [\"K_SIM_FILE_INFO\"]\n").status, 0);
+  EXPECT_EQ(query(client, 0, 0x7F0013).status, 0);
+  world_->onService([&] { EXPECT_EQ(asked, std::vector<std::int64_t>{K_SIM_FILE_INFO}); });
 }
 
 TEST_P(Contract, ASourceIsToldWhetherAnybodyListens) {

@@ -104,6 +104,16 @@ TEST_P(HostileClients, WhoeverNeverGreetsIsLetGo) {
   expectOthersServed();
 }
 
+TEST_P(HostileClients, OfManyWhoNeverGreetOnlyTheFirstTheSecondTheFourthAreLogged) {
+  std::vector<std::unique_ptr<RawClient>> clients;
+  for (int number = 0; number < 5; ++number) clients.push_back(connect());
+  for (const auto& client : clients) {
+    EXPECT_TRUE(world_->until([&] { return client->closed; }));
+  }
+  EXPECT_EQ(logged("did not greet"), 3U);
+  EXPECT_EQ(logged("(4 so far)"), 1U);
+}
+
 TEST_P(HostileClients, AFrameOfTheLongestLengthIsReadAndOneByteMoreEndsItsSender) {
   const auto client = greeted();
   client->hello.reset();

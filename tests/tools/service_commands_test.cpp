@@ -126,6 +126,22 @@ TEST_F(ServiceCommands, AQueryThatNoSourceCanFillEndsWithStatusOneAndTheReason) 
   EXPECT_EQ(probectl({"query", "K_NOBODY_KNOWS"}).status, 2);
 }
 
+TEST_F(ServiceCommands, AQueryOfATriggerPrintsTheMetricThatAnswersIt) {
+  const TemporaryFolder folder;
+  const std::string path = folder.path() + "/base.deviceconfig";
+  std::ofstream(path) << "[triggers]\n0x7F0013 = [\"K_LTE_RRC_STATE\"]\n";
+  ASSERT_EQ(probectl({"config", "push", path}).status, 0);
+  world_->onService([&] {
+    world_->script().onQuery = [this](std::int64_t metric) {
+      world_->script().emit(metric, {0x10, 3});
+      return true;
+    };
+  });
+  const Outcome outcome = probectl({"query", "0x7F0013"});
+  EXPECT_EQ(outcome.status, 0) << outcome.errors;
+  EXPECT_THAT(outcome.output, HasSubstr("KLTE_RRC_STATE_CONNECTED"));
+}
+
 TEST_F(ServiceCommands, ConfigPushSetsTheBaseConfigurationAndClearTakesItAway) {
   const TemporaryFolder folder;
   const std::string path = folder.path() + "/base.deviceconfig";
@@ -143,7 +159,15 @@ TEST_F(ServiceCommands, AConfigurationThatIsRefusedOrCannotBeReadEndsWithStatusO
   std::ofstream(path) << "[metrics\n";
   const Outcome refused = probectl({"config", "push", path});
   EXPECT_EQ(refused.status, 1);
+  EXPECT_THAT(refused.errors, StartsWith("probectl: " + path + ": "));
   EXPECT_THAT(refused.errors, HasSubstr("line 1"));
+  std::ofstream(path) << std::string(200000, '#');
+  EXPECT_THAT(probectl({"config", "push", path}).errors,
+              StartsWith("probectl: " + path + ": the configuration has 200000 bytes; at most "));
+  std::ofstream(path) << "[metrics]\nK_NOBODY_KNOWS = 5\n";
+  const Outcome noted = probectl({"config", "push", path});
+  EXPECT_EQ(noted.status, 0);
+  EXPECT_THAT(noted.errors, StartsWith("probectl: " + path + ": line 2"));
   EXPECT_EQ(probectl({"config", "push", folder.path()}).errors,
             "probectl: cannot read " + folder.path() + ": Is a directory\n");
   EXPECT_THAT(probectl({"config", "push", folder.path() + "/none"}).errors, HasSubstr("No such file"));

@@ -61,6 +61,7 @@ TEST_F(TraceServiceTest, WhatIsWrongWithAFileEndsTheStartAndIsTold) {
 TEST_F(TraceServiceTest, ADamagedRowIsInTheLogWithItsLine) {
   RadixdProcess service({"--socket", socket, "--source", "trace:tests/pages/traces/drive_b.csv"});
   EXPECT_TRUE(service.waitForLog("trace:drive_b.csv: line 6: has 1 fields, not 26; row skipped")) << service.log();
+  EXPECT_EQ(service.log().find("trace:drive_b.csv: trace:"), std::string::npos) << service.log();
 }
 
 }  // namespace

@@ -168,7 +168,7 @@ TEST_F(TraceSourceTest, ItsEndIsToldOnceAndWhatWasLastKnownCanStillBeAskedFor) {
   start(measurement("12.00.00", -90) + measurement("12.00.01", -91));
   listen();
   loop.advance(seconds(100));
-  EXPECT_THAT(log.lines, ElementsAre("trace:drive.csv: played to its end, line 3"));
+  EXPECT_THAT(log.lines, ElementsAre("played to its end, line 3"));
   EXPECT_EQ(loop.untilNextTimer(), std::nullopt);
   EXPECT_TRUE(source->query(K_LTE_RSRP_RSRQ_SINR));
   ASSERT_THAT(sink.records, SizeIs(3));
@@ -250,7 +250,7 @@ TEST_F(TraceSourceTest, ManyRowsThatAreDueTogetherLeaveTheLoopToItsOtherWork) {
 
 TEST_F(TraceSourceTest, BadRowsAreToldWithTheirLinesWhenTheSourceStarts) {
   start("bad\n" + measurement("12.00.00", -90));
-  EXPECT_THAT(log.lines, ElementsAre("trace:drive.csv: line 2: has 1 fields, not 26; row skipped"));
+  EXPECT_THAT(log.lines, ElementsAre("line 2: has 1 fields, not 26; row skipped"));
 }
 
 TEST_F(TraceSourceTest, ManyBadRowsAreToldInFewLines) {
@@ -258,7 +258,7 @@ TEST_F(TraceSourceTest, ManyBadRowsAreToldInFewLines) {
   for (int count = 0; count < 100; ++count) rows += "bad\n";
   start(rows);
   ASSERT_THAT(log.lines, SizeIs(21));
-  EXPECT_EQ(log.lines.back(), "trace:drive.csv: and 80 more problems like these");
+  EXPECT_EQ(log.lines.back(), "and 80 more problems like these");
 }
 
 TEST_F(TraceSourceTest, AFileThatIsNoSuchLogIsRefusedWithWhatIsWrong) {
