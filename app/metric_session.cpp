@@ -27,4 +27,9 @@ StatusText MetricSession::statusText() const {
   return [this] { return statusLine_.text(navigation_.myRadixWrapper->serviceStatus()); };
 }
 
+std::string MetricSession::serviceTrouble() const {
+  const auto connection = navigation_.myRadixWrapper->serviceStatus().connection;
+  return connection.everConnected ? std::string() : connection.trouble;
+}
+
 }  // namespace probeview

@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include <string>
+
 #include "app/fill_watch.h"
 #include "app/root_navigation_controller.h"
 #include "platform/detachable_queue.h"
@@ -22,6 +24,8 @@ class MetricSession {
   RootNavigationController& navigation() { return navigation_; }
   // Why the pages move or stand still. The session must outlive it.
   StatusText statusText() const;
+  // Why the service has never been there, for people; empty once it has.
+  std::string serviceTrouble() const;
   // Whether the store has got what there is to get; to be asked often.
   bool isFilled() { return fillWatch_.isFilled(); }
 

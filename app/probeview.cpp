@@ -33,8 +33,9 @@ int runProbeview(int argc, const char* const* argv, const MakeWindow& makeWindow
   program.footer(
       "Environment:\n"
       "  RADIXD_SOCKET    the service's socket (default: the user's service, else the system's)\n\n"
-      "Exit status: 0 when all went well, 1 when the pages could not be shown, 2 when the command line was not "
-      "understood.");
+      "Exit status: 0 when all went well, 1 when the pages could not be shown or there is no service to print them "
+      "of,\n"
+      "2 when the command line was not understood.");
   try {
     program.parse(argc, argv);
   } catch (const CLI::ParseError& error) {

@@ -21,11 +21,6 @@ namespace probeview {
 
 namespace {
 
-class NoLines final : public LineSink {
- public:
-  void line(std::string_view) override {}
-};
-
 // The logs live as long as the process: wrapper and store keep referring to them.
 bool chooseLogs(const ViewerOptions& options, FrontKind front, std::ostream& errors) {
   const bool pagesOnly = options.pagesOnly || front == FrontKind::Terminal;
@@ -38,7 +33,7 @@ bool chooseLogs(const ViewerOptions& options, FrontKind front, std::ostream& err
     }
     setConsoleLog(*new ConsoleLog(file));
   } else if (pagesOnly) {
-    setConsoleLog(*new NoLines);
+    setConsoleLog(*new DiscardingSink);
   }
   if (pagesOnly) setSystemLog(*new SystemLog("probeview", SystemLog::Echo::None));
   return true;
@@ -74,6 +69,7 @@ int runViewer(const ViewerOptions& options, const MakeWindow& makeWindow, std::o
   return applicationMain("AppDelegate", *front, [&](MetricSession& session) {
     if (options.pageKey) openPage(session.navigation(), *options.pageKey);
     if (auto* print = dynamic_cast<PrintFront*>(front.get())) {
+      print->failWith([&session] { return session.serviceTrouble(); }, errors);
       print->waitUntil([&session] { return session.isFilled(); });
     }
   });

@@ -26,7 +26,8 @@ struct ViewerOptions {
   bool pagesOnly = false;
 };
 
-// The exit status: 0 when all went well; 1, with the reason on the stream, when the viewer could not be shown.
+// The exit status: 0 when all went well; 1, with the reason on the stream, when the viewer could not be shown or there
+// was no service to print the pages of.
 int runViewer(const ViewerOptions& options, const MakeWindow& makeWindow, std::ostream& errors);
 
 // The viewer's command line: understands it and runs the viewer; 2 when it is not understood.

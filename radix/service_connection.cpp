@@ -77,6 +77,8 @@ void ServiceConnection::attempt() {
   ConnectResult result = connector_->connect();
   if (!result.link) {
     state_.trouble = std::move(result.error);
+    // First: whose command fails may ask at once why.
+    publish();
     if (result.busy) {
       scheduleAttempt(waiting_.empty() ? reconnectDelay_ : busyRetryDelay);
     } else {
@@ -84,7 +86,6 @@ void ServiceConnection::attempt() {
       scheduleAttempt(reconnectDelay_);
       reconnectDelay_ = std::min(reconnectDelay_ * 2, longestReconnectDelay);
     }
-    publish();
     return;
   }
   phase_ = Phase::Greeting;

@@ -4,20 +4,31 @@
 #include <unistd.h>
 
 #include <cerrno>
+#include <ostream>
 
 #include "ui/page_snapshot.h"
 
 namespace probeview {
 
 int PrintFront::run(NavigationStack& navigation, const StatusText& status) {
+  // Who asks for text is not to wait for a service that is not there.
+  if (hasFailed()) return 1;
   if (isFilled_) {
     // Nothing else may wake the loop when the last that is waited for is silence.
     const auto wake = loop_.every(std::chrono::milliseconds(200), [] {});
     loop_.runUntil(isFilled_, patience);
+    if (hasFailed()) return 1;
   }
   const bool onePage = navigation.depth() > 1;
   if (onePage ? printTopPage(navigation) : printBelow(navigation)) write(status() + "\n");
   return 0;
+}
+
+bool PrintFront::hasFailed() const {
+  const std::string reason = failure_ ? failure_() : std::string();
+  if (reason.empty()) return false;
+  *errors_ << reason << "\n";
+  return true;
 }
 
 bool PrintFront::printTopPage(const NavigationStack& navigation) {

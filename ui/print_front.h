@@ -3,6 +3,7 @@
 
 #include <chrono>
 #include <functional>
+#include <iosfwd>
 #include <optional>
 #include <string>
 
@@ -24,12 +25,21 @@ class PrintFront final : public Front {
   // Whether there is nothing more to wait for; asked after every turn of the loop. Without it nothing is waited for.
   void waitUntil(std::function<bool()> isFilled) { isFilled_ = std::move(isFilled); }
 
+  // Why nothing can come, empty when something can; asked before anything is waited for and once more after it. With a
+  // reason nothing is printed: it goes to the errors, and the status is 1.
+  void failWith(std::function<std::string()> reason, std::ostream& errors) {
+    failure_ = std::move(reason);
+    errors_ = &errors;
+  }
+
   TaskQueue& mainQueue() override { return loop_; }
   Scheduler& scheduler() override { return loop_; }
   // Prints every page that the launch list leads to; where the stack stands on another page, that page alone.
   int run(NavigationStack& navigation, const StatusText& status) override;
 
  private:
+  // Whether nothing can come; then it has said so.
+  bool hasFailed() const;
   // False when nobody reads any more.
   bool printTopPage(const NavigationStack& navigation);
   bool printBelow(NavigationStack& navigation);
@@ -38,6 +48,8 @@ class PrintFront final : public Front {
   int fileDescriptor_;
   EventLoop loop_;
   std::function<bool()> isFilled_;
+  std::function<std::string()> failure_;
+  std::ostream* errors_ = nullptr;
 };
 
 }  // namespace probeview

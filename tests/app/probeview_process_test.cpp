@@ -82,6 +82,23 @@ TEST(Programs, ProbectlNamesThePagesThatThereAre) {
   for (const auto& key : navigablePageKeys()) EXPECT_NE(shown.output.find("  " + key + "\n"), std::string::npos);
 }
 
+TEST(Programs, WithoutAServicePrintingSaysWhyAndEndsWithStatusOne) {
+  const TemporaryFolder folder;
+  const std::string socket = folder.path() + "/radixd.sock";
+  const std::string reason = "no baseband service at " + socket + "; start radixd or set RADIXD_SOCKET\n";
+  const auto pages = run(probectl + " --socket " + socket + " pages 2>&1");
+  EXPECT_EQ(pages.status, 1);
+  EXPECT_EQ(pages.output, reason);
+  const auto page = run(probectl + " --socket " + socket + " pages LTE RRC State 2>&1 >/dev/null");
+  EXPECT_EQ(page.status, 1);
+  EXPECT_EQ(page.output, reason);
+  const auto shown = run("RADIXD_SOCKET=" + socket + " " + probeview + " --print --log " + folder.path() + "/log 2>&1");
+  EXPECT_EQ(shown.status, 1);
+  // The system's log goes there, too.
+  EXPECT_TRUE(shown.output.ends_with("\n" + reason)) << shown.output;
+  EXPECT_EQ(shown.output.find("probeview › "), std::string::npos);
+}
+
 TEST(Programs, TheTerminalPagesNeedATerminal) {
   const auto shown = run(probeview + " --terminal 2>&1");
   EXPECT_EQ(shown.status, 1);

@@ -4,6 +4,7 @@
 #include <fcntl.h>
 
 #include <csignal>
+#include <sstream>
 
 #include "platform/file_descriptor.h"
 #include "tests/ui/testing.h"
@@ -89,6 +90,30 @@ TEST_F(Printing, NothingIsPrintedBeforeTheStoreIsFilled) {
   front.waitUntil([this] { return store.myLTERRCStateDict().has_value(); });
   EXPECT_EQ(front.run(stack, status), 0);
   EXPECT_NE(printed().find("came  late"), std::string::npos);
+}
+
+TEST_F(Printing, WhenNothingCanComeTheReasonIsToldInsteadOfPagesAndNothingIsWaitedFor) {
+  std::ostringstream errors;
+  front.failWith([] { return "nobody is there"; }, errors);
+  bool waited = false;
+  front.waitUntil([&waited] { return waited = true; });
+  EXPECT_EQ(front.run(stack, status), 1);
+  EXPECT_EQ(errors.str(), "nobody is there\n");
+  EXPECT_EQ(printed(), "");
+  EXPECT_FALSE(waited);
+}
+
+TEST_F(Printing, ThatNothingCanComeIsAlsoSeenAfterTheWait) {
+  std::ostringstream errors;
+  std::string reason;
+  front.failWith([&reason] { return reason; }, errors);
+  front.waitUntil([&reason] {
+    reason = "nobody came";
+    return true;
+  });
+  EXPECT_EQ(front.run(stack, status), 1);
+  EXPECT_EQ(errors.str(), "nobody came\n");
+  EXPECT_EQ(printed(), "");
 }
 
 TEST_F(Printing, AReaderThatWentAwayEndsThePrintingInPeace) {
