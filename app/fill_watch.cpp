@@ -14,7 +14,7 @@ bool FillWatch::isFilled() {
     kinds += hasCome(static_cast<DisplayDictionary>(index)) ? 1 : 0;
   }
   if (kinds == 0) return false;
-  if (kinds_ == 0) {
+  if (!expected_ && clock_.monotonicTime() >= nextQuestion_) {
     if (const auto fillable = fillableMetrics_()) {
       expected_.emplace();
       for (const auto metric : *fillable) {
@@ -22,6 +22,7 @@ bool FillWatch::isFilled() {
         if (const auto* handled = handledMetric(metric)) expected_->insert(handled->handler.dictionary);
       }
     }
+    nextQuestion_ = clock_.monotonicTime() + askAgainAfter;
   }
   if (kinds != kinds_) {
     kinds_ = kinds;

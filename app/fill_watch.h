@@ -21,7 +21,10 @@ class FillWatch {
   static constexpr std::chrono::nanoseconds quiet = std::chrono::seconds(3);
   using FillableMetrics = std::function<std::optional<std::set<std::int64_t>>()>;
 
-  // Store and clock must outlive the watch. The service is asked once, when the first metric has come.
+  // A service that has not said it is asked again after so long.
+  static constexpr std::chrono::nanoseconds askAgainAfter = std::chrono::seconds(1);
+
+  // Store and clock must outlive the watch. The service is asked when the first metric has come, until it says.
   FillWatch(const MetricValidator& store, const Clock& clock, FillableMetrics fillableMetrics)
       : store_(store), clock_(clock), fillableMetrics_(std::move(fillableMetrics)) {}
 
@@ -34,6 +37,7 @@ class FillWatch {
   FillableMetrics fillableMetrics_;
   // The dictionaries of the metrics that can be filled.
   std::optional<std::set<DisplayDictionary>> expected_;
+  std::chrono::nanoseconds nextQuestion_{};
   std::size_t kinds_ = 0;
   std::chrono::nanoseconds lastChange_{};
 };

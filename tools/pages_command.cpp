@@ -42,7 +42,7 @@ ExitStatus showPages(const Options& options, Tool& tool) {
 void addPagesCommand(CLI::App& program, Tool& tool) {
   CLI::App* command = program.add_subcommand("pages", "Show the viewer's pages as text");
   auto options = std::make_shared<Options>();
-  command->add_option("KEY", options->key, "The page to show, as LTE Tx Power; without it, all");
+  command->add_option("KEY", options->key, "The page to show, as LTE Serving Cell Info; without it, all");
   command
       ->add_option("--log", options->logFile, "Write the console log of every metric to this file; else it is dropped")
       ->type_name("FILE");

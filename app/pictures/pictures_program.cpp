@@ -12,15 +12,6 @@
 
 namespace probeview {
 
-namespace {
-
-class NoLines final : public LineSink {
- public:
-  void line(std::string_view) override {}
-};
-
-}  // namespace
-
 int runPicturesProgram(int argc, char** argv, std::ostream& output, std::ostream& errors) {
   CLI::App program(
       "Draws pages of the viewer into one PNG file, without a display: the launch list, a category list and category\n"
@@ -37,7 +28,8 @@ int runPicturesProgram(int argc, char** argv, std::ostream& output, std::ostream
                      ->type_name("PATH");
   program
       .add_option("--page", options.pageKeys,
-                  "A category page, such as \"LTE Tx Power\"; may be given several times (default: three pages of LTE)")
+                  "A category page, such as \"LTE Serving Cell Info\"; may be given several times (default: three "
+                  "pages of LTE)")
       ->type_name("KEY")
       ->allow_extra_args(false);
   std::string look = "both";
@@ -53,7 +45,7 @@ int runPicturesProgram(int argc, char** argv, std::ostream& output, std::ostream
   options.dark = look != "light";
   if (*socket) setenv("RADIXD_SOCKET", socketPath.c_str(), 1);
   // The picture is the only output.
-  setConsoleLog(*new NoLines);
+  setConsoleLog(*new DiscardingSink);
   setSystemLog(*new SystemLog("probeview", SystemLog::Echo::None));
   int noArguments = 1;
   const auto front = qt::makePicturesFront(noArguments, argv, options, errors);

@@ -258,6 +258,27 @@ TEST_F(FillWatching, AStoreIsFilledWhenEveryMetricThatTheSourcesCanFillHasCome) 
   EXPECT_EQ(timesAsked, 1);
 }
 
+TEST_F(FillWatching, TheServiceIsAskedAgainEverySecondUntilItSays) {
+  std::optional<std::set<std::int64_t>> fillable;
+  FillWatch watch(store, clock, [&] {
+    ++timesAsked;
+    return fillable;
+  });
+  comes(DisplayDictionary::myLTERRCStateDict);
+  EXPECT_FALSE(watch.isFilled());
+  EXPECT_FALSE(watch.isFilled());
+  EXPECT_EQ(timesAsked, 1);
+  fillable = {K_LTE_RRC_STATE, K_CELLULAR_MM_CTXT};
+  clock.advance(999ms);
+  EXPECT_FALSE(watch.isFilled());
+  EXPECT_EQ(timesAsked, 1);
+  clock.advance(1ms);
+  EXPECT_FALSE(watch.isFilled());
+  clock.advance(1min);
+  EXPECT_FALSE(watch.isFilled()) << "now silence is not enough";
+  EXPECT_EQ(timesAsked, 2);
+}
+
 TEST_F(FillWatching, WhereTheServiceDoesNotSayAStoreIsFilledWhenNoOtherMetricHasComeForThreeSeconds) {
   auto watch = watchFor(std::nullopt);
   clock.advance(1min);

@@ -25,11 +25,6 @@ namespace {
 
 using namespace std::chrono_literals;
 
-class NoLines final : public LineSink {
- public:
-  void line(std::string_view) override {}
-};
-
 std::size_t residentKilobytes() {
   std::ifstream status("/proc/self/status");
   for (std::string line; std::getline(status, line);) {
@@ -85,7 +80,7 @@ TEST(WindowSoak, ARestlessHandStopsNothingLosesNothingAndLeaksNothing) {
 
   qputenv("QT_QPA_PLATFORM", "offscreen");
   qputenv("QT_QUICK_BACKEND", "software");
-  setConsoleLog(*new NoLines);
+  setConsoleLog(*new DiscardingSink);
   setSystemLog(*new SystemLog("probeview", SystemLog::Echo::None));
   RadixdProcess radixd("scenario:city,speed=100");
   ASSERT_TRUE(radixd.start());
