@@ -1,12 +1,14 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/watch_command.h"
 
+#include <poll.h>
 #include <signal.h>
+#include <unistd.h>
 
 #include <chrono>
 #include <cstdint>
+#include <iostream>
 #include <memory>
-#include <ostream>
 #include <string>
 
 #include "tools/record_text.h"
@@ -52,6 +54,13 @@ class ServiceNotes {
   std::uint64_t lost_ = 0;
 };
 
+// Whether nobody reads the tool's output any more, as far as that can be known without writing to it.
+bool readerIsGone(const Tool& tool) {
+  if (&tool.output != &std::cout) return false;
+  pollfd output{STDOUT_FILENO, 0, 0};
+  return ::poll(&output, 1, 0) > 0 && (output.revents & POLLERR) != 0;
+}
+
 ExitStatus watch(const Options& options, Tool& tool) {
   ServiceClient client(tool);
   client.loop().onSignals({SIGINT, SIGTERM}, [&client](int) { client.loop().stop(); });
@@ -68,7 +77,11 @@ ExitStatus watch(const Options& options, Tool& tool) {
     if (ended) client.loop().stop();
   });
   ServiceNotes notes(client, tool);
-  const auto looking = client.loop().every(std::chrono::milliseconds(500), [&notes] { notes.look(); });
+  const auto looking = client.loop().every(std::chrono::milliseconds(500), [&] {
+    notes.look();
+    // While no record comes, no failing write tells that the reader has gone.
+    if (readerIsGone(tool)) client.loop().stop();
+  });
   client.loop().run();
   return ExitStatus::Success;
 }

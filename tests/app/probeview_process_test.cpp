@@ -99,6 +99,14 @@ TEST(Programs, WithoutAServicePrintingSaysWhyAndEndsWithStatusOne) {
   EXPECT_EQ(shown.output.find("probeview › "), std::string::npos);
 }
 
+TEST(Programs, WatchEndsWhenItsReaderHasGoneAlsoWhileNothingComes) {
+  const TemporaryFolder folder;
+  // No service, hence no record whose writing would fail. The reader that ends at once is bash's own.
+  const auto shown = run("timeout 60 bash -c 'timeout 50 " + probectl + " --socket " + folder.path() +
+                         "/radixd.sock watch 2>/dev/null | :; exit ${PIPESTATUS[0]}'");
+  EXPECT_EQ(shown.status, 0);
+}
+
 TEST(Programs, TheTerminalPagesNeedATerminal) {
   const auto shown = run(probeview + " --terminal 2>&1");
   EXPECT_EQ(shown.status, 1);

@@ -212,6 +212,8 @@ SourceResult makeScenarioSource(std::string_view arguments) {
   if (arguments.starts_with(':')) arguments.remove_prefix(1);
   Options options;
   bool first = true;
+  // A comma announces one more option.
+  if (arguments.ends_with(',')) return {nullptr, readOption("", options)};
   while (first || !arguments.empty()) {
     const std::size_t comma = arguments.find(',');
     const std::string_view item = arguments.substr(0, comma);

@@ -317,7 +317,8 @@ TEST(ScenarioSource, ABadOptionIsRefusedWithWhatItMayBe) {
   for (const char* bad : {"city,speed=0", "city,speed=0.5", "city,speed=1001", "city,speed=fast", "city,speed=nan"}) {
     EXPECT_NE(errorOf(bad).find("a number from 1 to 1000"), std::string::npos) << bad;
   }
-  for (const char* bad : {"city,indoor", "city,loop", "city,seed", "city,,seed=1", "city,Speed=2", "x=1"}) {
+  for (const char* bad :
+       {"city,indoor", "city,loop", "city,seed", "city,,seed=1", "city,Speed=2", "x=1", "city,", "seed=1,", ","}) {
     EXPECT_NE(errorOf(bad).find("no such option; say scenario[:NAME][,seed=N][,speed=N]"), std::string::npos) << bad;
   }
   EXPECT_NE(errorOf("seed=1,seed=2").find("given twice"), std::string::npos);
