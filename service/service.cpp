@@ -41,7 +41,7 @@ struct PushedConfiguration {
   Reply reply;
 };
 
-// The notes that anybody gets to read, one a line.
+// The notes that anybody gets to read.
 std::vector<std::string> notesToTell(const std::vector<std::string>& notes) {
   std::vector<std::string> told(notes.begin(),
                                 notes.begin() + static_cast<std::ptrdiff_t>(std::min(notes.size(), mostNotesTold)));
@@ -66,7 +66,7 @@ PushedConfiguration readConfiguration(const Dictionary& arguments, ServiceLog& l
   std::string message;
   for (const std::string& note : notesToTell(result.configuration->notes)) {
     log.write(LogLevel::Info, "the configuration of " + who + ": " + note);
-    message += (message.empty() ? "" : "\n") + note;
+    message += (message.empty() ? "" : "; ") + note;
   }
   return {std::move(result.configuration), answer(Status::Ok, std::move(message))};
 }

@@ -2,7 +2,6 @@
 #include "tools/service_client.h"
 
 #include <ostream>
-#include <sstream>
 #include <utility>
 
 #include "radix/service_commands.h"
@@ -21,12 +20,9 @@ ExitStatus ServiceClient::perform(std::string_view command, const Dictionary& ar
   const auto status = static_cast<radix::Status>(result.status);
   const bool isAway = status == radix::Status::NoService || status == radix::Status::TimedOut;
   const std::string prefix = subject.empty() || isAway ? "probectl: " : "probectl: " + subject + ": ";
-  std::istringstream lines(result.message);
-  for (std::string line; std::getline(lines, line);) tool_.errors << prefix << line << '\n';
-  if (status != radix::Status::Ok) {
-    if (result.message.empty()) tool_.errors << prefix << "the service refused with status " << result.status << '\n';
-    return ExitStatus::Failure;
-  }
+  const bool isDone = status == radix::Status::Ok;
+  if (!isDone || !result.message.empty()) tool_.errors << prefix << result.message << '\n';
+  if (!isDone) return ExitStatus::Failure;
   if (reply != nullptr && answer) *reply = radix::client::nativeDictionary(*answer);
   return ExitStatus::Success;
 }
