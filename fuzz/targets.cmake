@@ -1,5 +1,6 @@
 # SPDX-License-Identifier: Apache-2.0
 # One line per target.
+probeview_fuzz(messages KNOWS messages values)
 probeview_fuzz(configuration KNOWS configuration)
 probeview_fuzz(trace KNOWS trace_source)
 probeview_fuzz(batch KNOWS tools)
