@@ -1,19 +1,16 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "bench/measure.h"
 
-#include <valgrind/callgrind.h>
-
 #include <algorithm>
 #include <array>
 #include <cmath>
 #include <ctime>
 #include <iomanip>
-#include <map>
 #include <random>
 #include <sstream>
 
-#include "bench/allocations.h"
 #include "bench/case.h"
+#include "bench/count.h"
 
 namespace probeview::bench {
 
@@ -31,16 +28,8 @@ namespace {
 constexpr std::array tasks = {Task::Decode, Task::Encode, Task::Print};
 constexpr std::string_view ours = "ours";
 
-std::string_view nameOf(Task task) {
-  switch (task) {
-    case Task::Decode:
-      return "decode";
-    case Task::Encode:
-      return "encode";
-    case Task::Print:
-      return "payload → dictionary → printed line";
-  }
-  return {};
+std::string_view titleOf(Task task) {
+  return task == Task::Print ? "payload → dictionary → printed line" : nameOf(task);
 }
 
 struct Measured {
@@ -69,14 +58,6 @@ double processorTime() {
   return time / static_cast<double>(measured.repetitions * measured.set->payloads.size());
 }
 
-double allocationsOf(Case& test, const PayloadSet& set) {
-  constexpr std::size_t repetitions = 100;
-  test.run();
-  const std::size_t before = allocationCount();
-  for (std::size_t index = 0; index < repetitions; ++index) test.run();
-  return static_cast<double>(allocationCount() - before) / static_cast<double>(repetitions * set.payloads.size());
-}
-
 double median(std::vector<double> values) {
   std::nth_element(values.begin(), values.begin() + static_cast<std::ptrdiff_t>(values.size() / 2), values.end());
   return values[values.size() / 2];
@@ -88,43 +69,80 @@ std::string number(double value, int digits) {
   return text.str();
 }
 
-struct Ratio {
+struct Spread {
   double minimum;
   double median;
   double maximum;
 };
 
-// Peer over ours, round by round: what disturbs the machine disturbs both.
-Ratio ratioOf(const Measured& peer, const Measured& own) {
-  std::vector<double> ratios;
-  for (std::size_t round = 0; round < own.times.size(); ++round) ratios.push_back(peer.times[round] / own.times[round]);
-  return {*std::min_element(ratios.begin(), ratios.end()), median(ratios),
-          *std::max_element(ratios.begin(), ratios.end())};
+Spread spreadOf(const std::vector<double>& values) {
+  return {*std::min_element(values.begin(), values.end()), median(values),
+          *std::max_element(values.begin(), values.end())};
 }
 
-using Table = std::map<std::pair<std::string_view, std::string_view>, const Measured*>;  // contender, set
+// Peer over ours, round by round: what disturbs the machine disturbs both.
+std::vector<double> ratiosOf(const Measured& peer, const Measured& own) {
+  std::vector<double> ratios;
+  for (std::size_t round = 0; round < own.times.size(); ++round) ratios.push_back(peer.times[round] / own.times[round]);
+  return ratios;
+}
 
-void writeTask(Task task, const std::vector<Measured>& all, std::ostream& out) {
-  Table table;
-  std::vector<std::string_view> contenders;
+// The sets that the geometric mean is over.
+bool isInMean(const PayloadSet& set) { return set.name != "r"; }
+
+// One contender at one task.
+struct Row {
+  std::string_view contender;
+  std::vector<const Measured*> sets;  // in the order of payloadSets()
+};
+
+// Ours first.
+std::vector<Row> rowsOf(Task task, const std::vector<Measured>& all) {
+  std::vector<Row> rows;
   for (const Measured& measured : all) {
     if (measured.contender.task != task) continue;
-    table[{measured.contender.name, measured.set->name}] = &measured;
-    if (std::find(contenders.begin(), contenders.end(), measured.contender.name) == contenders.end()) {
-      contenders.push_back(measured.contender.name);
-    }
+    if (rows.empty() || rows.back().contender != measured.contender.name) rows.push_back({measured.contender.name, {}});
+    rows.back().sets.push_back(&measured);
   }
-  out << "\n## " << nameOf(task)
+  return rows;
+}
+
+struct Comparison {
+  std::vector<Spread> sets;
+  Spread mean;  // of the geometric means of each round
+};
+
+Comparison compare(const Row& peer, const Row& own) {
+  Comparison comparison;
+  std::vector<double> logarithms(own.sets.front()->times.size());
+  double count = 0;
+  for (std::size_t index = 0; index < own.sets.size(); ++index) {
+    const std::vector<double> ratios = ratiosOf(*peer.sets[index], *own.sets[index]);
+    comparison.sets.push_back(spreadOf(ratios));
+    if (!isInMean(*own.sets[index]->set)) continue;
+    ++count;
+    for (std::size_t round = 0; round < ratios.size(); ++round) logarithms[round] += std::log(ratios[round]);
+  }
+  for (double& value : logarithms) value = std::exp(value / count);
+  comparison.mean = spreadOf(logarithms);
+  return comparison;
+}
+
+std::string textOf(const Spread& spread) {
+  return number(spread.minimum, 2) + " **" + number(spread.median, 2) + "** " + number(spread.maximum, 2);
+}
+
+void writeTables(Task task, const std::vector<Row>& rows, std::ostream& out) {
+  out << "\n### " << titleOf(task)
       << "\n\nTime per message in ns, median of all rounds; in brackets the allocations.\n\n| |";
   for (const PayloadSet& set : payloadSets()) out << " " << set.name << " |";
   out << "\n|---|";
   for (std::size_t index = 0; index < payloadSets().size(); ++index) out << "---:|";
   out << "\n";
-  for (const std::string_view contender : contenders) {
-    out << "| " << contender << " |";
-    for (const PayloadSet& set : payloadSets()) {
-      const Measured& measured = *table.at({contender, set.name});
-      out << " " << number(median(measured.times), 0) << " (" << number(measured.allocations, 1) << ") |";
+  for (const Row& row : rows) {
+    out << "| " << row.contender << " |";
+    for (const Measured* measured : row.sets) {
+      out << " " << number(median(measured->times), 0) << " (" << number(measured->allocations, 1) << ") |";
     }
     out << "\n";
   }
@@ -133,26 +151,37 @@ void writeTask(Task task, const std::vector<Measured>& all, std::ostream& out) {
   out << " geometric mean a to f |\n|---|";
   for (std::size_t index = 0; index <= payloadSets().size(); ++index) out << "---:|";
   out << "\n";
-  for (const std::string_view contender : contenders) {
-    if (contender == ours) continue;
-    out << "| " << contender << " |";
-    double logarithms = 0;
-    int count = 0;
-    for (const PayloadSet& set : payloadSets()) {
-      const Ratio ratio = ratioOf(*table.at({contender, set.name}), *table.at({ours, set.name}));
-      out << " " << number(ratio.minimum, 2) << " **" << number(ratio.median, 2) << "** " << number(ratio.maximum, 2)
-          << " |";
-      if (set.name == "r") continue;
-      logarithms += std::log(ratio.median);
-      ++count;
+  for (const Row& row : rows) {
+    if (row.contender == ours) continue;
+    const Comparison comparison = compare(row, rows.front());
+    out << "| " << row.contender << " |";
+    for (const Spread& spread : comparison.sets) out << " " << textOf(spread) << " |";
+    out << " " << textOf(comparison.mean) << " |\n";
+  }
+}
+
+void writeFigures(Task task, const std::vector<Row>& rows, std::ostream& out) {
+  const auto write = [&](const Row& row, std::string_view set, const Spread& spread) {
+    out << "ratio\t" << nameOf(task) << "\t" << row.contender << "\t" << set << "\t" << spread.minimum << "\t"
+        << spread.median << "\t" << spread.maximum << "\n";
+  };
+  for (const Row& row : rows) {
+    for (const Measured* measured : row.sets) {
+      out << "time\t" << nameOf(task) << "\t" << row.contender << "\t" << measured->set->name << "\t"
+          << median(measured->times) << "\t" << measured->allocations << "\n";
     }
-    out << " **" << number(std::exp(logarithms / count), 2) << "** |\n";
+    if (row.contender == ours) continue;
+    const Comparison comparison = compare(row, rows.front());
+    for (std::size_t index = 0; index < row.sets.size(); ++index) {
+      write(row, row.sets[index]->set->name, comparison.sets[index]);
+    }
+    write(row, "mean", comparison.mean);
   }
 }
 
 }  // namespace
 
-void measureAll(int rounds, std::ostream& out) {
+void measureAll(int rounds, std::ostream& out, std::ostream& figures) {
   std::vector<Measured> all;
   for (const Contender& contender : allContenders()) {
     for (const PayloadSet& set : payloadSets()) all.push_back({contender, &set, contender.make(set), 1, {}, 0});
@@ -177,23 +206,16 @@ void measureAll(int rounds, std::ostream& out) {
     out << "- (" << set.name << ") " << set.title << ", " << size / set.payloads.size() << " bytes"
         << (set.payloads.size() > 1 ? " on average" : "") << "\n";
   }
-  for (const Task task : tasks) writeTask(task, all, out);
+  for (const Task task : tasks) {
+    const std::vector<Row> rows = rowsOf(task, all);
+    writeTables(task, rows, out);
+    writeFigures(task, rows, figures);
+  }
 }
 
 void countInstructions(std::ostream& out) {
-  constexpr std::size_t repetitions = 50;
   for (const Contender& contender : allContenders()) {
-    for (const PayloadSet& set : payloadSets()) {
-      const std::unique_ptr<Case> test = contender.make(set);
-      const double allocations = allocationsOf(*test, set);
-      CALLGRIND_TOGGLE_COLLECT;
-      for (std::size_t index = 0; index < repetitions; ++index) test->run();
-      CALLGRIND_TOGGLE_COLLECT;
-      const std::string task(nameOf(contender.task).substr(0, 6));
-      const std::string name = task + "/" + std::string(contender.name) + "/" + set.name;
-      CALLGRIND_DUMP_STATS_AT(name.c_str());
-      out << name << "\t" << repetitions * set.payloads.size() << "\t" << allocations << "\n";
-    }
+    for (const PayloadSet& set : payloadSets()) countCase(contender, set, out);
   }
 }
 

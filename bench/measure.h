@@ -6,11 +6,13 @@
 
 namespace probeview::bench {
 
-// Measures everything in one run, cases interleaved in random order, and writes the tables (Markdown).
-void measureAll(int rounds, std::ostream& out);
+// Measures everything in one run, cases interleaved in random order, and writes the tables (Markdown) and the same as
+// figures, one a line and separated by tabs:
+//   time   task  contender  set                   ns per message (median), allocations per message
+//   ratio  task  peer       set or "mean" (a to f)  how many times longer than ours: minimum, median, maximum
+void measureAll(int rounds, std::ostream& out, std::ostream& figures);
 
-// Under callgrind (started with --collect-atstart=no): instructions of each case, one dump per case, named
-// "task/contender/set"; also allocations per message on standard output.
+// countCase() for every contender and set.
 void countInstructions(std::ostream& out);
 
 }  // namespace probeview::bench

@@ -29,7 +29,7 @@ OUTSIDE = {"tools", "tests", "fuzz", "bench"}
 
 # What only one room may know: toolkits stay behind their front, locks and threads stay in platform.
 OWNED = [
-    (re.compile(r"<(Q[A-Z]\w*|Qt\w+)(/\w+)?>"), {"ui/qt", "tests"}, "Qt"),
+    (re.compile(r"<(Q[A-Z]\w*|Qt\w+)(/\w+)?>"), {"ui/qt", "tests", "bench"}, "Qt"),
     (re.compile(r"<(ncursesw?/)?(n?curses|panel)\.h>"), {"ui/terminal"}, "ncurses"),
     (re.compile(r"<(mutex|thread|shared_mutex|condition_variable|future|semaphore|latch|barrier)>"),
      {"platform", "tests", "bench"}, "threads and locks"),
