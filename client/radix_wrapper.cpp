@@ -17,8 +17,6 @@ namespace {
 
 // Only this application may use the door.
 constexpr std::string_view applicationId = "probeview";
-// What every command says of itself to the service, whatever name gated the call.
-constexpr std::int64_t serviceAppId = 2;
 constexpr std::int64_t configurationPayloadType = 0;
 
 constexpr std::string_view blockName = "-[RadixWrapper listen]_block_invoke";
@@ -100,7 +98,7 @@ bool RadixWrapper::addTelemConfigForAppId(std::string_view appId, const std::str
   const std::optional<Value> payload = readWholeFile(protofFilePath);
   if (!payload) return false;
   return perform("-[RadixWrapper addTelemConfigForAppId:andProtofFilePath:]", radix::kCommandAddConfiguration,
-                 {{radix::kKeyAppID, serviceAppId},
+                 {{radix::kKeyAppID, radix::serviceAppId},
                   {radix::kKeyPayload, *payload},
                   {radix::kKeyPayloadType, configurationPayloadType}});
 }
@@ -108,7 +106,7 @@ bool RadixWrapper::addTelemConfigForAppId(std::string_view appId, const std::str
 bool RadixWrapper::removeTelemConfigForAppid(std::string_view appId) {
   if (appId != applicationId) return false;
   return perform("-[RadixWrapper removeTelemConfigForAppid:]", radix::kCommandClearConfiguration,
-                 {{radix::kKeyAppID, serviceAppId}});
+                 {{radix::kKeyAppID, radix::serviceAppId}});
 }
 
 bool RadixWrapper::querySpecificMetric(std::string_view appId, std::int32_t triggerRef, std::int32_t triggerType,
@@ -116,7 +114,7 @@ bool RadixWrapper::querySpecificMetric(std::string_view appId, std::int32_t trig
   if (appId != applicationId) return false;
   return perform("-[RadixWrapper querySpecificMetric:triggerRef:triggerType:triggerID:profileID:metricID:]",
                  radix::kCommandQueryMetric,
-                 {{radix::kKeyAppID, serviceAppId},
+                 {{radix::kKeyAppID, radix::serviceAppId},
                   {radix::kKeyPayloadType, configurationPayloadType},
                   {radix::kKeyTriggerRef, widened(triggerRef)},
                   {radix::kKeyTriggerType, widened(triggerType)},

@@ -34,6 +34,9 @@ inline constexpr char kKeyTriggerType[] = "kKeyTriggerType";  // 64-bit integer
 inline constexpr char kKeyTime[] = "kKeyTime";      // 64-bit integer, milliseconds since 1970-01-01 UTC
 inline constexpr char kKeyOrigin[] = "kKeyOrigin";  // text, such as "scenario:city"
 
+// What our programs call themselves in kKeyAppID.
+inline constexpr std::int64_t serviceAppId = 2;
+
 inline constexpr char kCommandAddConfiguration[] = "kCommandAddConfiguration";
 inline constexpr char kCommandClearConfiguration[] = "kCommandClearConfiguration";
 inline constexpr char kCommandQueryMetric[] = "kCommandQueryMetric";

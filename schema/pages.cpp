@@ -10,6 +10,7 @@
 #include "messages/metric_identifiers.h"
 #include "messages/registry.h"
 #include "schema/facts.h"
+#include "values/plain_text.h"
 
 namespace probeview {
 
@@ -185,13 +186,6 @@ Page protoFile(const Family& family) {
   return {"schema/" + std::string(family.name) + ".proto", std::move(out)};
 }
 
-std::string hexadecimal(std::int64_t id) {
-  constexpr std::string_view digits = "0123456789ABCDEF";
-  std::string text;
-  for (; id != 0; id >>= 4) text.insert(text.begin(), digits[static_cast<std::size_t>(id & 15)]);
-  return "0x" + text;
-}
-
 std::string anchor(std::string_view name) {
   std::string text;
   for (const char character : name) text += static_cast<char>(std::tolower(static_cast<unsigned char>(character)));
@@ -227,7 +221,7 @@ Page metricsPage() {
       "files in `schema/` hold the same for protobuf. Made from the field tables by `metrics_page`; do not edit.\n\n"
       "| metric | identifier | message |\n|---|---|---|\n";
   for (const MetricIdentifier& metric : metricIdentifiers()) {
-    out += "| `" + std::string(metric.name) + "` | " + hexadecimal(metric.id) + " | ";
+    out += "| `" + std::string(metric.name) + "` | " + hexText(metric.id) + " | ";
     if (metric.message == nullptr) {
       out += "none: known, but not taken";
     } else {
@@ -243,7 +237,7 @@ Page metricsPage() {
       if (facts != nullptr) out += std::string(facts->meaning) + "\n\n";
       for (const MetricIdentifier& metric : metricIdentifiers()) {
         if (metric.message != message) continue;
-        out += "Metric `" + std::string(metric.name) + "`, " + hexadecimal(metric.id) + ".";
+        out += "Metric `" + std::string(metric.name) + "`, " + hexText(metric.id) + ".";
       }
       if (facts != nullptr && !facts->dictionary.empty()) {
         out += " Display dictionary `" + std::string(facts->dictionary) + "`.";

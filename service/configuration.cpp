@@ -2,10 +2,10 @@
 #include "service/configuration.h"
 
 #include <algorithm>
-#include <charconv>
 #include <utility>
 
 #include "messages/metric_identifiers.h"
+#include "values/plain_text.h"
 #include "values/printer.h"
 
 namespace probeview {
@@ -51,32 +51,9 @@ std::string shown(std::string_view text) {
   return out;
 }
 
-std::optional<std::int64_t> parsedInteger(std::string_view text) {
-  int base = 10;
-  if (text.starts_with("0x") || text.starts_with("0X")) {
-    base = 16;
-    text.remove_prefix(2);
-  }
-  // A sign after 0x is no number either.
-  if (text.empty() || (base == 16 && text[0] == '-')) return std::nullopt;
-  std::int64_t number = 0;
-  const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), number, base);
-  if (error != std::errc() || end != text.data() + text.size()) return std::nullopt;
-  return number;
-}
-
-std::string hexText(std::int64_t number) {
-  char digits[24];
-  const auto [end, error] = std::to_chars(digits, digits + sizeof digits, static_cast<std::uint64_t>(number), 16);
-  std::string text(digits, end);
-  std::ranges::transform(text, text.begin(),
-                         [](char digit) { return digit >= 'a' ? static_cast<char>(digit - 32) : digit; });
-  return "0x" + text;
-}
-
 // The metric of that name or identifier; absent when nobody knows it.
 std::optional<std::int64_t> metricOf(std::string_view reference) {
-  if (const std::optional<std::int64_t> number = parsedInteger(reference)) {
+  if (const std::optional<std::int64_t> number = parseInteger64(reference)) {
     return metricWithId(*number) != nullptr ? number : std::nullopt;
   }
   const MetricIdentifier* const metric = metricNamed(reference);
@@ -187,7 +164,7 @@ class Parser {
   }
 
   void readTrigger(const toml::key& key, const toml::node& node) {
-    const std::optional<std::int64_t> trigger = parsedInteger(key.str());
+    const std::optional<std::int64_t> trigger = parseInteger64(key.str());
     if (!trigger)
       return refuse(key.source(), "a trigger is named by its number, such as 0x7F0013, not " + shown(key.str()));
     const toml::array* const array = node.as_array();
@@ -244,9 +221,7 @@ class Parser {
   static std::string oneLine(std::string_view description) {
     std::string text;
     appendValidUtf8(description, text);
-    std::ranges::replace_if(
-        text, [](char character) { return static_cast<unsigned char>(character) < 32; }, ' ');
-    return text;
+    return onOneLine(text);
   }
 
   Configuration configuration_;

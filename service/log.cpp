@@ -3,6 +3,8 @@
 
 #include <string>
 
+#include "values/plain_text.h"
+
 namespace probeview {
 
 std::string_view nameOf(LogLevel level) {
@@ -25,8 +27,7 @@ void ServiceLog::write(LogLevel level, std::string_view text) {
   line += nameOf(level);
   line += ": ";
   // What a peer or a file said may be quoted in the text: a line stays a line.
-  for (const char character : text)
-    line += static_cast<unsigned char>(character) < 0x20 || character == 0x7F ? '?' : character;
+  line += onOneLine(text);
   sink_.line(line);
 }
 

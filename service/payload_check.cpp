@@ -1,11 +1,10 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "service/payload_check.h"
 
-#include <charconv>
-
 #include "messages/metric_identifiers.h"
 #include "messages/runtime/codable.h"
 #include "messages/runtime/data_reader.h"
+#include "values/plain_text.h"
 
 namespace probeview {
 
@@ -15,16 +14,6 @@ bool payloadDecodes(std::int64_t metricId, std::span<const std::uint8_t> payload
   const auto message = metric->message->make();
   PBDataReader reader(payload);
   return message->readFrom(reader);
-}
-
-std::string hexText(std::int64_t number) {
-  char digits[16];
-  const auto end = std::to_chars(digits, digits + sizeof digits, static_cast<std::uint64_t>(number), 16).ptr;
-  std::string text = "0x";
-  for (const char* digit = digits; digit != end; ++digit) {
-    text += *digit >= 'a' ? static_cast<char>(*digit - 'a' + 'A') : *digit;
-  }
-  return text;
 }
 
 std::string metricText(std::int64_t metricId) {

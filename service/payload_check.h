@@ -14,7 +14,4 @@ bool payloadDecodes(std::int64_t metricId, std::span<const std::uint8_t> payload
 // For people: "K_LTE_RRC_STATE (0x3C4E04)", or the bare number of a metric without a name.
 std::string metricText(std::int64_t metricId);
 
-// "0x7F0013"; a negative number as its two's complement.
-std::string hexText(std::int64_t number);
-
 }  // namespace probeview

@@ -12,6 +12,7 @@
 #include "service/payload_check.h"
 #include "service/plans.h"
 #include "service/status_report.h"
+#include "values/plain_text.h"
 #include "values/printer.h"
 
 namespace probeview {

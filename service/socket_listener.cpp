@@ -15,6 +15,7 @@
 #include <utility>
 
 #include "radix/socket_link.h"
+#include "values/plain_text.h"
 
 namespace probeview {
 
@@ -176,9 +177,9 @@ std::vector<int> handedOverSockets() {
   std::vector<int> descriptors;
   const char* process = std::getenv("LISTEN_PID");
   const char* count = std::getenv("LISTEN_FDS");
-  if (process != nullptr && count != nullptr && std::strtol(process, nullptr, 10) == ::getpid()) {
-    const long number = std::strtol(count, nullptr, 10);
-    for (long index = 0; index < number; ++index) {
+  if (process != nullptr && count != nullptr && parseInteger64(process) == ::getpid()) {
+    const std::int64_t number = parseInteger64(count).value_or(0);
+    for (std::int64_t index = 0; index < number; ++index) {
       const int descriptor = firstDescriptor + static_cast<int>(index);
       if (::fcntl(descriptor, F_SETFD, FD_CLOEXEC) != 0) break;
       descriptors.push_back(descriptor);

@@ -1,7 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/batch.h"
 
-#include <charconv>
 #include <istream>
 #include <limits>
 #include <ostream>
@@ -104,21 +103,6 @@ std::optional<std::vector<std::uint8_t>> parseHex(std::string_view text) {
     bytes.push_back(static_cast<std::uint8_t>(high << 4 | low));
   }
   return bytes;
-}
-
-std::optional<std::int64_t> parseInteger64(std::string_view text) {
-  const auto whole = [](std::string_view digits, auto& number, int base) {
-    const auto [end, error] = std::from_chars(digits.data(), digits.data() + digits.size(), number, base);
-    return error == std::errc() && end == digits.data() + digits.size();
-  };
-  if (text.starts_with("0x") || text.starts_with("0X")) {
-    std::uint64_t bits = 0;
-    if (!whole(text.substr(2), bits, 16)) return std::nullopt;
-    return static_cast<std::int64_t>(bits);
-  }
-  std::int64_t number = 0;
-  if (!whole(text, number, 10)) return std::nullopt;
-  return number;
 }
 
 std::string quotedExcerpt(std::string_view text) {

@@ -77,9 +77,6 @@ std::vector<std::string_view> splitWords(std::string_view line);
 // character.
 std::optional<std::vector<std::uint8_t>> parseHex(std::string_view text);
 
-// A 64-bit number: decimal with an optional minus, or 0x with up to 64 bits, where the topmost is the sign.
-std::optional<std::int64_t> parseInteger64(std::string_view text);
-
 // A piece of a line as it may stand in an error: quoted, and cut when it is long.
 std::string quotedExcerpt(std::string_view text);
 

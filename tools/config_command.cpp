@@ -40,7 +40,7 @@ ExitStatus push(const std::string& path, Tool& tool) {
   ServiceClient client(tool);
   return client.perform(
       radix::kCommandSetBaseConfiguration,
-      {{radix::kKeyAppID, std::int64_t{2}},
+      {{radix::kKeyAppID, radix::serviceAppId},
        {radix::kKeyPayload, Value::bytes({reinterpret_cast<const std::uint8_t*>(content.data()), content.size()})},
        {radix::kKeyPayloadType, std::int64_t{0}}},
       nullptr, path);
@@ -48,7 +48,7 @@ ExitStatus push(const std::string& path, Tool& tool) {
 
 ExitStatus clear(Tool& tool) {
   ServiceClient client(tool);
-  return client.perform(radix::kCommandClearBaseConfiguration, {{radix::kKeyAppID, std::int64_t{2}}});
+  return client.perform(radix::kCommandClearBaseConfiguration, {{radix::kKeyAppID, radix::serviceAppId}});
 }
 
 }  // namespace

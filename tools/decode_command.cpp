@@ -7,6 +7,7 @@
 #include "tools/batch.h"
 #include "tools/payload_decoder.h"
 #include "values/json.h"
+#include "values/plain_text.h"
 #include "values/printer.h"
 
 namespace probeview {
@@ -26,11 +27,7 @@ std::string_view asText(const std::vector<std::uint8_t>& bytes) {
 // A text stands bare unless it holds what would break the line or steer a terminal.
 std::string valueForAPerson(const Value& value) {
   const std::string bare = bareText(value);
-  const bool plain = std::ranges::none_of(bare, [](char character) {
-    const auto code = static_cast<unsigned char>(character);
-    return code < 32 || code == 127;
-  });
-  return plain ? bare : printed(value);
+  return std::ranges::none_of(bare, isControlCharacter) ? bare : printed(value);
 }
 
 ExitStatus decodeForAPerson(const Options& options, Tool& tool) {

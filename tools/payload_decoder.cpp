@@ -8,6 +8,7 @@
 #include "messages/runtime/codable.h"
 #include "messages/runtime/data_reader.h"
 #include "messages/runtime/data_writer.h"
+#include "values/plain_text.h"
 
 namespace probeview {
 

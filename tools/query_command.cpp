@@ -40,7 +40,7 @@ ExitStatus query(const Options& options, Tool& tool) {
   // The last records come first; they are no answer.
   if (const ExitStatus status = client.drain(); status != ExitStatus::Success) return status;
   answer.reset();
-  const Dictionary arguments{{radix::kKeyAppID, std::int64_t{2}}, {radix::kKeyMetricID, *metric}};
+  const Dictionary arguments{{radix::kKeyAppID, radix::serviceAppId}, {radix::kKeyMetricID, *metric}};
   Dictionary reply;
   const ExitStatus status = client.perform(radix::kCommandQueryMetric, arguments, &reply);
   if (status != ExitStatus::Success) return status;

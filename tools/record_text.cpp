@@ -5,9 +5,9 @@
 #include "messages/runtime/codable.h"
 #include "messages/runtime/data_reader.h"
 #include "radix/client.h"
-#include "tools/batch.h"
 #include "tools/personal_data.h"
 #include "values/json.h"
+#include "values/plain_text.h"
 #include "values/printer.h"
 
 namespace probeview {
@@ -30,14 +30,6 @@ std::optional<Dictionary> contentOf(const MetricIdentifier* metric, const Dictio
   return message->dictionaryRepresentation();
 }
 
-std::string hexadecimal(std::int64_t number) {
-  std::string digits;
-  for (auto rest = static_cast<std::uint64_t>(number); rest != 0 || digits.empty(); rest >>= 4) {
-    digits.insert(digits.begin(), "0123456789ABCDEF"[rest & 0xF]);
-  }
-  return "0x" + digits;
-}
-
 }  // namespace
 
 std::string RecordText::line(const Dictionary& event) {
@@ -49,7 +41,7 @@ std::string RecordText::line(const Dictionary& event) {
   std::optional<Dictionary> content = contentOf(metric, event);
   if (content && !options_.personal) hidePersonalData(*content);
 
-  const std::string name = metric != nullptr ? std::string(metric->name) : hexadecimal(id);
+  const std::string name = metric != nullptr ? std::string(metric->name) : hexText(id);
 
   std::string text;
   if (options_.json) {
@@ -73,10 +65,7 @@ std::string RecordText::line(const Dictionary& event) {
   text = timestamps_.format(static_cast<double>(time));
   text += "  ";
   // An origin is a file's name, which may hold anything.
-  for (const char character : originText) {
-    const auto code = static_cast<unsigned char>(character);
-    text += code < 32 || code == 127 ? '?' : character;
-  }
+  text += onOneLine(originText);
   text += "  " + name + "  ";
   print(content.value_or(Dictionary{}), text);
   return text;

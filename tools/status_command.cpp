@@ -11,6 +11,7 @@
 #include "radix/service_commands.h"
 #include "tools/service_client.h"
 #include "values/json.h"
+#include "values/plain_text.h"
 #include "values/printer.h"
 
 namespace probeview {
@@ -21,13 +22,8 @@ namespace {
 std::string text(const Dictionary& entry, std::string_view key) {
   const Value* value = entry.find(key);
   if (value == nullptr) return "";
-  std::string shown;
   // Names come from other programs: nothing in them may steer the terminal.
-  for (const char character : bareText(*value)) {
-    const auto code = static_cast<unsigned char>(character);
-    shown += code < 32 || code == 127 ? '?' : character;
-  }
-  return shown;
+  return onOneLine(bareText(*value));
 }
 
 bool truth(const Dictionary& entry, std::string_view key) {

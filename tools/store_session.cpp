@@ -8,6 +8,7 @@
 #include "ui/page_snapshot.h"
 #include "ui/varnet_view_items.h"
 #include "values/json.h"
+#include "values/plain_text.h"
 
 namespace probeview {
 

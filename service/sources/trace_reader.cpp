@@ -7,12 +7,11 @@
 
 #include <array>
 #include <cerrno>
-#include <charconv>
 #include <cmath>
-#include <system_error>
 
 #include "platform/file_descriptor.h"
 #include "service/sources/wire_units.h"
+#include "values/plain_text.h"
 #include "values/printer.h"
 
 namespace probeview {
@@ -78,15 +77,6 @@ std::string shown(std::string_view field) {
 
 bool isNoValue(std::string_view field) { return field.empty() || field == "-"; }
 
-template <typename Number, typename... Format>
-std::optional<Number> parsed(std::string_view field, Format... format) {
-  Number number{};
-  const char* const end = field.data() + field.size();
-  const auto [stop, error] = std::from_chars(field.data(), end, number, format...);
-  if (error != std::errc() || stop != end) return std::nullopt;
-  return number;
-}
-
 std::optional<std::chrono::milliseconds> parsedTime(std::string_view field) {
   // yyyy.MM.dd_HH.mm.ss
   constexpr std::string_view pattern = "0000.00.00_00.00.00";
@@ -96,7 +86,7 @@ std::optional<std::chrono::milliseconds> parsedTime(std::string_view field) {
     if (pattern[index] == '0' ? !digit : field[index] != pattern[index]) return std::nullopt;
   }
   const auto number = [field](std::size_t begin, std::size_t length) {
-    return *parsed<unsigned>(field.substr(begin, length));
+    return *parseNumber<unsigned>(field.substr(begin, length));
   };
   const std::chrono::year_month_day day{std::chrono::year(static_cast<int>(number(0, 4))),
                                         std::chrono::month(number(5, 2)), std::chrono::day(number(8, 2))};
@@ -276,7 +266,7 @@ class Reader {
   bool readNumber(const Fields& fields, Column column, std::optional<double>& number) {
     const std::string_view field = fields[column];
     if (isNoValue(field)) return true;
-    number = parsed<double>(field);
+    number = parseNumber<double>(field);
     if (number && std::isfinite(*number)) return true;
     skip(std::string(columnNames[column]) + " is " + shown(field) + ", not a number");
     return false;
@@ -286,11 +276,11 @@ class Reader {
     std::optional<std::uint64_t> cell;
     std::optional<std::uint32_t> area;
     if (!isNoValue(fields[CellIdentity])) {
-      cell = parsed<std::uint64_t>(fields[CellIdentity]);
+      cell = parseNumber<std::uint64_t>(fields[CellIdentity]);
       if (!cell) return skip("RAWCELLID is " + shown(fields[CellIdentity]) + ", not a number"), false;
     }
     if (!isNoValue(fields[AreaCode])) {
-      area = parsed<std::uint32_t>(fields[AreaCode], 16);
+      area = parseNumber<std::uint32_t>(fields[AreaCode], 16);
       if (!area || *area > 0xFFFF) {
         return skip("LACHEX is " + shown(fields[AreaCode]) + ", not an area code of 16 bits in hexadecimal"), false;
       }

@@ -2,13 +2,13 @@
 #include "service/sources/trace_source.h"
 
 #include <algorithm>
-#include <charconv>
 #include <set>
 #include <utility>
 
 #include "service/sources/metric_pacer.h"
 #include "service/sources/trace_reader.h"
 #include "service/sources/trace_translator.h"
+#include "values/plain_text.h"
 
 namespace probeview {
 
@@ -39,11 +39,11 @@ std::string parseArguments(std::string_view text, TraceArguments& arguments) {
       arguments.loop = true;
     } else if (option.starts_with(speedOption)) {
       const std::string_view number = option.substr(speedOption.size());
-      const auto [end, error] = std::from_chars(number.data(), number.data() + number.size(), arguments.speed);
-      const bool understood = error == std::errc() && end == number.data() + number.size();
-      if (!understood || !(arguments.speed >= slowest && arguments.speed <= fastest)) {
+      const auto speed = parseNumber<double>(number);
+      if (!speed || !(*speed >= slowest && *speed <= fastest)) {
         return "speed=" + std::string(number) + " is not understood; a speed is a number from 0.001 to 100000";
       }
+      arguments.speed = *speed;
     } else {
       break;
     }

@@ -55,17 +55,5 @@ TEST(BatchHex, EitherCaseAndADashForNothing) {
   for (const char* bad : {"", "0", "0x00", "zz", "000", "--", "0-"}) EXPECT_EQ(parseHex(bad), std::nullopt) << bad;
 }
 
-TEST(BatchInteger, DecimalHexadecimalAndNegativeInSixtyFourBits) {
-  EXPECT_EQ(parseInteger64("3952132"), 3952132);
-  EXPECT_EQ(parseInteger64("0x3C4E04"), 0x3C4E04);
-  EXPECT_EQ(parseInteger64("0X3c4e04"), 0x3C4E04);
-  EXPECT_EQ(parseInteger64("-9223372036854775808"), std::numeric_limits<std::int64_t>::min());
-  EXPECT_EQ(parseInteger64("0xFFFFFFFFFFFFFFFF"), -1);
-  for (const char* bad :
-       {"", "-", "+1", "1 ", "0x", "0x-1", "-0x1", "1.0", "9223372036854775808", "0x10000000000000000"}) {
-    EXPECT_EQ(parseInteger64(bad), std::nullopt) << bad;
-  }
-}
-
 }  // namespace
 }  // namespace probeview

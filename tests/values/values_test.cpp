@@ -9,6 +9,7 @@
 
 #include "values/dictionary.h"
 #include "values/json.h"
+#include "values/plain_text.h"
 #include "values/printer.h"
 #include "values/value.h"
 
@@ -222,6 +223,42 @@ TEST(Json, KeepsIntegersBytesAndTextsThatAreNotUtf8) {
   EXPECT_EQ(json(dictionary),
             R"({"u":18446744073709551615,"r":10.0,"f":1.4,"b":true,"y":{"bytes":"62f210"},"t":{"text":"c328"},)"
             R"("l":[-1,"q\"\n\u0001"]})");
+}
+
+TEST(PlainText, AnIntegerIsDecimalHexadecimalOrNegativeInSixtyFourBits) {
+  EXPECT_EQ(parseInteger64("3952132"), 3952132);
+  EXPECT_EQ(parseInteger64("0x3C4E04"), 0x3C4E04);
+  EXPECT_EQ(parseInteger64("0X3c4e04"), 0x3C4E04);
+  EXPECT_EQ(parseInteger64("-9223372036854775808"), std::numeric_limits<std::int64_t>::min());
+  EXPECT_EQ(parseInteger64("0xFFFFFFFFFFFFFFFF"), -1);
+  for (const char* bad :
+       {"", "-", "+1", "1 ", "0x", "0x-1", "-0x1", "1.0", "9223372036854775808", "0x10000000000000000"}) {
+    EXPECT_EQ(parseInteger64(bad), std::nullopt) << bad;
+  }
+}
+
+TEST(PlainText, ANumberIsTheWholeText) {
+  EXPECT_EQ(parseNumber<double>("1.5"), 1.5);
+  EXPECT_EQ(parseNumber<std::uint8_t>("255"), 255);
+  EXPECT_EQ(parseNumber<std::uint8_t>("256"), std::nullopt);
+  for (const char* bad : {"", "1.5 ", " 1.5", "1,5", "x"}) EXPECT_EQ(parseNumber<double>(bad), std::nullopt) << bad;
+}
+
+TEST(PlainText, AHexadecimalTextReadsBack) {
+  EXPECT_EQ(hexText(0x7F0013), "0x7F0013");
+  EXPECT_EQ(hexText(0), "0x0");
+  EXPECT_EQ(hexText(-1), "0xFFFFFFFFFFFFFFFF");
+  for (const std::int64_t number : {std::int64_t{0}, std::int64_t{-1}, std::int64_t{0x3C4E04},
+                                    std::numeric_limits<std::int64_t>::min(), std::numeric_limits<std::int64_t>::max()})
+    EXPECT_EQ(parseInteger64(hexText(number)), number);
+}
+
+TEST(PlainText, WhatWouldEndALineOrSteerATerminalIsAQuestionMarkAndNothingElseIs) {
+  EXPECT_EQ(onOneLine("a\nb\r\t\x1b[31m\x7f"), "a?b???[31m?");
+  EXPECT_EQ(onOneLine(std::string_view("\0x", 2)), "?x");
+  EXPECT_EQ(onOneLine("\xC2\x85|\xC2\x9B|\xC2\x80"), "?|?|?");
+  EXPECT_EQ(onOneLine("Gr\u00fc\u00dfe\u00a0\u2026\xC2"), "Gr\u00fc\u00dfe\u00a0\u2026\xC2");
+  EXPECT_EQ(onOneLine(""), "");
 }
 
 }  // namespace

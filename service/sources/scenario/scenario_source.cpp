@@ -3,7 +3,6 @@
 
 #include <algorithm>
 #include <array>
-#include <charconv>
 #include <memory>
 #include <string>
 #include <utility>
@@ -12,6 +11,7 @@
 #include "service/sources/scenario/phone_story.h"
 #include "service/sources/scenario/report_schedule.h"
 #include "service/sources/scenario/reports.h"
+#include "values/plain_text.h"
 
 namespace probeview {
 namespace scenario {
@@ -166,13 +166,6 @@ std::string names() {
   return text;
 }
 
-// The whole text as a number; false if it is anything else.
-template <typename Number>
-bool readNumber(std::string_view text, Number& number) {
-  const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
-  return error == std::errc() && end == text.data() + text.size();
-}
-
 struct Options {
   std::string_view name = "city";
   std::optional<std::uint64_t> seed;
@@ -186,20 +179,16 @@ std::string readOption(std::string_view option, Options& options) {
   const std::string_view value = equals == std::string_view::npos ? "" : option.substr(equals + 1);
   const std::string what = "scenario: \"" + std::string(option) + "\": ";
   if (key == "seed" && equals != std::string_view::npos) {
-    std::uint64_t seed = 0;
     if (options.seed) return what + "the seed is given twice; give it once";
-    if (!readNumber(value, seed)) return what + "the seed must be a whole number from 0 to 18446744073709551615";
-    options.seed = seed;
-    return "";
+    options.seed = parseNumber<std::uint64_t>(value);
+    return options.seed ? "" : what + "the seed must be a whole number from 0 to 18446744073709551615";
   }
   if (key == "speed" && equals != std::string_view::npos) {
-    double speed = 0;
     if (options.speed) return what + "the speed is given twice; give it once";
-    if (!readNumber(value, speed) || !(speed >= 1 && speed <= 1000)) {
-      return what + "the speed must be a number from 1 to 1000";
-    }
-    options.speed = speed;
-    return "";
+    options.speed = parseNumber<double>(value);
+    return options.speed && *options.speed >= 1 && *options.speed <= 1000
+               ? ""
+               : what + "the speed must be a number from 1 to 1000";
   }
   return what + "no such option; say scenario[:NAME][,seed=N][,speed=N]";
 }
