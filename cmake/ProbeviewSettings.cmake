@@ -12,8 +12,9 @@ if(PROBEVIEW_CCACHE AND NOT CMAKE_CXX_COMPILER_LAUNCHER)
 endif()
 
 # Linking some sixty test programs is a good part of a build; mold does it several times as fast as the default linker.
+# A compiler for another processor looks for a linker of its own and finds no mold.
 find_program(PROBEVIEW_MOLD mold)
-if(PROBEVIEW_MOLD)
+if(PROBEVIEW_MOLD AND NOT CMAKE_CROSSCOMPILING)
   add_link_options(-fuse-ld=mold)
 endif()
 
