@@ -22,7 +22,7 @@ struct Shape {
 // or three, identities four.
 class Filler {
  public:
-  explicit Filler(Shape shape) : shape_(shape), random_(7) {}
+  explicit Filler(Shape shape, std::uint64_t seed = 7) : shape_(shape), random_(seed) {}
 
   std::vector<std::uint8_t> fill(const MessageDescriptor& descriptor) {
     PBDataWriter writer;
@@ -118,6 +118,10 @@ PayloadSet mixed(std::string name, std::string title, Shape shape) {
 }
 
 }  // namespace
+
+std::vector<std::uint8_t> payloadOf(std::string_view message, std::uint64_t seed) {
+  return Filler({2, 8, false}, seed).fill(*messageClass(message));
+}
 
 const std::vector<PayloadSet>& payloadSets() {
   static const std::vector<PayloadSet> sets = {

@@ -21,6 +21,9 @@ struct PayloadSet {
   std::vector<Payload> payloads;
 };
 
+// A payload of the class, every field present, lists of two; another seed means other values.
+std::vector<std::uint8_t> payloadOf(std::string_view message, std::uint64_t seed);
+
 const std::vector<PayloadSet>& payloadSets();
 const PayloadSet& payloadSet(std::string_view name);
 

@@ -55,7 +55,9 @@ stage() {
   if [ -n "$1" ]; then echo "== $1"; fi
 }
 
-# configure_and_build PRESET [CMake arguments]: quiet when all is well, the errors otherwise.
+# configure_and_build PRESET [CMake arguments]: quiet when all is well, the errors otherwise. Builds everything, or what
+# build_targets names.
+build_targets=${build_targets:-all}
 configure_and_build() {
   local preset=$1 log="$top/build/$1.log"
   shift
@@ -67,7 +69,8 @@ configure_and_build() {
     echo "error: configuring failed; the whole story is in ${log#"$top"/}" >&2
     return 1
   fi
-  if ! cmake --build "$top/build/$preset" >>"$log" 2>&1 </dev/null; then
+  # shellcheck disable=SC2086
+  if ! cmake --build "$top/build/$preset" --target $build_targets >>"$log" 2>&1 </dev/null; then
     grep -E 'error|undefined reference|FAILED' "$log" | head -n 30 >&2
     echo "error: the build failed; the whole story is in ${log#"$top"/}" >&2
     return 1

@@ -1,8 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "bench/road/events.h"
 
-#include <string_view>
-
 #include "bench/payloads.h"
 #include "messages/metric_identifiers.h"
 
@@ -18,10 +16,11 @@ std::vector<MetricSample> mixedStream() {
   return stream;
 }
 
-std::vector<MetricSample> streamOf(const char* message) {
+std::vector<MetricSample> streamOf(std::string_view message) {
   std::vector<MetricSample> stream;
-  for (const MetricSample& sample : mixedStream()) {
-    if (metricWithId(sample.metricId)->message->name == std::string_view(message)) stream.push_back(sample);
+  for (const MetricIdentifier& metric : metricIdentifiers()) {
+    if (!metric.isHandled || metric.message->name != message) continue;
+    for (std::uint64_t seed = 1; seed <= 100; ++seed) stream.push_back({metric.id, payloadOf(message, seed)});
   }
   return stream;
 }

@@ -2,6 +2,7 @@
 #pragma once
 
 #include <cstdint>
+#include <string_view>
 #include <vector>
 
 namespace probeview::bench {
@@ -14,7 +15,7 @@ struct MetricSample {
 
 // The mixed stream: one of each of the 29 kinds that the viewer takes.
 std::vector<MetricSample> mixedStream();
-// Of one class alone; empty when there is no such class in the mixed stream.
-std::vector<MetricSample> streamOf(const char* message);
+// One kind alone, a hundred times with other values; empty when the viewer takes no such class.
+std::vector<MetricSample> streamOf(std::string_view message);
 
 }  // namespace probeview::bench

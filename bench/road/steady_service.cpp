@@ -7,6 +7,7 @@
 #include <algorithm>
 #include <chrono>
 #include <memory>
+#include <set>
 #include <utility>
 
 #include "platform/console_log.h"
@@ -31,10 +32,9 @@ class SteadySource final : public MetricSource {
 
   std::string_view origin() const override { return "bench"; }
   std::vector<std::int64_t> metrics() const override {
-    std::vector<std::int64_t> metrics;
-    for (const MetricSample& sample : settings_.stream) metrics.push_back(sample.metricId);
-    std::sort(metrics.begin(), metrics.end());
-    return metrics;
+    std::set<std::int64_t> metrics;
+    for (const MetricSample& sample : settings_.stream) metrics.insert(sample.metricId);
+    return {metrics.begin(), metrics.end()};
   }
   void start(const SourceContext& context, MetricSink& sink) override {
     context_.emplace(context);
