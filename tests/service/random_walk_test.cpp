@@ -239,15 +239,15 @@ INSTANTIATE_TEST_SUITE_P(, RandomWalk, ::testing::Values(&makeInProcessService, 
                          [](const auto& information) { return information.index == 0 ? "InProcess" : "Socket"; });
 
 TEST_P(RandomWalk, KeepsEveryPromise) {
-  // RANDOM_WALK_SEED says where to begin, RANDOM_WALKS how many; a failure is walked again with its seed and 1.
+  // PROBEVIEW_SEED says where to begin, RANDOM_WALKS how many; a failure is walked again with its seed and 1.
   const auto chosen = [](const char* name, std::uint32_t otherwise) {
     const char* value = std::getenv(name);
     return value != nullptr ? static_cast<std::uint32_t>(std::strtoul(value, nullptr, 10)) : otherwise;
   };
-  const std::uint32_t first = chosen("RANDOM_WALK_SEED", 1);
+  const std::uint32_t first = chosen("PROBEVIEW_SEED", 1);
   const std::uint32_t walks = chosen("RANDOM_WALKS", GetParam() == &makeInProcessService ? 200 : 12);
   for (std::uint32_t seed = first; seed < first + walks; ++seed) {
-    SCOPED_TRACE("seed " + std::to_string(seed));
+    SCOPED_TRACE("PROBEVIEW_SEED=" + std::to_string(seed));
     asked_.clear();
     start(seed);
     for (int count = 0; count < 150 && !HasFailure(); ++count) step();

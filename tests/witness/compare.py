@@ -4,8 +4,8 @@
 
     compare.py PROBECTL decode|sweep|store [--seed N|random] [--count N] [--seconds S] [--zone NAME] [--wildness W]
 
-Ends with status 0 when all answers agree. On a difference it prints the seed and the smallest case that it could find,
-and ends with status 1.
+Without --seed, PROBEVIEW_SEED in the environment counts, without both the seed is 1. Ends with status 0 when all answers
+agree. On a difference it prints the seed and the smallest case that it could find, and ends with status 1.
 """
 
 import argparse
@@ -398,7 +398,7 @@ def main():
     parser = argparse.ArgumentParser(description=__doc__, formatter_class=argparse.RawDescriptionHelpFormatter)
     parser.add_argument("probectl")
     parser.add_argument("subcommand", choices=["decode", "sweep", "store"])
-    parser.add_argument("--seed", default="1", help="a number, or 'random'")
+    parser.add_argument("--seed", default=os.environ.get("PROBEVIEW_SEED", "1"), help="a number, or 'random'")
     parser.add_argument("--count", type=int, default=0, help="how many answers at least; 0: no bound")
     parser.add_argument("--seconds", type=float, default=0, help="for how long; 0: no bound")
     parser.add_argument("--zone", default="UTC", help="the time zone, as TZ names it")
