@@ -45,6 +45,10 @@ void ReportSchedule::renew() {
   }
 }
 
+bool ReportSchedule::wantsAnything() const {
+  return std::ranges::any_of(entries_, [](const Entry& entry) { return entry.wanted; });
+}
+
 std::optional<Milliseconds> ReportSchedule::shortestPeriod() const {
   std::optional<Milliseconds> shortest;
   for (const Entry& entry : entries_) {

@@ -22,6 +22,8 @@ class ReportSchedule {
   void setPlan(const std::optional<MetricPlan>& plan);
   // Somebody new listens: all that is known is news again.
   void renew();
+  // Whether anything of it is wanted at all.
+  bool wantsAnything() const;
   // The shortest period that anybody wants, in ms of real time; none if everything is wanted on change only.
   std::optional<Milliseconds> shortestPeriod() const;
 

@@ -22,8 +22,12 @@ using std::chrono::nanoseconds;
 
 // How long the source sleeps at most and at least; in between, as long as the shortest period that anybody wants.
 constexpr Milliseconds kLongestSleep = 100, kShortestSleep = kStep;
-// A machine that was stopped for longer than this does not drive all the way that it has missed.
+// A machine that was stopped for longer than this does not drive all the way that it has missed, nor does a source that
+// rested for as much of simulated time.
 constexpr milliseconds kMostToCatchUp{5000};
+// The time of day is followed when it jumps by more than this, as when a phone learns what time it is; a clock that is
+// only drawn along slowly comes to no more in hours.
+constexpr milliseconds kLargestDrift{1000};
 
 class ScenarioSource final : public MetricSource {
  public:
@@ -53,18 +57,20 @@ class ScenarioSource final : public MetricSource {
   void stop() override { timer_.reset(); }
 
   void setPlan(const std::optional<MetricPlan>& plan) override {
+    // First as far as it is by now: whoever changes his mind again and again must not keep the others waiting.
+    if (listening_) driveOn();
     schedule_.setPlan(plan);
-    if (timer_) sleep();
+    sleep();
   }
 
   void setListening(bool listening) override {
-    if (!listening) {
-      timer_.reset();
-    } else if (!timer_) {
+    if (listening == listening_) return;
+    listening_ = listening;
+    if (listening_) {
       anchor();
       schedule_.renew();
-      sleep();
     }
+    sleep();
   }
 
   bool query(std::int64_t metricId) override {
@@ -72,32 +78,53 @@ class ScenarioSource final : public MetricSource {
     const auto found =
         std::find_if(all.begin(), all.end(), [&](const Report& report) { return report.metricId == metricId; });
     if (found == all.end()) return false;
+    if (listening_ && !timer_) driveOn();
     // The card can be read as soon as the phone is on.
     if (story_->now() < 0) story_->advance();
     const Facts::Entry& fact = story_->facts()[found->fact];
     if (fact.learnt < 0) return false;
-    if (!timer_) anchor();  // while it rests, now is the time of day
+    if (!listening_) anchor();  // while the drive rests, now is the time of day
     emit(*found, fact.holds && found->nature == Nature::kState ? story_->now() : fact.learnt);
     return true;
   }
 
  private:
-  // From here on, simulated time and the time of day go together.
-  void anchor() {
-    anchorMonotonic_ = clock_->monotonicTime();
-    anchorWall_ = clock_->wallTime();
+  // From here on, or since a moment ago, simulated time and the time of day go together.
+  void anchor(milliseconds ago = milliseconds(0)) {
+    anchorMonotonic_ = clock_->monotonicTime() - ago;
+    anchorWall_ = clock_->wallTime() - ago;
+    wallOffset_ = wallOffset();
     anchorSimulated_ = story_->now();
+    lastTurn_ = anchorMonotonic_;
   }
 
+  // The time of day, counted from where the monotonic clock begins.
+  milliseconds wallOffset() const {
+    return clock_->wallTime() - std::chrono::duration_cast<milliseconds>(clock_->monotonicTime());
+  }
+
+  // Turns from now on as often as is wanted; not at all, without any timer, while nobody listens or nothing is wanted.
   void sleep() {
+    timer_.reset();
+    if (!listening_ || !schedule_.wantsAnything()) return;
     const Milliseconds sleep =
         std::clamp(schedule_.shortestPeriod().value_or(kLongestSleep), kShortestSleep, kLongestSleep);
-    lastTurn_ = clock_->monotonicTime();
     timer_ = scheduler_->every(milliseconds(sleep), [this] { turn(); });
+  }
+
+  // Drives to where it is by now, also after a rest without a timer; the last of a long way is enough for that.
+  void driveOn() {
+    const milliseconds most(static_cast<Milliseconds>(static_cast<double>(kMostToCatchUp.count()) / speed_));
+    if (!timer_ && clock_->monotonicTime() - lastTurn_ > most) anchor(most);
+    turn();
   }
 
   void turn() {
     const nanoseconds now = clock_->monotonicTime();
+    if (const milliseconds jump = wallOffset() - wallOffset_; jump > kLargestDrift || jump < -kLargestDrift) {
+      anchorWall_ += jump;
+      wallOffset_ += jump;
+    }
     if (now - std::exchange(lastTurn_, now) > kMostToCatchUp) {
       anchor();
       return;
@@ -130,9 +157,11 @@ class ScenarioSource final : public MetricSource {
   const Clock* clock_ = nullptr;
   MetricSink* sink_ = nullptr;
   ScheduledTaskHandle timer_;
+  bool listening_ = false;
   nanoseconds anchorMonotonic_{};
   nanoseconds lastTurn_{};
   milliseconds anchorWall_{};
+  milliseconds wallOffset_{};
   Milliseconds anchorSimulated_ = 0;
 };
 

@@ -21,7 +21,9 @@ namespace probeview {
 //
 // The drive begins when somebody first listens, with the phone being switched on: in its first two seconds it looks
 // through GSM, UMTS and LTE, so that each metric is reported once. While nobody listens it rests, without timers, and
-// goes on from there. Records carry the time of day at which listening began plus the simulated time since then.
+// goes on from there; while somebody listens who wants nothing there is no timer either, and a question or a new wish
+// is answered as if the drive had gone on, for a few seconds at least. Records carry the time of day at which listening
+// began plus the simulated time since then; when the clock is set, they follow it.
 SourceResult makeScenarioSource(std::string_view arguments);
 
 }  // namespace probeview

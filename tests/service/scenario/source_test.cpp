@@ -1,4 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
+#include <malloc.h>
+
 #include <chrono>
 #include <map>
 
@@ -105,6 +107,91 @@ TEST(ScenarioSource, RestsWithoutTimersWhileNobodyListens) {
   EXPECT_FALSE(drive.loop.untilNextTimer().has_value());
   drive.forSeconds(100);
   EXPECT_TRUE(drive.records.empty());
+}
+
+TEST(ScenarioSource, RestsWithoutTimersWhileNothingIsWanted) {
+  for (const char* name : {"city", "soak", "edges"}) {
+    Drive drive(name);
+    drive.source->setPlan(MetricPlan{});
+    drive.listen();
+    EXPECT_FALSE(drive.loop.untilNextTimer().has_value());
+    drive.source->setPlan(MetricPlan{{{0x3CFFFF, 100ms}}});
+    EXPECT_FALSE(drive.loop.untilNextTimer().has_value()) << "nothing of ours is wanted";
+    drive.source->setPlan(MetricPlan{{{K_LTE_RRC_STATE, 100ms}}});
+    EXPECT_TRUE(drive.loop.untilNextTimer().has_value());
+    drive.source->setPlan(MetricPlan{});
+    EXPECT_FALSE(drive.loop.untilNextTimer().has_value());
+    drive.source->setPlan(std::nullopt);
+    EXPECT_TRUE(drive.loop.untilNextTimer().has_value());
+    EXPECT_TRUE(drive.records.empty());
+  }
+}
+
+TEST(ScenarioSource, AfterAnHourInWhichNothingWasWantedItAnswersAndGoesOnAtTheTimeThatItIs) {
+  for (const char* arguments : {"city", "city,speed=1000"}) {
+    Drive drive(arguments);
+    drive.source->setPlan(MetricPlan{});
+    drive.listen();
+    drive.forSeconds(3600);
+    ASSERT_TRUE(drive.source->query(K_LTE_SCELL_INFO));
+    ASSERT_EQ(drive.records.size(), 1U);
+    EXPECT_GE(drive.records[0].time, drive.loop.wallTime() - 6s);
+    EXPECT_LE(drive.records[0].time, drive.loop.wallTime() + 6s);
+    drive.forSeconds(3600);
+    drive.records.clear();
+    drive.source->setPlan(std::nullopt);
+    drive.forSeconds(2);
+    EXPECT_EQ(drive.seen(), handledMetrics());
+  }
+}
+
+TEST(ScenarioSource, AClientThatKeepsChangingItsMindDoesNotKeepTheOthersWaiting) {
+  Drive drive("city");
+  drive.listen();
+  for (int change = 0; change < 100; ++change) {
+    drive.source->setPlan(MetricPlan{{{K_SIM_FILE_INFO, 1s}, {K_LTE_TX_POWER, change % 2 == 0 ? 1s : 2s}}});
+    drive.forSeconds(0.09);
+  }
+  EXPECT_GE(drive.count(K_SIM_FILE_INFO), 9U);
+}
+
+TEST(ScenarioSource, WhenTheClockIsSetTheRecordsFollowIt) {
+  Drive drive("city");
+  drive.listen();
+  drive.forSeconds(5);
+  for (const auto now :
+       {ManualLoop::defaultWallTime + 24h * 365, std::chrono::milliseconds(0), ManualLoop::defaultWallTime - 2h}) {
+    drive.loop.setWallTime(now);
+    drive.forSeconds(1);
+    drive.records.clear();
+    drive.forSeconds(3);
+    ASSERT_FALSE(drive.records.empty());
+    for (const MetricRecord& record : drive.records) {
+      EXPECT_GE(record.time, now);
+      EXPECT_LE(record.time, drive.loop.wallTime());
+    }
+  }
+}
+
+// SIM files are known from the first moment on, so that exactly one record a second must come.
+TEST(ScenarioSource, SixHoursOfReportsDoNotDriftAndLeaveNothingBehind) {
+  Drive drive("city");
+  drive.source->setPlan(MetricPlan{{{K_SIM_FILE_INFO, 1s}, {K_LTE_RRC_STATE, std::nullopt}}});
+  drive.listen();
+  std::size_t sent = 0;
+  std::size_t early = 0;
+  for (int hour = 0; hour < 6; ++hour) {
+    drive.forSeconds(3600);
+    sent += drive.count(K_SIM_FILE_INFO);
+    for (const MetricRecord& record : drive.records) {
+      ASSERT_LE(record.time, drive.loop.wallTime());
+      ASSERT_GE(record.time, drive.loop.wallTime() - 1h - 1s);
+    }
+    drive.records = {};
+    if (hour == 1) early = ::mallinfo2().uordblks;
+  }
+  EXPECT_NEAR(static_cast<double>(sent), 6 * 3600, 1);
+  EXPECT_LE(::mallinfo2().uordblks, early + 64 * 1024);
 }
 
 TEST(ScenarioSource, GoesOnWhereItRestedAtTheTimeThatItIs) {
