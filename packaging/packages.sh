@@ -1,4 +1,6 @@
 # SPDX-License-Identifier: Apache-2.0
+# The lists are used, and $top is set, by the scripts that source this.
+# shellcheck shell=bash disable=SC2034,SC2154
 # The Debian 12 packages that each purpose needs, and the one way to install what is missing. Sourced by run and test.
 
 packages_build="g++ cmake ninja-build pkg-config ccache mold libcli11-dev libtomlplusplus-dev libncurses-dev \
