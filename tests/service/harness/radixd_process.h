@@ -4,6 +4,7 @@
 #include <fcntl.h>
 #include <poll.h>
 #include <signal.h>
+#include <sys/prctl.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -36,6 +37,8 @@ class RadixdProcess {
     process_ = ::fork();
     if (process_ < 0) throw std::runtime_error("cannot fork");
     if (process_ == 0) {
+      // Also when the test itself is killed.
+      ::prctl(PR_SET_PDEATHSIG, SIGKILL);
       ::dup2(childEnd.number(), STDERR_FILENO);
       if (prepare) prepare();
       ::execv(words[0], words.data());

@@ -3,6 +3,8 @@
 // A desktop portal of the test's own, on a D-Bus of its own.
 #include "ui/qt/appearance.h"
 
+#include <sys/prctl.h>
+
 #include <QColor>
 #include <QDBusConnection>
 #include <QFile>
@@ -12,6 +14,7 @@
 #include <QSignalSpy>
 #include <QStandardPaths>
 #include <QTemporaryDir>
+#include <csignal>
 #include <map>
 
 #include "tests/ui/qt/window_testing.h"
@@ -75,6 +78,8 @@ class SystemAppearance : public testing_ui::WindowTest {
                         "</listen><policy context=\"default\"><allow send_destination=\"*\"/>"
                         "<allow receive_sender=\"*\"/><allow own=\"*\"/></policy></busconfig>");
     configuration.close();
+    // Also when the test itself is killed.
+    daemon.setChildProcessModifier([] { ::prctl(PR_SET_PDEATHSIG, SIGKILL); });
     daemon.start(program, {QStringLiteral("--config-file=") + configuration.fileName(), QStringLiteral("--nofork"),
                            QStringLiteral("--print-address")});
     ASSERT_TRUE(daemon.waitForReadyRead()) << daemon.readAllStandardError().toStdString();
