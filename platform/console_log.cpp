@@ -21,14 +21,16 @@ std::vector<ConsoleLog*>& livingLogs() {
     addFatalErrorFlush([] {
       for (ConsoleLog* log : livingLogs()) log->flush();
     });
-    // A write to a closed pipe must report an error, not end the process.
+    // A write to a closed pipe or beyond what a file may have must report an error, not end the process.
     std::signal(SIGPIPE, SIG_IGN);
+    std::signal(SIGXFSZ, SIG_IGN);
     return new std::vector<ConsoleLog*>;
   }();
   return *logs;
 }
 
-bool writeAll(int fileDescriptor, std::string_view text) {
+// What is left of the text when no more of it can be written; then errno says why.
+std::string_view writeAll(int fileDescriptor, std::string_view text) {
   while (!text.empty()) {
     const ssize_t written = ::write(fileDescriptor, text.data(), text.size());
     if (written >= 0) {
@@ -36,13 +38,16 @@ bool writeAll(int fileDescriptor, std::string_view text) {
     } else if (errno == EAGAIN) {
       // Somebody else made the descriptor non-blocking; a log line is not to be lost for that.
       pollfd ready{fileDescriptor, POLLOUT, 0};
-      if (::poll(&ready, 1, -1) < 0 && errno != EINTR) return false;
+      if (::poll(&ready, 1, -1) < 0 && errno != EINTR) return text;
     } else if (errno != EINTR) {
-      return false;
+      return text;
     }
   }
-  return true;
+  return text;
 }
+
+// No room, now: of the disk, of what the user may have on it, or of what a file may have.
+bool isShortage(int error) { return error == ENOSPC || error == EDQUOT || error == EFBIG; }
 
 LineSink*& chosenSink() {
   static LineSink* sink = nullptr;
@@ -72,7 +77,13 @@ void ConsoleLog::endGroup() {
 
 void ConsoleLog::flush() {
   if (held_.empty()) return;
-  if (!closed_ && !writeAll(fileDescriptor_, held_)) closed_ = true;
+  if (!closed_) {
+    // A line that a full disk has cut is ended first, so that it stays one line.
+    if (torn_) held_.insert(0, 1, '\n');
+    const std::string_view left = writeAll(fileDescriptor_, held_);
+    if (!left.empty() && !isShortage(errno)) closed_ = true;
+    if (left.size() < held_.size()) torn_ = held_[held_.size() - left.size() - 1] != '\n';
+  }
   held_.clear();
 }
 

@@ -10,7 +10,8 @@ namespace probeview {
 
 // Writes lines to a file descriptor: one write for each line, one for all lines of a group. What is held back is
 // written when the log is destroyed and when the program stops through fatalError(). A reader that has gone away (a
-// closed pipe, a full disk) silences the log and disturbs nobody else. Main thread.
+// closed pipe) silences the log and disturbs nobody else. What finds no room on a full disk is lost, and what comes
+// when there is room again is written. Main thread.
 class ConsoleLog final : public LineSink {
  public:
   // The descriptor stays the caller's and must outlive the log.
@@ -32,6 +33,7 @@ class ConsoleLog final : public LineSink {
   int fileDescriptor_;
   int openGroups_ = 0;
   bool closed_ = false;
+  bool torn_ = false;  // the last line that is there has no end
   std::string held_;
 };
 

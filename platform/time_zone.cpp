@@ -9,7 +9,8 @@ namespace probeview {
 
 namespace {
 
-constexpr std::int64_t secondsPerQuarterHour = 900;
+// How long a period is that is looked up at most, and with it how long a change of the setting goes unnoticed.
+constexpr std::int64_t secondsPerMinute = 60;
 // The Gregorian calendar, and with it each rule for summer time, repeats after 400 years.
 constexpr std::int64_t secondsPer400Years = 146'097LL * 86'400;
 // Where the C library's calendar is still sure of itself; years outside are mapped into it. Before the first time zones
@@ -47,13 +48,13 @@ class DeviceTimeZone final : public TimeZone {
     // Notices a changed setting; localtime_r alone looks only once.
     ::tzset();
     LocalTime here = localTimeAt(utcSeconds);
-    // Modern zones change on quarter hours; where an old one does not, the two ends of the quarter differ and only the
+    // Modern zones change on whole minutes; where an old one does not, the two ends of the minute differ and only the
     // second itself is promised.
     constexpr auto latest = std::numeric_limits<std::int64_t>::max();
     constexpr auto earliest = std::numeric_limits<std::int64_t>::min();
-    if (utcSeconds > earliest + secondsPerQuarterHour && utcSeconds < latest - secondsPerQuarterHour) {
-      const std::int64_t from = floorDivide(utcSeconds, secondsPerQuarterHour) * secondsPerQuarterHour;
-      const std::int64_t until = from + secondsPerQuarterHour;
+    if (utcSeconds > earliest + secondsPerMinute && utcSeconds < latest - secondsPerMinute) {
+      const std::int64_t from = floorDivide(utcSeconds, secondsPerMinute) * secondsPerMinute;
+      const std::int64_t until = from + secondsPerMinute;
       if (localTimeAt(from) == here && localTimeAt(until - 1) == here) {
         return {from, until, here.offset, std::move(here.abbreviation)};
       }

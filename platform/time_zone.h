@@ -35,7 +35,7 @@ class FixedTimeZone final : public TimeZone {
 };
 
 // The zone that the machine is set to (TZ, else /etc/localtime). A change of the setting, as by a traveller, is noticed
-// when a new period is asked for; periods are at most a quarter of an hour long. Any thread.
+// when a new period is asked for; periods are at most a minute long. Any thread.
 const TimeZone& deviceTimeZone();
 
 }  // namespace probeview

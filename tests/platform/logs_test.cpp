@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include <fcntl.h>
 #include <gtest/gtest.h>
+#include <sys/resource.h>
 #include <sys/socket.h>
 #include <unistd.h>
 
@@ -104,6 +105,45 @@ TEST(ConsoleLog, SurvivesAClosedPipe) {
     log.line("nor this");
   }
   ::close(ends[1]);
+}
+
+TEST(ConsoleLog, OnAFullDiskLinesAreLostAndThoseThatFindRoomAgainAreWritten) {
+  char name[] = "/tmp/probeview-log-XXXXXX";
+  const int file = ::mkstemp(name);
+  ASSERT_GE(file, 0);
+  rlimit before{};
+  ASSERT_EQ(::getrlimit(RLIMIT_FSIZE, &before), 0);
+  const auto allow = [&](rlim_t bytes) {
+    const rlimit now{bytes, before.rlim_max};
+    return ::setrlimit(RLIMIT_FSIZE, &now);
+  };
+  {
+    ConsoleLog log(file);
+    log.line("first");
+    ASSERT_EQ(allow(10), 0);
+    log.line("second");
+    log.line("lost");
+    EXPECT_FALSE(log.closed());
+    ASSERT_EQ(allow(before.rlim_cur), 0);
+    log.line("third");
+    log.line("fourth");
+  }
+  char text[64] = {};
+  EXPECT_GT(::pread(file, text, sizeof text - 1, 0), 0);
+  EXPECT_STREQ(text, "first\nseco\nthird\nfourth\n");
+  ::close(file);
+  ::unlink(name);
+}
+
+TEST(ConsoleLog, OnADeviceWithoutRoomEveryLineIsLostAndNothingElseHappens) {
+  const int full = ::open("/dev/full", O_WRONLY | O_CLOEXEC);
+  ASSERT_GE(full, 0);
+  {
+    ConsoleLog log(full);
+    for (int count = 0; count < 1000; ++count) log.line("no room");
+    EXPECT_FALSE(log.closed());
+  }
+  ::close(full);
 }
 
 TEST(ConsoleLog, WaitsForASlowReaderInsteadOfLosingLines) {

@@ -133,7 +133,8 @@ TEST(TimestampFormatter, AChangedZoneOfTheDeviceIsNoticed) {
     EXPECT_EQ(formatter.format(0), "1970-01-01 01:00:00 CET");
   }
   const DeviceZone zone("America/New_York");
-  EXPECT_EQ(formatter.format(900'000), "1969-12-31 19:15:00 EST");
+  EXPECT_EQ(formatter.format(59'999), "1970-01-01 01:00:59 CET") << "a minute is looked up once";
+  EXPECT_EQ(formatter.format(60'000), "1969-12-31 19:01:00 EST");
 }
 
 TEST(TimestampFormatter, WhatIsNoPointInTimeStopsTheProgram) {
