@@ -14,6 +14,7 @@
 #include <vector>
 
 #include "messages/metric_identifiers.h"
+#include "platform/system_log.h"
 #include "radix/client.h"
 #include "radix/service_commands.h"
 #include "radix/status.h"
@@ -27,6 +28,11 @@ using Factory = std::unique_ptr<TestService> (*)(Service::Settings);
 using radix::client::ManagerHandle;
 
 constexpr std::int64_t metricsUsed[] = {K_LTE_RRC_STATE, K_LTE_TX_POWER, K_LTE_CDRX_CONFIG, K_GSM_SCELL_INFO};
+
+class Silence final : public LineSink {
+ public:
+  void line(std::string_view) override {}
+};
 
 // A record bears its number as its time, so that each can be told from all others.
 class RandomWalk : public ::testing::TestWithParam<Factory> {
@@ -42,8 +48,17 @@ class RandomWalk : public ::testing::TestWithParam<Factory> {
     std::uint64_t lostBefore = 0;
   };
 
+  // A client that reads when it likes, and is owed every record since it came.
+  struct SlowClient {
+    std::unique_ptr<RawClient> raw;
+    std::set<std::int64_t> owed;   // the last records that there were, by their numbers
+    std::int64_t firstNumber = 0;  // and all from here on
+    bool reading = true;
+  };
+
   void start(std::uint32_t seed) {
     clients_.clear();
+    slowClients_.clear();
     world_.reset();
     random_.seed(seed);
     number_ = 0;
@@ -58,6 +73,7 @@ class RandomWalk : public ::testing::TestWithParam<Factory> {
     emitted_.clear();
     world_->kill();
     world_->restart();
+    startedAt_ = number_ + 1;
   }
 
   std::size_t pick(std::size_t below) { return random_() % below; }
@@ -79,7 +95,7 @@ class RandomWalk : public ::testing::TestWithParam<Factory> {
     return radix::client::PerformCommand(client.manager, command, arguments, reply).status;
   }
 
-  void push(Client& client) {
+  void push(Client& client, bool serviceIsThere = true) {
     std::string text = "[metrics]\n";
     std::set<std::int64_t> chosen;
     for (const std::int64_t metric : metricsUsed) {
@@ -92,7 +108,13 @@ class RandomWalk : public ::testing::TestWithParam<Factory> {
     const std::int32_t status = perform(
         client, radix::kCommandAddConfiguration,
         {{radix::kKeyPayload, Value::bytes({reinterpret_cast<const std::uint8_t*>(text.data()), text.size()})}});
-    EXPECT_EQ(status == 0, !broken);
+    EXPECT_EQ(status == 0, !broken && serviceIsThere);
+    if (!serviceIsThere) {
+      // It is pushed again when the service comes; what is refused then, is wanted no more.
+      client.configured.reset();
+      if (!broken) client.configured = std::move(chosen);
+      return;
+    }
     if (status == 0) {
       client.configured = std::move(chosen);
       asked_.erase(&client);
@@ -140,7 +162,57 @@ class RandomWalk : public ::testing::TestWithParam<Factory> {
     }
   }
 
+  void connectSlow() {
+    SlowClient client;
+    client.raw = std::make_unique<RawClient>(world_->rawLink());
+    client.raw->say(radix::Hello{.name = "slow"});
+    client.raw->say(radix::Delivery{true});
+    client.raw->say(radix::Ping{.number = 1});
+    EXPECT_TRUE(world_->until([&] { return !client.raw->pings.empty(); }));
+    std::map<std::int64_t, std::int64_t> last;
+    for (const auto& [number, metric] : emitted_) {
+      if (number >= startedAt_) last[metric] = number;
+    }
+    for (const auto& [metric, number] : last) client.owed.insert(number);
+    client.firstNumber = number_ + 1;
+    slowClients_.push_back(std::move(client));
+  }
+
+  void checkSlow(SlowClient& client) {
+    client.reading = true;
+    client.raw->setReading(true);
+    std::set<std::int64_t> owed = client.owed;
+    for (const auto& [number, metric] : emitted_) {
+      if (number >= client.firstNumber) owed.insert(number);
+    }
+    const RawClient& raw = *client.raw;
+    EXPECT_TRUE(world_->until([&] { return raw.events.size() + raw.dropped >= owed.size(); }));
+    EXPECT_EQ(raw.events.size() + raw.dropped, owed.size());
+    std::int64_t last = 0;
+    for (const radix::Event& event : raw.events) {
+      EXPECT_GT(event.time, last) << "out of order or twice";
+      last = event.time;
+      EXPECT_TRUE(owed.contains(last)) << "nobody emitted this for it";
+    }
+    EXPECT_FALSE(raw.closed);
+  }
+
+  void stepSlow(std::size_t what) {
+    if (slowClients_.empty() || (what == 0 && slowClients_.size() < 3)) return connectSlow();
+    const std::size_t index = pick(slowClients_.size());
+    SlowClient& client = slowClients_[index];
+    if (what == 1) {
+      slowClients_.erase(slowClients_.begin() + static_cast<std::ptrdiff_t>(index));
+    } else if (what == 2) {
+      checkSlow(client);
+    } else {
+      client.reading = !client.reading;
+      client.raw->setReading(client.reading);
+    }
+  }
+
   void step() {
+    if (pick(5) == 0) return stepSlow(pick(6));
     const std::size_t what = pick(20);
     if (clients_.empty() || (what == 0 && clients_.size() < 5)) return connect();
     const std::size_t index = pick(clients_.size());
@@ -213,11 +285,41 @@ class RandomWalk : public ::testing::TestWithParam<Factory> {
     if (pick(2) == 0) world_->settle();
   }
 
+  // What a client may do while there is no service: all of it holds when the next one comes.
+  void stepAway(Client& client) {
+    switch (pick(6)) {
+      case 0:
+        return push(client, false);
+      case 1:
+        EXPECT_NE(perform(client, radix::kCommandClearConfiguration), 0);
+        client.configured.reset();
+        break;
+      case 2:
+        EXPECT_NE(perform(client, radix::kCommandQueryMetric, {{radix::kKeyMetricID, metricsUsed[0]}}), 0);
+        break;
+      case 3:
+        radix::client::EventsOff(client.manager);
+        client.on = false;
+        break;
+      case 4:
+        radix::client::EventsOn(client.manager);
+        client.on = true;
+        break;
+      default:
+        break;
+    }
+  }
+
   void killAndRestart() {
+    // Also in the middle of much that is on its way.
+    if (pick(2) == 0) emit(pick(300));
     world_->kill();
+    slowClients_.clear();
     for (const auto& client : clients_) {
       EXPECT_TRUE(world_->until([&] { return !radix::client::Connection(client->manager).connected; }));
     }
+    for (const auto& client : clients_) stepAway(*client);
+    startedAt_ = number_ + 1;
     world_->restart();
     for (const auto& client : clients_) {
       EXPECT_TRUE(world_->until([&] { return radix::client::Connection(client->manager).connected; }));
@@ -229,9 +331,11 @@ class RandomWalk : public ::testing::TestWithParam<Factory> {
 
   std::unique_ptr<TestService> world_;
   std::vector<std::unique_ptr<Client>> clients_;
+  std::vector<SlowClient> slowClients_;
   std::map<const Client*, std::set<std::int64_t>> asked_;
   std::vector<std::pair<std::int64_t, std::int64_t>> emitted_;
   std::int64_t number_ = 0;
+  std::int64_t startedAt_ = 1;  // the first number of the service that runs now
   std::mt19937 random_;
 };
 
@@ -239,6 +343,9 @@ INSTANTIATE_TEST_SUITE_P(, RandomWalk, ::testing::Values(&makeInProcessService, 
                          [](const auto& information) { return information.index == 0 ? "InProcess" : "Socket"; });
 
 TEST_P(RandomWalk, KeepsEveryPromise) {
+  // Refused configurations are told there.
+  static auto& silence = *new Silence;
+  setSystemLog(silence);
   // PROBEVIEW_SEED says where to begin, RANDOM_WALKS how many; a failure is walked again with its seed and 1.
   const auto chosen = [](const char* name, std::uint32_t otherwise) {
     const char* value = std::getenv(name);
@@ -252,9 +359,11 @@ TEST_P(RandomWalk, KeepsEveryPromise) {
     start(seed);
     for (int count = 0; count < 150 && !HasFailure(); ++count) step();
     for (const auto& client : clients_) check(*client);
+    for (SlowClient& client : slowClients_) checkSlow(client);
     if (HasFailure()) break;
   }
   clients_.clear();
+  slowClients_.clear();
   world_.reset();
 }
 
