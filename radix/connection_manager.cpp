@@ -6,6 +6,7 @@
 #include <utility>
 
 #include "platform/guarded.h"
+#include "platform/system_log.h"
 #include "radix/object.h"
 #include "radix/service_commands.h"
 
@@ -127,7 +128,8 @@ class ConnectionManager final : public Manager {
                                       [road = road_, holder](std::vector<Event> events) {
                                         if (const auto here = holder->lock()) road->deliver(std::move(events), here);
                                       },
-                                  .state = [state = state_](const ConnectionState& now) { state->set(now); }});
+                                  .state = [state = state_](const ConnectionState& now) { state->set(now); },
+                                  .notice = [](const std::string& text) { probeview::systemLog().line(text); }});
     *holder = connection_;
     worker_.post([connection = connection_] { connection->start(); });
   }

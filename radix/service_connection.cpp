@@ -4,6 +4,8 @@
 #include <algorithm>
 #include <utility>
 
+#include "values/plain_text.h"
+
 namespace radix::client {
 
 namespace {
@@ -13,6 +15,13 @@ std::string versionTrouble(const ServiceConnection::Identity& own, const Hello& 
   return "the baseband service speaks version " + std::to_string(service.version) + " of the protocol and needs " +
          std::to_string(service.oldestVersion) + ", this client speaks " + std::to_string(own.version) + " and needs " +
          std::to_string(own.oldestVersion) + ": update " + (clientIsTooOld ? "the client" : "the service");
+}
+
+// In the form in which the results of commands stand in the log.
+std::string refusedRestoring(const Reply& reply) {
+  constexpr std::size_t longest = 1000;
+  return "the baseband service refuses the configuration that is pushed again: error=" + std::to_string(reply.status) +
+         " msg=" + probeview::onOneLine(probeview::beginningOf(reply.message, longest));
 }
 
 }  // namespace
@@ -206,6 +215,7 @@ void ServiceConnection::onBatchEnd() {
   if (batch_.empty()) return;
   std::vector<Event> batch;
   batch.swap(batch_);
+  batchBytes_ = 0;
   events_.events(std::move(batch));
 }
 
@@ -255,7 +265,10 @@ void ServiceConnection::onReply(Reply reply) {
     // Nobody waits for it any more, or it answers what was restored: a configuration that is refused is not kept.
     if (unjudgedConfiguration_ != 0 && reply.sequence == unjudgedConfiguration_) {
       unjudgedConfiguration_ = 0;
-      if (static_cast<Status>(reply.status) != Status::Ok) configuration_.reset();
+      if (static_cast<Status>(reply.status) != Status::Ok) {
+        configuration_.reset();
+        if (events_.notice) events_.notice(refusedRestoring(reply));
+      }
     }
     return;
   }
@@ -266,7 +279,12 @@ void ServiceConnection::onReply(Reply reply) {
   updateReading();
 }
 
-void ServiceConnection::onEvent(Event event) { batch_.push_back(std::move(event)); }
+void ServiceConnection::onEvent(Event event) {
+  batchBytes_ += event.payload.size();
+  batch_.push_back(std::move(event));
+  // So that whoever counts what waits may stop the reading before too much is there.
+  if (batchBytes_ >= largestBatch) onBatchEnd();
+}
 
 void ServiceConnection::onDropped(Dropped dropped) {
   state_.lostEvents += dropped.count;
@@ -274,7 +292,12 @@ void ServiceConnection::onDropped(Dropped dropped) {
 }
 
 void ServiceConnection::onPing(Ping ping) {
-  if (!ping.isAnswer) send(encode(Ping{ping.number, true}));
+  if (ping.isAnswer) return;
+  if (outgoing_.size() >= mostAnswersUnread) {
+    lose(Status::MalformedFrame, "the baseband service asks without reading the answers");
+    return;
+  }
+  send(encode(Ping{ping.number, true}));
 }
 
 }  // namespace radix::client

@@ -25,6 +25,10 @@ inline constexpr std::chrono::nanoseconds firstReconnectDelay = std::chrono::mil
 inline constexpr std::chrono::nanoseconds longestReconnectDelay = std::chrono::seconds(1);
 // How soon a service that takes no more connections at this moment is tried again while a command waits.
 inline constexpr std::chrono::nanoseconds busyRetryDelay = std::chrono::milliseconds(10);
+// Answers that the service leaves unread before this side leaves it.
+inline constexpr std::size_t mostAnswersUnread = 64;
+// Payload bytes that are handed on together at most; a batch may have one event more.
+inline constexpr std::size_t largestBatch = 1024 * 1024;
 // Commands that wait for their replies at once; more than any caller has threads.
 inline constexpr std::size_t mostCommandsAtOnce = 256;
 
@@ -48,6 +52,8 @@ class ServiceConnection final : public std::enable_shared_from_this<ServiceConne
     std::function<void(std::vector<Event>)> events;
     // Something of it has changed.
     std::function<void(const ConnectionState&)> state;
+    // Something that concerns no command that waits, in one line for the log.
+    std::function<void(const std::string&)> notice{};
   };
 
   struct Identity {
@@ -129,6 +135,7 @@ class ServiceConnection final : public std::enable_shared_from_this<ServiceConne
   bool delivery_ = false;
 
   std::vector<Event> batch_;
+  std::size_t batchBytes_ = 0;
   bool eventsWelcome_ = true;
   ConnectionState state_;
 };

@@ -42,6 +42,8 @@ constexpr std::string_view onChange = "on change";
 // Dots nest one table in another, and the library takes tables apart by recursion; no file that is meant has so many.
 constexpr std::ptrdiff_t mostDots = 4000;
 constexpr std::size_t mostNotes = 100;
+// A reason may quote a key of the file, which may be as long as the file.
+constexpr std::size_t longestReason = 500;
 
 // A text of the file as it may stand in a message: on one line, and not endless.
 std::string shown(std::string_view text) {
@@ -206,9 +208,11 @@ class Parser {
   void refuse(const toml::source_region& where, const std::string& what) {
     refused_ = refusal(where.begin.line, where.begin.column, what);
   }
-  static ConfigurationResult refusal(std::uint32_t line, std::uint32_t column, const std::string& what) {
-    return {std::nullopt, "line " + std::to_string(line) + ", column " + std::to_string(column) + ": " + what, line,
-            column};
+  static ConfigurationResult refusal(std::uint32_t line, std::uint32_t column, std::string_view what) {
+    std::string error = "line " + std::to_string(line) + ", column " + std::to_string(column) + ": ";
+    error += beginningOf(what, longestReason);
+    if (what.size() > longestReason) error += "…";
+    return {std::nullopt, std::move(error), line, column};
   }
   void note(const toml::source_region& where, const std::string& what) {
     if (configuration_.notes.size() == mostNotes) {

@@ -46,7 +46,8 @@ struct PushedConfiguration {
 std::vector<std::string> notesToTell(const std::vector<std::string>& notes) {
   std::vector<std::string> told(notes.begin(),
                                 notes.begin() + static_cast<std::ptrdiff_t>(std::min(notes.size(), mostNotesTold)));
-  if (notes.size() > mostNotesTold) told.push_back(std::to_string(notes.size() - mostNotesTold) + " notes more");
+  if (notes.size() > mostNotesTold)
+    told.push_back("and " + std::to_string(notes.size() - mostNotesTold) + " more like these");
   return told;
 }
 
@@ -134,15 +135,17 @@ std::optional<std::string> Service::refusal(const Session&) {
 Reply Service::perform(Session& session, const radix::Command& command) {
   const auto arguments =
       command.arguments.empty() ? std::optional<Dictionary>(std::in_place) : radix::decodeDictionary(command.arguments);
-  if (!arguments) return answer(Status::BadArguments, "the arguments of " + command.name + " cannot be read");
   const std::string_view name = command.name;
+  // As a peer may have named it, it may be of any length.
+  const std::string shownName(beginningOf(name, 64));
+  if (!arguments) return answer(Status::BadArguments, "the arguments of " + shownName + " cannot be read");
   if (name == radix::kCommandAddConfiguration) return addConfiguration(session, *arguments);
   if (name == radix::kCommandClearConfiguration) return clearConfiguration(session);
   if (name == radix::kCommandQueryMetric) return queryMetric(session, *arguments);
   if (name == radix::kCommandShowStatus) return showStatus();
   if (name == radix::kCommandSetBaseConfiguration) return setBaseConfiguration(*arguments);
   if (name == radix::kCommandClearBaseConfiguration) return clearBaseConfiguration();
-  return answer(Status::UnknownCommand, "the command '" + command.name.substr(0, 64) + "' is not known");
+  return answer(Status::UnknownCommand, "the command '" + shownName + "' is not known");
 }
 
 Reply Service::addConfiguration(Session& session, const Dictionary& arguments) {

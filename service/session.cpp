@@ -5,6 +5,8 @@
 #include <array>
 #include <utility>
 
+#include "values/plain_text.h"
+
 namespace probeview {
 
 namespace {
@@ -119,7 +121,7 @@ void Session::onClosed() {
 
 void Session::onHello(radix::Hello hello) {
   if (phase_ != Phase::Greeting) return;
-  clientName_ = hello.name.substr(0, longestClientName);
+  clientName_ = beginningOf(hello.name, longestClientName);
   std::optional<std::string> reason;
   Status status = Status::VersionMismatch;
   if (hello.oldestVersion > settings_.version || hello.version < settings_.oldestVersion) {
@@ -151,8 +153,8 @@ void Session::onCommand(radix::Command command) {
   radix::Reply reply = host_.perform(*this, command);
   reply.sequence = command.sequence;
   if (log_.takes(LogLevel::Debug)) {
-    log_.write(LogLevel::Debug, description() + ": " + command.name + " answered with " + std::to_string(reply.status) +
-                                    (reply.message.empty() ? "" : ", " + reply.message));
+    log_.write(LogLevel::Debug, description() + ": " + std::string(beginningOf(command.name, 64)) + " answered with " +
+                                    std::to_string(reply.status) + (reply.message.empty() ? "" : ", " + reply.message));
   }
   say(radix::encode(reply));
 }

@@ -211,7 +211,11 @@ void SocketListener::acceptAll() {
       if (errno == EINTR || errno == ECONNABORTED) continue;
       if (errno == EAGAIN || errno == EWOULDBLOCK) return;
       // Those who wait stay in the queue until there are descriptors again.
-      log_.write(LogLevel::Error, "cannot accept a connection: " + systemError() + "; trying again soon");
+      const std::string trouble = systemError();
+      if (isWorthTelling(++shortages_)) {
+        log_.write(LogLevel::Error, "cannot accept a connection: " + trouble + "; trying again soon (" +
+                                        std::to_string(shortages_) + " times so far)");
+      }
       watch_->setInterest({});
       retry_ = loop_.after(descriptorShortage, [this] { watch_->setInterest({.readable = true}); });
       return;

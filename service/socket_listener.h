@@ -96,6 +96,7 @@ class SocketListener {
   Taker taker_;
   std::unique_ptr<DescriptorWatch> watch_;
   ScheduledTaskHandle retry_;
+  std::uint64_t shortages_ = 0;
 };
 
 }  // namespace probeview

@@ -7,6 +7,7 @@
 
 #include "radix/link.h"
 #include "service/payload_check.h"
+#include "values/plain_text.h"
 
 namespace probeview {
 
@@ -58,7 +59,7 @@ SourceSlot::SourceSlot(std::unique_ptr<MetricSource> source, Worker& worker, Ser
       started_(worker.clock().monotonicTime()),
       alive_(std::make_shared<bool>(true)) {
   guarded("naming itself", [this] {
-    origin_ = std::string(source_->origin()).substr(0, longestOrigin);
+    origin_ = beginningOf(source_->origin(), longestOrigin);
     metrics_ = source_->metrics();
   });
 }
@@ -107,7 +108,7 @@ void SourceSlot::emit(MetricRecord record) {
     return;
   }
   if (record.origin.empty()) record.origin = origin_;
-  if (record.origin.size() > longestOrigin) record.origin.resize(longestOrigin);
+  record.origin.resize(beginningOf(record.origin, longestOrigin).size());
   ++records_;
   rate_.add(worker_.clock().monotonicTime());
   lastRecord_ = record.time;

@@ -17,6 +17,15 @@ std::string hexText(std::int64_t number) {
   return "0x" + digits;
 }
 
+std::string_view beginningOf(std::string_view text, std::size_t longest) {
+  if (text.size() <= longest) return text;
+  const auto continues = [](char character) { return (static_cast<unsigned char>(character) & 0xC0) == 0x80; };
+  std::size_t size = longest;
+  // A character has at most three bytes after its first.
+  for (int back = 0; back < 3 && size > 0 && continues(text[size]); ++back) --size;
+  return text.substr(0, continues(text[size]) ? longest : size);
+}
+
 std::string onOneLine(std::string_view text) {
   std::string line;
   line.reserve(text.size());

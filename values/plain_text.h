@@ -35,6 +35,9 @@ constexpr bool isControlCharacter(char character) {
   return code < 32 || code == 127;
 }
 
+// The first bytes of a text, at most so many; of UTF-8 no character is cut in two.
+std::string_view beginningOf(std::string_view text, std::size_t longest);
+
 // A text that came from elsewhere, as it may stand in a line for people: "?" in place of each control character, those
 // of U+0080 to U+009F included.
 std::string onOneLine(std::string_view text);

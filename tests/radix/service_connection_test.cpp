@@ -11,6 +11,7 @@
 #include <vector>
 
 #include "platform/manual_loop.h"
+#include "platform/system_log.h"
 #include "radix/connection_manager.h"
 #include "radix/in_process_link.h"
 
@@ -52,6 +53,7 @@ class PlayedService final : LinkListener, FrameHandler {
     say(Reply{.sequence = commands.at(index).sequence, .status = status, .message = std::move(message)});
   }
   void hangUp() { link_.reset(); }
+  void setReading(bool reading) { link_->setReading(reading); }
 
   std::vector<Hello> hellos;
   std::vector<Command> commands;
@@ -186,7 +188,9 @@ TEST_F(ServiceConnectionTest, ACommandWaitsTwoSecondsAndALateReplyIsForgotten) {
   EXPECT_EQ(loop_.monotonicTime() - start, seconds(2));
   current().answer(0, 77);
   loop_.run();
-  answered_ = 1;
+  const auto late = loop_.after(seconds(2) - milliseconds(1), [this] { current().answer(1); });
+  EXPECT_EQ(perform().status, 0) << "just in time";
+  answered_ = 2;
   answerAll();
   EXPECT_EQ(perform().status, 0);
 }
@@ -324,13 +328,23 @@ TEST_F(ServiceConnectionTest, AConfigurationThatTheServiceDidNotAnswerInTimeIsRe
   EXPECT_THAT(current().commands, SizeIs(1));
 }
 
-TEST_F(ServiceConnectionTest, AConfigurationThatIsRefusedOnlyWhenRestoredIsNotTriedAgain) {
+TEST_F(ServiceConnectionTest, AConfigurationThatIsRefusedOnlyWhenRestoredIsNotTriedAgainAndTheLogSaysSo) {
+  class Lines final : public probeview::LineSink {
+   public:
+    void line(std::string_view text) override { lines.emplace_back(text); }
+    std::vector<std::string> lines;
+  };
+  // The log stays set for the rest of this program; nobody else writes to it.
+  static auto& log = *new Lines;
+  probeview::setSystemLog(log);
   mood_ = Mood::Absent;
   EXPECT_NE(push("wish").status, 0);
   mood_ = Mood::There;
   loop_.advance(seconds(1));
-  current().answer(0, 3, "no");
+  current().answer(0, 3, "no\nsuch metric");
   loop_.run();
+  EXPECT_THAT(log.lines, ElementsAre("the baseband service refuses the configuration that is pushed again: error=3 "
+                                     "msg=no?such metric"));
   current().hangUp();
   loop_.advance(milliseconds(100));
   ASSERT_THAT(services_, SizeIs(2));
@@ -439,8 +453,18 @@ TEST_F(ServiceConnectionTest, AServiceThatSendsWhatIsNoFrameIsLeftAndTriedAgain)
   EXPECT_TRUE(Connection(manager_).connected);
 }
 
-TEST_F(ServiceConnectionTest, AnOverlongFrameIsLeftToo) {
+TEST_F(ServiceConnectionTest, AFrameOfTheLongestLengthIsTakenAndOneByteMoreEndsTheConnection) {
   loop_.run();
+  // Field 15, which nobody knows, with as much content as fits: 3 bytes of length.
+  std::vector<std::uint8_t> longest(longestFrame, 'x');
+  const std::size_t content = longest.size() - 4;
+  longest[0] = 0x7A;
+  longest[1] = static_cast<std::uint8_t>(content & 0x7F) | 0x80;
+  longest[2] = static_cast<std::uint8_t>((content >> 7) & 0x7F) | 0x80;
+  longest[3] = static_cast<std::uint8_t>(content >> 14);
+  current().sayBytes(longest);
+  loop_.run();
+  EXPECT_TRUE(Connection(manager_).connected);
   current().sayBytes(std::vector<std::uint8_t>(longestFrame + 1));
   loop_.run();
   EXPECT_THAT(Connection(manager_).trouble, HasSubstr("a frame of 131073 bytes"));
@@ -514,6 +538,88 @@ TEST_F(ServiceConnectionTest, WhenTheHandlersDoNotKeepUpTheRestWaitsInTheService
   loop_.run();
   queue->run();
   EXPECT_EQ(events, sent + 1);
+}
+
+// How many events the connection to the service still has room for: 256 where the client has read all that came.
+std::size_t roomLeft(PlayedService& service) {
+  std::size_t count = 0;
+  while (service.trySay(Event{.metricId = 1})) ++count;
+  return count;
+}
+
+TEST_F(ServiceConnectionTest, FourThousandAndNinetySixEventsWaitForTheHandlersAndAfterOneMoreNoneIsRead) {
+  for (const std::size_t past : {0U, 1U}) {
+    auto queue = std::make_shared<ManualLoop>();
+    manager_ = makeConnectionManager(loop_, std::make_unique<TestConnector>(*this), {.clientName = "slow"}, queue);
+    EventsOn(manager_);
+    loop_.run();
+    for (std::size_t number = 0; number < 4096 + past; ++number) {
+      current().say(Event{.metricId = 1});
+      if (number % 200 == 0) loop_.run();
+    }
+    loop_.run();
+    EXPECT_EQ(roomLeft(current()), 256U);
+    loop_.run();
+    EXPECT_EQ(roomLeft(current()), past == 0 ? 256U : 0U);
+    queue->run();
+    loop_.run();
+    EXPECT_EQ(roomLeft(current()), 256U);
+    manager_.reset();
+    queue->run();
+    loop_.run();
+  }
+}
+
+TEST_F(ServiceConnectionTest, TwoThousandAndFortyEightBytesOfPayloadCountAsOneEventMore) {
+  for (const std::size_t size : {2047U, 2048U}) {
+    auto queue = std::make_shared<ManualLoop>();
+    manager_ = makeConnectionManager(loop_, std::make_unique<TestConnector>(*this), {.clientName = "slow"}, queue);
+    EventsOn(manager_);
+    loop_.run();
+    for (int number = 0; number < 2049; ++number) {
+      current().say(Event{.metricId = 1, .payload = std::vector<std::uint8_t>(size)});
+      loop_.run();
+    }
+    roomLeft(current());
+    loop_.run();
+    EXPECT_EQ(roomLeft(current()), size == 2047 ? 256U : 0U);
+    manager_.reset();
+    queue->run();
+    loop_.run();
+  }
+}
+
+TEST_F(ServiceConnectionTest, LargeEventsThatComeAllAtOnceAreLeftInTheServiceLikeOthers) {
+  auto queue = std::make_shared<ManualLoop>();
+  manager_ = makeConnectionManager(loop_, std::make_unique<TestConnector>(*this), {.clientName = "slow"}, queue);
+  EventsOn(manager_);
+  loop_.run();
+  for (int number = 0; number < 200; ++number) {
+    current().say(Event{.metricId = 1, .payload = std::vector<std::uint8_t>(100 * 1024)});
+  }
+  loop_.run();
+  // Of twenty megabytes not more than nine are here: eight that may wait, and a batch of one.
+  const std::size_t taken = roomLeft(current()) + 200 - 256;
+  EXPECT_LE(taken, 92U);
+  EXPECT_GE(taken, 80U);
+  manager_.reset();
+  queue->run();
+}
+
+TEST_F(ServiceConnectionTest, SixtyFourAnswersMayBeLeftUnreadAndAServiceThatAsksOnceMoreIsLeft) {
+  loop_.run();
+  current().setReading(false);
+  // What the connection holds, and what waits behind it.
+  for (std::uint64_t number = 0; number < 256 + 64; ++number) {
+    current().say(Ping{.number = number});
+    if (number % 100 == 0) loop_.run();
+  }
+  loop_.run();
+  EXPECT_TRUE(Connection(manager_).connected);
+  current().say(Ping{.number = 999});
+  loop_.run();
+  EXPECT_FALSE(Connection(manager_).connected);
+  EXPECT_EQ(Connection(manager_).trouble, "the baseband service asks without reading the answers");
 }
 
 TEST_F(ServiceConnectionTest, AsManyCommandsAsTheLimitMayWaitAtOnceAndOneMoreIsRefused) {

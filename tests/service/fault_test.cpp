@@ -1,23 +1,31 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// What may go wrong around the service, on a clock that the test owns.
+// What may go wrong around the service, and what it may be made to hold, on a clock that the test owns.
 #include <gtest/gtest.h>
+#include <malloc.h>
 
+#include <deque>
 #include <memory>
+#include <semaphore>
+#include <vector>
 
 #include "messages/metric_identifiers.h"
 #include "platform/manual_loop.h"
 #include "radix/connection_manager.h"
 #include "radix/in_process_link.h"
 #include "radix/service_commands.h"
+#include "radix/status.h"
 #include "service/service.h"
+#include "tests/service/harness/raw_client.h"
 #include "tests/service/harness/scripted_source.h"
+#include "tests/service/harness/test_service.h"
 
 namespace probeview {
 namespace {
 
 using std::chrono::hours;
 using std::chrono::milliseconds;
+using std::chrono::minutes;
 using std::chrono::seconds;
 
 class Faults : public ::testing::Test, protected radix::Connector {
@@ -41,6 +49,25 @@ class Faults : public ::testing::Test, protected radix::Connector {
     auto [near, far] = radix::makeInProcessLinks(loop_);
     service_.accept(std::move(far), {});
     return {std::move(near), false, {}};
+  }
+
+  std::unique_ptr<RawClient> connectRaw() { return std::make_unique<RawClient>(connect().link); }
+
+  // A raw client that has greeted and been greeted.
+  std::unique_ptr<RawClient> greeted(const std::string& name = "raw") {
+    auto client = connectRaw();
+    client->say(radix::Hello{.name = name});
+    loop_.run();
+    EXPECT_TRUE(client->hello.has_value());
+    return client;
+  }
+
+  static radix::Command push(const std::string& text) {
+    return {
+        .sequence = 1,
+        .name = radix::kCommandAddConfiguration,
+        .arguments = radix::encodeDictionary(
+            {{radix::kKeyPayload, Value::bytes({reinterpret_cast<const std::uint8_t*>(text.data()), text.size()})}})};
   }
 
   void emit() { script_->emit(K_LTE_RRC_STATE, {0x10, 1}, loop_.wallTime()); }
@@ -153,6 +180,231 @@ TEST_F(Faults, ARecordThatFitsNoFrameIsWithheldAndTheLongestThatDoesIsSent) {
   loop_.advance(milliseconds(1));
   EXPECT_EQ(events_, 1);
   EXPECT_EQ(log_.count("its payload has 129793 bytes, more than 129792"), 1U);
+}
+
+TEST_F(Faults, ADayOfComingAndGoingUnderAClockThatIsSetAgainAndAgainLeavesNothingBehind) {
+  const auto source = script_->context->scheduler.every(seconds(1), [this] { emit(); });
+  std::size_t early = 0;
+  for (int stay = 0; stay < 24 * 6; ++stay) {
+    // Somebody comes, wants something, does not read for a while, and goes without a word.
+    auto guest = greeted("guest " + std::to_string(stay));
+    const bool known = events_ > 0;
+    const int before = events_;
+    guest->say(push("[metrics]\nK_LTE_RRC_STATE = " + std::to_string(100 + stay) + "\nK_OF_NOBODY = 5\n"));
+    guest->say(radix::Delivery{true});
+    guest->say(radix::Command{.sequence = 2, .name = radix::kCommandQueryMetric, .arguments = {}});
+    loop_.advance(minutes(2) + milliseconds(500));
+    guest->setReading(false);
+    loop_.advance(minutes(5));
+    guest->setReading(true);
+    loop_.advance(minutes(1));
+    EXPECT_EQ(guest->replies.size(), 2U);
+    EXPECT_EQ(guest->events.size() + guest->dropped, static_cast<std::size_t>(events_ - before) + (known ? 1 : 0));
+    guest.reset();
+    loop_.advance(minutes(2) - milliseconds(500));
+    loop_.setWallTime(stay % 2 == 0 ? milliseconds(stay) : ManualLoop::defaultWallTime + hours(stay));
+    EXPECT_EQ(service_.clientCount(), 1U);
+    log_.lines = {};
+    if (stay == 12) early = ::mallinfo2().uordblks;
+  }
+  EXPECT_EQ(events_, 24 * 3600);
+  EXPECT_LE(::mallinfo2().uordblks, early + 16 * 1024);
+  const Dictionary report = status();
+  EXPECT_EQ(report.find("uptime_ms")->int64(), 24 * 3600 * 1000 + 1);
+  const Dictionary& client = *(*report.find("clients")->list())[0].dictionary();
+  EXPECT_EQ(client.find("lost")->rawUInt64(), 0U);
+  EXPECT_DOUBLE_EQ(client.find("records_per_second")->rawDouble(), 1.0);
+  EXPECT_EQ(script_->plan, std::nullopt);
+}
+
+TEST_F(Faults, AHundredAndTwentyEightClientsAreServedAndOneMoreIsToldSo) {
+  std::deque<std::unique_ptr<RawClient>> crowd;
+  for (int number = 0; number < 127; ++number) crowd.push_back(greeted(std::string(64, 'n')));
+  EXPECT_EQ(service_.clientCount(), 128U);
+  for (const auto& client : crowd) EXPECT_EQ(client->hello->refusalStatus, 0);
+  // What the service has to say of so many fits into one frame.
+  EXPECT_EQ(status().find("clients")->list()->size(), 128U);
+  auto late = greeted("late");
+  EXPECT_EQ(late->hello->refusalStatus, static_cast<std::int32_t>(radix::Status::TooMany));
+  EXPECT_EQ(late->hello->refusal, "there are already 128 clients, more are not served");
+  EXPECT_EQ(log_.count("'late' (process 0, user 0) was refused: there are already 128 clients"), 1U);
+  crowd.pop_front();
+  loop_.run();
+  EXPECT_EQ(greeted()->hello->refusalStatus, 0);
+}
+
+TEST_F(Faults, TwoHundredAndFiftySixConnectionsAreKeptAndOneMoreIsClosedWithoutAWord) {
+  std::vector<std::unique_ptr<RawClient>> crowd;
+  for (int number = 0; number < 255; ++number) crowd.push_back(connectRaw());
+  loop_.run();
+  for (const auto& client : crowd) EXPECT_FALSE(client->closed);
+  const auto late = connectRaw();
+  loop_.run();
+  EXPECT_TRUE(late->closed);
+  EXPECT_FALSE(late->hello.has_value());
+  EXPECT_EQ(log_.count("a connection of process 0 was closed: there are too many already (1 closed so far)"), 1U);
+  for (int number = 0; number < 7; ++number) connectRaw();
+  EXPECT_EQ(log_.count("was closed: there are too many already"), 4U) << "the 1st, 2nd, 4th and 8th";
+}
+
+TEST_F(Faults, AClientHasFiveSecondsToGreetAndWhoeverWasRefusedOneToGo) {
+  const auto silent = connectRaw();
+  loop_.advance(seconds(5) - milliseconds(1));
+  EXPECT_FALSE(silent->closed);
+  loop_.advance(milliseconds(1));
+  EXPECT_TRUE(silent->closed);
+  const auto refused = connectRaw();
+  refused->say(radix::Delivery{true});
+  loop_.run();
+  ASSERT_TRUE(refused->hello.has_value());
+  loop_.advance(seconds(1) - milliseconds(1));
+  EXPECT_FALSE(refused->closed);
+  loop_.advance(milliseconds(1));
+  EXPECT_TRUE(refused->closed);
+}
+
+TEST_F(Faults, AClientsNameIsKeptUpToSixtyFourBytesAndNoCharacterIsCutInTwo) {
+  const auto names = [this] {
+    std::vector<std::string> all;
+    const Dictionary report = status();
+    for (const Value& client : *report.find("clients")->list()) {
+      all.emplace_back(*client.dictionary()->find("name")->text());
+    }
+    return all;
+  };
+  const auto whole = greeted(std::string(64, 'n'));
+  const auto cut = greeted(std::string(65, 'm'));
+  const auto between = greeted(std::string(63, 'o') + "\u00e9");
+  EXPECT_EQ(names(),
+            (std::vector<std::string>{"client", std::string(64, 'n'), std::string(64, 'm'), std::string(63, 'o')}));
+}
+
+TEST_F(Faults, AnOriginIsKeptUpTo1024Bytes) {
+  const auto client = greeted();
+  client->say(radix::Delivery{true});
+  loop_.run();
+  for (const std::size_t size : {1024U, 1025U}) {
+    script_->sink->emit({K_LTE_RRC_STATE, {}, milliseconds(1), std::string(size, 'o')});
+    loop_.advance(milliseconds(1));
+    EXPECT_EQ(client->events.back().origin, std::string(1024, 'o'));
+  }
+  auto other = std::make_shared<ScriptedSource::Script>();
+  other->origin = std::string(1025, 'p');
+  service_.addSource(std::make_unique<ScriptedSource>(other));
+  EXPECT_EQ((*status().find("sources")->list())[1].dictionary()->find("origin")->text(), std::string(1024, 'p'));
+}
+
+TEST_F(Faults, TenNotesOnAConfigurationAreLoggedAndOfMoreOnlyTheNumber) {
+  const auto client = greeted();
+  std::string text = "[metrics]\n";
+  for (int number = 0; number < 10; ++number) text += "K_OF_NOBODY_" + std::to_string(number) + " = 1\n";
+  client->say(push(text));
+  loop_.run();
+  EXPECT_EQ(log_.count("is not known, ignored"), 10U);
+  EXPECT_EQ(log_.count("more like these"), 0U);
+  log_.lines.clear();
+  client->say(push(text + "K_OF_NOBODY_10 = 1\n"));
+  loop_.run();
+  EXPECT_EQ(log_.count("is not known, ignored"), 10U);
+  EXPECT_EQ(log_.count("the configuration of client 2 'raw': and 1 more like these"), 1U);
+}
+
+TEST_F(Faults, OfTheRecordsThatAreWithheldTheFirstTheSecondTheFourthTheEighthAreLogged) {
+  for (int number = 1; number <= 16; ++number) {
+    script_->emit(K_LTE_RRC_STATE, {0x08});
+    const std::size_t logged = number < 2 ? 1 : number < 4 ? 2 : number < 8 ? 3 : number < 16 ? 4 : 5;
+    EXPECT_EQ(log_.count("was withheld"), logged) << number;
+  }
+}
+
+TEST_F(Faults, ACommandsNameInAReplyIsCutAtSixtyFourBytes) {
+  const auto client = greeted();
+  for (const std::size_t size : {64U, 65U, 100'000U}) {
+    client->say(radix::Command{.sequence = 1, .name = std::string(size, 'c'), .arguments = {}});
+    client->say(radix::Command{.sequence = 2, .name = std::string(size, 'c'), .arguments = {0x0A, 0x7F}});
+    loop_.run();
+    ASSERT_EQ(client->replies.size(), 2U);
+    EXPECT_EQ(client->replies[0].message, "the command '" + std::string(64, 'c') + "' is not known");
+    EXPECT_EQ(client->replies[1].message, "the arguments of " + std::string(64, 'c') + " cannot be read");
+    client->replies.clear();
+  }
+}
+
+// The service's end of a connection whose other end takes as much as the test says.
+class StuckLink final : public radix::Link {
+ public:
+  struct Shared {
+    radix::LinkListener* listener = nullptr;
+    std::size_t room = 0;
+    std::size_t sent = 0;
+    bool reading = true;
+  };
+  explicit StuckLink(Shared& shared) : shared_(shared) {}
+  void start(radix::LinkListener& listener) override { shared_.listener = &listener; }
+  std::size_t send(std::span<const radix::FrameBytes> frames) override {
+    const std::size_t taken = std::min(frames.size(), shared_.room);
+    shared_.room -= taken;
+    shared_.sent += taken;
+    return taken;
+  }
+  void setReading(bool reading) override { shared_.reading = reading; }
+
+ private:
+  Shared& shared_;
+};
+
+TEST_F(Faults, SixtyFourRepliesMayBeLeftUnreadAndAfterOneMoreTheClientIsNotListenedToUntilItReads) {
+  StuckLink::Shared link;
+  link.room = 1;
+  service_.accept(std::make_unique<StuckLink>(link), {});
+  link.listener->onFrame(*radix::encode(radix::Hello{.name = "stuck"}));
+  loop_.run();
+  EXPECT_EQ(link.sent, 1U);
+  for (std::uint64_t number = 0; number < 64; ++number) {
+    link.listener->onFrame(*radix::encode(radix::Ping{.number = number}));
+  }
+  loop_.run();
+  EXPECT_TRUE(link.reading);
+  link.listener->onFrame(*radix::encode(radix::Ping{.number = 64}));
+  loop_.run();
+  EXPECT_FALSE(link.reading);
+  link.room = 64;
+  link.listener->onWritable();
+  EXPECT_FALSE(link.reading) << "one is still there";
+  link.room = 1;
+  link.listener->onWritable();
+  EXPECT_TRUE(link.reading);
+  EXPECT_EQ(link.sent, 66U);
+}
+
+TEST(HangingSource, HoldsUpTheServiceForAsLongAsItHangsAndEverybodyIsToldAfterTwoSeconds) {
+  const auto world = makeSocketService();
+  world->script().metrics = {K_LTE_RRC_STATE};
+  std::binary_semaphore freed(0);
+  world->script().onQuery = [&freed](std::int64_t) {
+    freed.acquire();
+    return true;
+  };
+  world->kill();
+  world->restart();
+  const auto asker = world->manager("asker");
+  const auto other = world->manager("other");
+  int events = 0;
+  radix::client::RegisterEventHandler(other, radix::kEventMetric,
+                                      [&events](const auto&, radix::client::Group) { ++events; });
+  radix::client::EventsOn(other);
+  world->settle();
+  radix::client::ObjectHandle reply;
+  const auto result =
+      radix::client::PerformCommand(asker, radix::kCommandQueryMetric, {{radix::kKeyMetricID, K_LTE_RRC_STATE}}, reply);
+  EXPECT_EQ(result.status, static_cast<int>(radix::Status::TimedOut));
+  EXPECT_EQ(result.message, "the baseband service did not answer in time");
+  freed.release();
+  // Everything goes on as if nothing had been.
+  EXPECT_EQ(radix::client::PerformCommand(asker, radix::kCommandShowStatus, {}, reply).status, 0);
+  world->emit(K_LTE_RRC_STATE, {});
+  EXPECT_TRUE(world->until([&] { return events == 1; }));
+  EXPECT_TRUE(radix::client::Connection(asker).connected);
 }
 
 }  // namespace

@@ -181,5 +181,24 @@ TEST(Outbox, ManyRandomStepsAgreeWithAPlainModel) {
   }
 }
 
+TEST(Outbox, HoldsFourThousandAndNinetySixRecordsAndNotOneMore) {
+  Outbox outbox({});
+  for (int number = 0; number < 4096; ++number) outbox.addRecord(number % 30, frame('r'));
+  EXPECT_EQ(outbox.records(), 4096U);
+  EXPECT_EQ(outbox.lostRecords(), 0U);
+  outbox.addRecord(7, frame('r'));
+  EXPECT_EQ(outbox.records(), 4096U);
+  EXPECT_EQ(outbox.lostRecords(), 1U);
+}
+
+TEST(Outbox, HoldsEightMebibytesAndNotOneByteMore) {
+  Outbox outbox({});
+  for (int number = 0; number < 64; ++number) outbox.addRecord(number % 3, frame('r', 128 * 1024));
+  EXPECT_EQ(outbox.lostRecords(), 0U);
+  outbox.addRecord(2, frame('r'));
+  EXPECT_EQ(outbox.records(), 64U);
+  EXPECT_EQ(outbox.lostRecords(), 1U);
+}
+
 }  // namespace
 }  // namespace probeview

@@ -2,6 +2,7 @@
 //
 // The real program, in a process of its own.
 #include <gmock/gmock.h>
+#include <grp.h>
 #include <gtest/gtest.h>
 #include <sys/resource.h>
 #include <sys/socket.h>
@@ -290,6 +291,93 @@ TEST_F(Radixd, SleepsWhileNobodyIsThere) {
   moment = loop_.after(std::chrono::seconds(1), [&] { late = true; });
   loop_.runUntil([&] { return late; }, patience);
   EXPECT_EQ(switches(), before);
+}
+
+// Connects as a program would that knows nothing of ours; the number of the descriptor, or -1.
+int connectPlainly(const std::string& path) {
+  const int socket = ::socket(AF_UNIX, SOCK_SEQPACKET | SOCK_CLOEXEC, 0);
+  sockaddr_un address{};
+  address.sun_family = AF_UNIX;
+  std::memcpy(address.sun_path, path.data(), path.size());
+  if (::connect(socket, reinterpret_cast<const sockaddr*>(&address), sizeof address) == 0) return socket;
+  ::close(socket);
+  return -1;
+}
+
+TEST_F(Radixd, AClientThatIsKilledWhileItTalksLeavesTheOthersServed) {
+  RadixdProcess radixd(arguments());
+  ASSERT_TRUE(radixd.waitForLog("listening"));
+  const auto other = manager();
+  ASSERT_EQ(status(other), 0);
+  const auto hello = radix::encode(radix::Hello{.name = "victim"});
+  const auto on = radix::encode(radix::Delivery{true});
+  const auto command = radix::encode(
+      radix::Command{.sequence = 1, .name = radix::kCommandShowStatus, .arguments = std::vector<std::uint8_t>(60'000)});
+  for (int round = 1; round <= 5; ++round) {
+    const pid_t victim = ::fork();
+    if (victim == 0) {
+      const int socket = connectPlainly(socket_);
+      ::send(socket, hello->data(), hello->size(), 0);
+      ::send(socket, on->data(), on->size(), 0);
+      // Reads nothing, so that both directions fill, and never comes to an end by itself.
+      while (::send(socket, command->data(), command->size(), MSG_NOSIGNAL) > 0) {
+      }
+      ::_exit(0);
+    }
+    const std::string who = "'victim' (process " + std::to_string(victim);
+    ASSERT_TRUE(radixd.waitForLog(who)) << radixd.log();
+    ::kill(victim, SIGKILL);
+    int ended = 0;
+    ::waitpid(victim, &ended, 0);
+    EXPECT_TRUE(WIFSIGNALED(ended));
+    const std::string gone = who + ", user " + std::to_string(::geteuid()) + ") has gone after ";
+    EXPECT_TRUE(radixd.waitForLog(gone)) << radixd.log();
+    EXPECT_EQ(status(other), 0);
+  }
+}
+
+TEST_F(Radixd, AForeignUsersConnectionIsRefusedAndLogged) {
+  if (::geteuid() != 0) GTEST_SKIP() << "only root may try as somebody else";
+  constexpr uid_t nobody = 65534;
+  // A socket that anybody may open, as a careless system manager makes it: who connects is looked at all the same.
+  FileDescriptor socket(::socket(AF_UNIX, SOCK_SEQPACKET | SOCK_CLOEXEC, 0));
+  sockaddr_un address{};
+  address.sun_family = AF_UNIX;
+  std::memcpy(address.sun_path, socket_.data(), socket_.size());
+  ASSERT_EQ(::bind(socket.number(), reinterpret_cast<sockaddr*>(&address), sizeof address), 0);
+  ASSERT_EQ(::listen(socket.number(), 16), 0);
+  ASSERT_EQ(::chmod(socket_.c_str(), 0606), 0);
+  ASSERT_EQ(::chmod(folder_.path().c_str(), 0711), 0);
+  const int handed = socket.number();
+  RadixdProcess radixd({"--source", "trace:" + trace_}, [handed] {
+    if (handed == 3) {
+      ::fcntl(3, F_SETFD, 0);
+    } else {
+      ::dup2(handed, 3);
+    }
+    ::setenv("LISTEN_FDS", "1", 1);
+    ::setenv("LISTEN_PID", std::to_string(::getpid()).c_str(), 1);
+  });
+  ASSERT_TRUE(radixd.waitForLog("listening at a socket of the system manager")) << radixd.log();
+  const auto hello = radix::encode(radix::Hello{.name = "foreigner"});
+  const pid_t foreigner = ::fork();
+  if (foreigner == 0) {
+    if (::setgroups(0, nullptr) != 0 || ::setgid(nobody) != 0 || ::setuid(nobody) != 0) ::_exit(3);
+    const int connection = connectPlainly(socket_);
+    if (connection < 0) ::_exit(4);
+    ::send(connection, hello->data(), hello->size(), MSG_NOSIGNAL);
+    // It is told something, and then comes the end.
+    char answer[4096];
+    if (::recv(connection, answer, sizeof answer, 0) <= 0) ::_exit(5);
+    ::_exit(::recv(connection, answer, sizeof answer, 0) == 0 ? 0 : 6);
+  }
+  int ended = 0;
+  ::waitpid(foreigner, &ended, 0);
+  EXPECT_EQ(WIFEXITED(ended) ? WEXITSTATUS(ended) : -1, 0);
+  EXPECT_TRUE(radixd.waitForLog("radixd: warning: client 1 (process " + std::to_string(foreigner) +
+                                ", user 65534) was refused: only user 0 and root may connect, not user 65534\n"))
+      << radixd.log();
+  EXPECT_EQ(status(manager()), 0);
 }
 
 }  // namespace

@@ -5,6 +5,7 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 #include <sys/file.h>
+#include <sys/resource.h>
 #include <sys/socket.h>
 #include <sys/stat.h>
 #include <sys/un.h>
@@ -243,6 +244,28 @@ TEST_F(ListenerTest, AForeignUserWhoGoesOnTalkingIsNotHeard) {
   client->say(radix::Command{.sequence = 1, .name = radix::kCommandShowStatus, .arguments = {}});
   ASSERT_TRUE(loop_.runUntil([&] { return client->closed; }, patience));
   EXPECT_TRUE(client->replies.empty());
+}
+
+TEST_F(ListenerTest, WithoutDescriptorsItRestsBetweenTwoTriesAndTakesThoseWhoWaitWhenThereAreSome) {
+#ifdef __SANITIZE_ADDRESS__
+  GTEST_SKIP() << "the sanitizer opens a pipe to look at memory and reports a fault of its own when it gets none";
+#endif
+  const auto client = connect();
+  client->say(radix::Hello{.name = "waits"});
+  rlimit before{};
+  ASSERT_EQ(::getrlimit(RLIMIT_NOFILE, &before), 0);
+  const int next = ::dup(0);
+  ::close(next);
+  const rlimit none{static_cast<rlim_t>(next), before.rlim_max};
+  ASSERT_EQ(::setrlimit(RLIMIT_NOFILE, &none), 0);
+  const auto shortages = [this] { return log_.count("cannot accept a connection: Too many open files"); };
+  const auto start = std::chrono::steady_clock::now();
+  EXPECT_TRUE(loop_.runUntil([&] { return shortages() == 2; }, patience));
+  // A loop that turned as fast as it can would have come to the second try at once, and to hundreds by now.
+  EXPECT_GE(std::chrono::steady_clock::now() - start, std::chrono::milliseconds(240));
+  EXPECT_EQ(log_.count("trying again soon (2 times so far)"), 1U);
+  ASSERT_EQ(::setrlimit(RLIMIT_NOFILE, &before), 0);
+  EXPECT_TRUE(loop_.runUntil([&] { return client->hello.has_value(); }, patience));
 }
 
 }  // namespace

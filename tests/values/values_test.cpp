@@ -261,5 +261,16 @@ TEST(PlainText, WhatWouldEndALineOrSteerATerminalIsAQuestionMarkAndNothingElseIs
   EXPECT_EQ(onOneLine(""), "");
 }
 
+TEST(PlainText, TheBeginningOfATextEndsBetweenTwoCharacters) {
+  EXPECT_EQ(beginningOf("abc", 3), "abc");
+  EXPECT_EQ(beginningOf("abcd", 3), "abc");
+  EXPECT_EQ(beginningOf("ab\u00e9", 3), "ab");
+  EXPECT_EQ(beginningOf("ab\u00e9", 4), "ab\u00e9");
+  EXPECT_EQ(beginningOf("\U0001F600x", 3), "");
+  EXPECT_EQ(beginningOf("\U0001F600x", 4), "\U0001F600");
+  // What is no UTF-8 is cut where it must be.
+  EXPECT_EQ(beginningOf("\x80\x80\x80\x80\x80\x80", 5).size(), 5U);
+}
+
 }  // namespace
 }  // namespace probeview

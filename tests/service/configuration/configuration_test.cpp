@@ -178,17 +178,34 @@ TEST(Configuration, TablesNestedToDeathAreRefused) {
   std::string dotted = "a";
   for (int depth = 0; depth < 60'000; ++depth) dotted += ".a";
   EXPECT_THAT(refusal(dotted + " = 1\n").error, HasSubstr("more than 4000 dots"));
-  EXPECT_TRUE(parseConfiguration(dotted.substr(0, 8001) + " = 1\n").configuration.has_value());
+  EXPECT_TRUE(parseConfiguration(dotted.substr(0, 8001) + " = 1\n").configuration.has_value()) << "4000 dots";
+  EXPECT_THAT(refusal(dotted.substr(0, 8003) + " = 1\n").error, HasSubstr("more than 4000 dots"));
   refusal("a = " + std::string(100'000, '['));
   refusal("a = " + std::string(100'000, '{'));
 }
 
-TEST(Configuration, ManyNotesAreCutShort) {
+TEST(Configuration, AHundredNotesAreKeptAndOfOneMoreOnlyTheNumber) {
   std::string text = "[metrics]\n";
-  for (int count = 0; count < 150; ++count) text += "K_" + std::to_string(count) + " = 1\n";
-  const Configuration configuration = parse(text);
+  for (int count = 0; count < 100; ++count) text += "K_" + std::to_string(count) + " = 1\n";
+  Configuration configuration = parse(text);
+  ASSERT_EQ(configuration.notes.size(), 100u);
+  EXPECT_EQ(configuration.notes.back(), "line 101: the metric \"K_99\" is not known, ignored");
+  configuration = parse(text + "K_100 = 1\n");
   ASSERT_EQ(configuration.notes.size(), 101u);
-  EXPECT_EQ(configuration.notes.back(), "and 50 more like these");
+  EXPECT_EQ(configuration.notes.back(), "and 1 more like these");
+}
+
+TEST(Configuration, AReasonThatQuotesTheFileIsCutShort) {
+  // The same metric twice, the second time by a number of many digits.
+  const auto twice = [](std::size_t zeros) {
+    return "[metrics]\nK_LTE_RRC_STATE = 1\n0x" + std::string(zeros, '0') + "3C4E04 = 2\n";
+  };
+  const std::string what = " is the metric K_LTE_RRC_STATE, which has a period already";
+  const std::size_t atLimit = 500 - what.size() - std::string("0x3C4E04").size();
+  EXPECT_TRUE(refusal(twice(atLimit)).error.ends_with(what));
+  EXPECT_TRUE(refusal(twice(atLimit + 1)).error.ends_with("alread…"));
+  EXPECT_LT(refusal(twice(100'000)).error.size(), 600u);
+  EXPECT_LT(refusal("[" + std::string(50'000, 'a') + "]\n[" + std::string(50'000, 'a') + "]\n").error.size(), 600u);
 }
 
 TEST(Configuration, RandomBytesAreSurvived) {

@@ -233,12 +233,45 @@ TEST(TraceReader, LineEndsOfOtherSystemsAByteOrderMarkAndAMissingLastLineEndAreF
   EXPECT_THAT(log.problems, IsEmpty());
 }
 
-TEST(TraceReader, OnlyTheFirstProblemsAreKeptButAllAreCounted) {
+TEST(TraceReader, TwentyProblemsAreKeptAndOneMoreIsOnlyCounted) {
   std::string text = traceHeader + TraceLine{}.text();
-  for (int count = 0; count < 1000; ++count) text += "bad\n";
-  const TraceLog log = read(text);
-  EXPECT_EQ(log.problemCount, 1000u);
-  EXPECT_EQ(log.problems.size(), traceProblemsKept);
+  for (int count = 0; count < 20; ++count) text += "bad\n";
+  TraceLog log = read(text);
+  EXPECT_EQ(log.problemCount, 20u);
+  EXPECT_EQ(log.problems.size(), 20u);
+  log = read(text + "bad\n");
+  EXPECT_EQ(log.problemCount, 21u);
+  EXPECT_EQ(log.problems.size(), 20u);
+  EXPECT_THAT(log.problems.back(), HasSubstr("line 22: "));
+}
+
+TEST(TraceReader, ALineOfTheLongestLengthIsReadAndOneByteMoreIsSkipped) {
+  // A column that nobody reads, as long as it takes.
+  const auto lineOf = [](std::size_t length) {
+    const std::string row = TraceLine{}.text();
+    const std::size_t comma = row.find(',');
+    return row.substr(0, comma + 1) + std::string(length - (row.size() - 1), '0') + row.substr(comma + 1);
+  };
+  ASSERT_EQ(lineOf(4096).size(), 4097u) << "with its line end";
+  TraceLog log = read(traceHeader + lineOf(4096));
+  EXPECT_EQ(log.rows.size(), 1u);
+  EXPECT_THAT(log.problems, IsEmpty());
+  log = read(traceHeader + TraceLine{}.text() + lineOf(4097));
+  EXPECT_EQ(log.rows.size(), 1u);
+  EXPECT_THAT(log.problems, ElementsAre("line 3: is longer than 4096 bytes; row skipped"));
+}
+
+TEST(TraceReader, ALogOfHalfAMillionRowsIsReadAndOneRowMoreIsRefused) {
+  std::string text = "Timestamp,NetworkMode,RSRP,RSRQ,SNR,State,LACHEX,RAWCELLID,NRxRSRP,NRxRSRQ\n";
+  const std::string row = "2024.03.05_12.00.00,LTE,-,-,-,-,-,-,-,-\n";
+  text.reserve(text.size() + 500'001 * row.size());
+  for (int count = 0; count < 500'000; ++count) text += row;
+  {
+    const TraceLog log = read(text);
+    EXPECT_EQ(log.rows.size(), 500'000u);
+    EXPECT_THAT(log.problems, IsEmpty());
+  }
+  EXPECT_EQ(refusal(text + row), "line 500002: more than 500000 rows; split the log");
 }
 
 TEST(TraceReader, RandomBytesAreSurvived) {
