@@ -12,6 +12,7 @@ qt6-wayland fonts-dejavu-core"
 packages_test="libgtest-dev libgmock-dev libprotobuf-dev protobuf-compiler nlohmann-json3-dev python3 locales tzdata dbus"
 # A compiler and an emulator for the processor of most phones, and the test library as sources.
 packages_arm64="g++-aarch64-linux-gnu qemu-user googletest"
+packages_coverage="gcovr"
 packages_deep="$packages_arm64 clang libclang-rt-14-dev valgrind"
 # The peers that the benchmarks measure against, and what counts their instructions (its header comes with it).
 packages_bench="libprotozero-dev nanopb libnanopb-dev libprotobuf-dev protobuf-compiler valgrind"

@@ -366,6 +366,8 @@ TEST(Enumerations, TheGapsOfTheBandsHaveNoName) {
   message.setWcdmaBand(KCellularWcdmaCellInfo::WcdmaBand::SYS_BAND_LTE_EUTRAN_BAND43);
   EXPECT_EQ(message.wcdmaBand(), 162);
   EXPECT_EQ(KCellularWcdmaCellInfo::WcdmaBand::table.entries().size(), 78U);
+  EXPECT_EQ(KCellularWcdmaCellInfo::WcdmaBand::table.value("SYS_BAND_UMTS_BAND6"), 168);
+  EXPECT_EQ(KCellularWcdmaCellInfo::WcdmaBand::table.value("SYS_BAND_UMTS_BAND"), std::nullopt);
 }
 
 TEST(Enumerations, TheRrcCausesFrom31To253HaveNoNameAnd254And255Do) {

@@ -32,6 +32,19 @@ TEST(Reader, DataAndStringsAreViewsOfThePayload) {
   EXPECT_TRUE(reader.hasError());
 }
 
+TEST(Reader, ALengthThatIsCutYieldsNothingAndPlacesNoMark) {
+  const Bytes payload = bytesOf("80");
+  PBDataReader data(payload);
+  EXPECT_TRUE(PBReaderReadData(data).empty());
+  EXPECT_TRUE(data.hasError());
+  EXPECT_FALSE(data.hasMoreData());
+  PBDataReader marked(payload);
+  PBReaderMark mark;
+  EXPECT_FALSE(PBReaderPlaceMark(marked, mark));
+  EXPECT_TRUE(marked.hasError());
+  EXPECT_EQ(marked.length(), 1U);
+}
+
 TEST(Reader, AMarkLimitsAndRecallGoesOnBehindTheRecord) {
   const Bytes payload = bytesOf("03 010203 09");
   PBDataReader reader(payload);
@@ -115,6 +128,18 @@ TEST(Writer, WithTheFieldNumberAllOnesAValueStandsWithoutAKey) {
   EXPECT_EQ(hexOf(writer.bytes()),
             "2a040201"
             "8001");
+  writer.clear();
+  PBDataWriterWriteBOOLField(writer, false, PBDataWriterNoField);
+  PBDataWriterWriteBOOLField(writer, true, PBDataWriterNoField);
+  PBDataWriterWriteUint64Field(writer, 300, PBDataWriterNoField);
+  PBDataWriterWriteInt32Field(writer, -1, PBDataWriterNoField);
+  PBDataWriterWriteDataField(writer, bytesOf("aabb"), PBDataWriterNoField);
+  PBDataWriterWriteStringField(writer, "hi", PBDataWriterNoField);
+  EXPECT_EQ(hexOf(writer.bytes()),
+            "0001ac02"
+            "ffffffffffffffffff01"
+            "02aabb"
+            "026869");
 }
 
 TEST(Writer, ARecordsLengthIsFilledInHoweverLongItIs) {

@@ -201,6 +201,89 @@ TEST(Sharing, AMovedMessageTakesItsContentAlong) {
   EXPECT_EQ(files.efListAtIndex(0)->efId(), 1U);
 }
 
+// Moves the message around and takes all of it along, whoever owns the memory of it.
+template <typename Message>
+void expectToMoveWhole(Message& source) {
+  const Message copy = source;
+  Message moved = std::move(source);
+  EXPECT_EQ(moved, copy);
+  EXPECT_EQ(source, Message());  // NOLINT(bugprone-use-after-move): a moved-from message is empty
+  source = std::move(moved);
+  EXPECT_EQ(source, copy);
+  EXPECT_EQ(encodedHex(source), encodedHex(copy));
+}
+
+TEST(Sharing, EveryKindOfFieldMovesWhole) {
+  for (const bool isDecoded : {true, false}) {
+    KCellularLteRsrpRsrqSinr texts;  // a text, a single nested message and a list
+    KCellularMmCommonInfo bytes;
+    KCellularGsmCsRfMeasurement numbers;
+    KCellularLteSelReselCellInfo unsignedNumbers;
+    if (isDecoded) {
+      ASSERT_TRUE(decode(texts, "08 05 1a 08 696e7465726e6574 72 02 20 01 7a 02 20 03"));
+      ASSERT_TRUE(decode(bytes, "12 02 aabb 1a 05 0a 03 00f110"));
+      ASSERT_TRUE(decode(numbers, "2a 03 02 04 06"));
+      ASSERT_TRUE(decode(unsignedNumbers, "12 02 0307 20 01"));
+    } else {
+      texts.setCallId("internet");
+      texts.setAvgValues(RsrpRsrqSinr());
+      texts.addInstValues(RsrpRsrqSinr());
+      bytes.setImsi(bytesOf("aabb"));
+      bytes.addEplmnList(Plmn());
+      for (int value = 0; value < 20; ++value) numbers.addCsTxPwr(value);
+      for (unsigned value = 0; value < 20; ++value) unsignedNumbers.addMultiBandInfo(value);
+    }
+    expectToMoveWhole(texts);
+    expectToMoveWhole(bytes);
+    expectToMoveWhole(numbers);
+    expectToMoveWhole(unsignedNumbers);
+  }
+}
+
+TEST(Sharing, ASingleNestedMessageIsSetFromAnotherFromItselfAndFromNothing) {
+  KCellularEmmContext source;
+  ASSERT_TRUE(decode(source, "32 02 08 01"));
+  KCellularEmmContext target;
+  target.setGuti(source.guti());
+  EXPECT_EQ(target.guti(), source.guti());
+  target.setGuti(target.guti());
+  source.setGuti(source.guti());
+  source.reset();
+  EXPECT_EQ(shown(target), R"(["guti": ["mmegi": 1]])");
+  ASSERT_TRUE(decode(source, "32 02 08 02"));
+  source.setGuti(source.guti());
+  EXPECT_EQ(shown(source), R"(["guti": ["mmegi": 2]])");
+  target.setGuti(nullptr);
+  EXPECT_FALSE(target.hasGuti());
+  EXPECT_EQ(target, KCellularEmmContext());
+}
+
+TEST(Sharing, AListThatWasDecodedGrowsByHandAndDecodesOn) {
+  KCellularGsmCsRfMeasurement numbers;
+  ASSERT_TRUE(decode(numbers, "2a 02 00 02"));
+  for (std::int32_t value = 2; value < 20; ++value) numbers.addCsTxPwr(value);
+  ASSERT_TRUE(decode(numbers, "28 28 2a 01 2a"));
+  ASSERT_EQ(numbers.csTxPwrsCount(), 22U);
+  for (std::int32_t value = 0; value < 22; ++value) {
+    EXPECT_EQ(numbers.csTxPwrAtIndex(static_cast<std::size_t>(value)), value);
+  }
+  KCellularLteTxPower elements = twoPowers();
+  for (unsigned count = 2; count < 20; ++count) elements.addTxPowerInfo().setSubframeIndex(count);
+  ASSERT_TRUE(decode(elements, "12 02 18 14"));
+  ASSERT_EQ(elements.txPowerInfosCount(), 21U);
+  EXPECT_EQ(elements.txPowerInfoAtIndex(1)->pucchTxPower(), 2);
+  for (unsigned index = 2; index < 21; ++index) EXPECT_EQ(elements.txPowerInfoAtIndex(index)->subframeIndex(), index);
+  elements.clearTxPowerInfos();
+  elements.addTxPowerInfo();
+  EXPECT_EQ(shown(elements), R"(["timestamp": 5, "tx_power_info": [[]]])");
+}
+
+TEST(Sharing, AMessageCopiedToItselfStaysAsItIs) {
+  KCellularLteTxPower message = twoPowers();
+  message.copyTo(message);
+  EXPECT_EQ(message, twoPowers());
+}
+
 TEST(Sharing, AssignmentReplacesTheWholeContent) {
   KCellularLteTxPower message;
   message.setTimestamp(9);
