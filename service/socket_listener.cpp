@@ -23,6 +23,8 @@ namespace {
 
 // How long the listener rests when the system has no descriptors left.
 constexpr std::chrono::milliseconds descriptorShortage{250};
+// How many connections are taken before others get their turn; the rest still waits then.
+constexpr int connectionsPerTurn = 64;
 
 std::string systemError() { return std::strerror(errno); }
 
@@ -205,7 +207,7 @@ bool SocketListener::start() {
 }
 
 void SocketListener::acceptAll() {
-  while (true) {
+  for (int count = 0; count < connectionsPerTurn; ++count) {
     FileDescriptor connection(::accept4(socket_->descriptor(), nullptr, nullptr, SOCK_NONBLOCK | SOCK_CLOEXEC));
     if (!connection) {
       if (errno == EINTR || errno == ECONNABORTED) continue;

@@ -1,11 +1,33 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/probectl.h"
 
+#include <poll.h>
+#include <unistd.h>
+
 #include <cstdlib>
-#include <ostream>
+#include <iostream>
 #include <vector>
 
 namespace probeview {
+
+namespace {
+
+// What was written last may still wait to be; a full disk shows here at the latest. A reader that has seen enough is no
+// fault.
+int finished(Tool& tool, ExitStatus status) {
+  tool.output.flush();
+  if (tool.output.good() || readerIsGone(tool)) return static_cast<int>(status);
+  tool.errors << "probectl: not all of the answer could be written; is the disk full?\n";
+  return static_cast<int>(status == ExitStatus::Success ? ExitStatus::Failure : status);
+}
+
+}  // namespace
+
+bool readerIsGone(const Tool& tool) {
+  if (&tool.output != &std::cout) return false;
+  pollfd output{STDOUT_FILENO, 0, 0};
+  return ::poll(&output, 1, 0) > 0 && (output.revents & (POLLERR | POLLHUP)) != 0;
+}
 
 std::unique_ptr<CLI::App> makeProbectlGrammar(Tool& tool) {
   auto program =
@@ -36,10 +58,10 @@ int runProbectl(std::span<const std::string> arguments, std::istream& input, std
   } catch (const CLI::ParseError& error) {
     // Help and version arrive here too, as errors with status 0.
     const int status = program->exit(error, output, errors);
-    return static_cast<int>(status == 0 ? ExitStatus::Success : ExitStatus::UsageError);
+    return finished(tool, status == 0 ? ExitStatus::Success : ExitStatus::UsageError);
   }
   if (tool.socketPath) setenv("RADIXD_SOCKET", tool.socketPath->c_str(), 1);
-  return static_cast<int>(tool.run());
+  return finished(tool, tool.run());
 }
 
 }  // namespace probeview

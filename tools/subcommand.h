@@ -43,6 +43,9 @@ struct Tool {
   std::function<ExitStatus()> run;
 };
 
+// Whether nobody reads the tool's output any more, as far as that can be known without writing to it.
+bool readerIsGone(const Tool& tool);
+
 using AddSubcommand = void (*)(CLI::App& program, Tool& tool);
 
 // Declares every subcommand, in the order of --help.

@@ -1,14 +1,12 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/watch_command.h"
 
-#include <poll.h>
 #include <signal.h>
-#include <unistd.h>
 
 #include <chrono>
 #include <cstdint>
-#include <iostream>
 #include <memory>
+#include <ostream>
 #include <string>
 
 #include "tools/record_text.h"
@@ -53,13 +51,6 @@ class ServiceNotes {
   std::string trouble_;
   std::uint64_t lost_ = 0;
 };
-
-// Whether nobody reads the tool's output any more, as far as that can be known without writing to it.
-bool readerIsGone(const Tool& tool) {
-  if (&tool.output != &std::cout) return false;
-  pollfd output{STDOUT_FILENO, 0, 0};
-  return ::poll(&output, 1, 0) > 0 && (output.revents & POLLERR) != 0;
-}
 
 ExitStatus watch(const Options& options, Tool& tool) {
   ServiceClient client(tool);

@@ -4,6 +4,7 @@
 #include <unistd.h>
 
 #include <cerrno>
+#include <cstring>
 #include <ostream>
 
 #include "ui/page_snapshot.h"
@@ -21,7 +22,10 @@ int PrintFront::run(NavigationStack& navigation, const StatusText& status) {
   }
   const bool onePage = navigation.depth() > 1;
   if (onePage ? printTopPage(navigation) : printBelow(navigation)) write(status() + "\n");
-  return 0;
+  // A reader that has gone away has seen enough.
+  if (trouble_ == 0 || trouble_ == EPIPE) return 0;
+  if (errors_ != nullptr) *errors_ << "the pages could not be written: " << std::strerror(trouble_) << "\n";
+  return 1;
 }
 
 bool PrintFront::hasFailed() const {
@@ -57,7 +61,10 @@ bool PrintFront::write(std::string_view text) {
   while (!text.empty()) {
     const auto written = ::write(fileDescriptor_, text.data(), text.size());
     if (written < 0 && errno == EINTR) continue;
-    if (written < 0) return false;
+    if (written < 0) {
+      trouble_ = errno;
+      return false;
+    }
     text.remove_prefix(static_cast<std::size_t>(written));
   }
   return true;

@@ -26,7 +26,8 @@ class PrintFront final : public Front {
   void waitUntil(std::function<bool()> isFilled) { isFilled_ = std::move(isFilled); }
 
   // Why nothing can come, empty when something can; asked before anything is waited for and once more after it. With a
-  // reason nothing is printed: it goes to the errors, and the status is 1.
+  // reason nothing is printed: it goes to the errors, and the status is 1. So it is when the pages cannot be
+  // written, as on a full disk.
   void failWith(std::function<std::string()> reason, std::ostream& errors) {
     failure_ = std::move(reason);
     errors_ = &errors;
@@ -46,6 +47,7 @@ class PrintFront final : public Front {
   bool write(std::string_view text);
 
   int fileDescriptor_;
+  int trouble_ = 0;  // why writing has failed
   EventLoop loop_;
   std::function<bool()> isFilled_;
   std::function<std::string()> failure_;

@@ -268,5 +268,21 @@ TEST_F(ListenerTest, WithoutDescriptorsItRestsBetweenTwoTriesAndTakesThoseWhoWai
   EXPECT_TRUE(loop_.runUntil([&] { return client->hello.has_value(); }, patience));
 }
 
+TEST_F(ListenerTest, SixtyFourConnectionsAreTakenBeforeOthersGetTheirTurn) {
+  path_ += "2";
+  auto made = ListeningSocket::make(path_);
+  ASSERT_TRUE(made.socket) << made.error;
+  int taken = 0;
+  int takenInFirstTurn = 0;
+  SocketListener listener(loop_, service_.log(), std::move(made.socket), peerCredentials, [&](auto, Peer) {
+    if (++taken == 1) loop_.post([&] { takenInFirstTurn = taken; });
+  });
+  ASSERT_TRUE(listener.start());
+  std::vector<std::unique_ptr<RawClient>> crowd;
+  for (int number = 0; number < 65; ++number) crowd.push_back(connect());
+  ASSERT_TRUE(loop_.runUntil([&] { return taken == 65; }, patience));
+  EXPECT_EQ(takenInFirstTurn, 64);
+}
+
 }  // namespace
 }  // namespace probeview

@@ -9,8 +9,10 @@
 #include <unistd.h>
 
 #include <array>
+#include <cstdio>
 #include <cstdlib>
 #include <string>
+#include <utility>
 
 #include "platform/file_descriptor.h"
 
@@ -93,6 +95,39 @@ TEST(BatchProcess, AFatalStopIsAnsweredAndEndsTheProgramWithStatusThree) {
   EXPECT_EQ(store.hear(), R"({"fatal":"a metric event carries no identifier","log":[]})");
   EXPECT_EQ(store.hear(), "");
   EXPECT_EQ(store.end(), 3);
+}
+
+// What a shell prints of it, and its exit status.
+std::pair<std::string, int> shell(const std::string& command) {
+  FILE* const program = ::popen(command.c_str(), "re");
+  std::string text;
+  for (int character = 0; (character = std::fgetc(program)) != EOF;) text += static_cast<char>(character);
+  return {text, WEXITSTATUS(::pclose(program))};
+}
+
+TEST(FullDisk, EndsWithStatusOneAndATextWhateverIsAnswered) {
+  const std::string told = "probectl: not all of the answer could be written; is the disk full?\n";
+  for (const char* arguments : {"decode K_LTE_RRC_STATE 1003", "--help", "--version"}) {
+    EXPECT_EQ(shell(std::string(PROBECTL) + " " + arguments + " 2>&1 >/dev/full"), std::pair(told, 1)) << arguments;
+  }
+  for (const char* subcommand : {"decode", "store"}) {
+    EXPECT_EQ(shell(std::string("echo nonsense | ") + PROBECTL + " " + subcommand + " --batch 2>&1 >/dev/full"),
+              std::pair(told, 1));
+  }
+}
+
+TEST(FullDisk, AReaderThatHasSeenEnoughIsNoFault) {
+  // A pipe whose reader has gone before anything is written; shells name descriptors by one digit.
+  int ends[2];
+  ASSERT_EQ(::pipe2(ends, O_CLOEXEC), 0);
+  ::close(ends[0]);
+  ASSERT_EQ(::dup2(ends[1], 9), 9);
+  ::close(ends[1]);
+  // With the signal ignored, writing fails instead of ending the program.
+  const auto [text, status] =
+      shell(std::string("trap '' PIPE; ") + PROBECTL + " decode K_LTE_RRC_STATE 1003 2>&1 >&9; echo status $?");
+  EXPECT_EQ(text, "status 0\n");
+  ::close(9);
 }
 
 }  // namespace

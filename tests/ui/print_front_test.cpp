@@ -135,5 +135,14 @@ TEST_F(Printing, AKeyThatNoRowsJoinToOpensNothing) {
   }
 }
 
+TEST_F(Printing, PagesThatFindNoRoomOnTheDiskEndWithStatusOneAndTheReason) {
+  const FileDescriptor full(::open("/dev/full", O_WRONLY | O_CLOEXEC));
+  PrintFront toFull(full.number());
+  std::ostringstream errors;
+  toFull.failWith([] { return std::string(); }, errors);
+  EXPECT_EQ(toFull.run(stack, status), 1);
+  EXPECT_EQ(errors.str(), "the pages could not be written: No space left on device\n");
+}
+
 }  // namespace
 }  // namespace probeview
