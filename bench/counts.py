@@ -17,7 +17,7 @@ TOOLS = TOP / "build/bench/bin"
 BUILD = """
 top=$1; targets=$2; cd "$top"; mkdir -p build; . packaging/packages.sh
 install_packages $packages_build $packages_window $packages_bench
-build_targets=$targets configure_and_build bench
+build_targets=${targets:-all} configure_and_build bench
 """
 
 # The same work on every machine: which of its copying loops the C library uses depends on the processor, how it finds
@@ -40,7 +40,8 @@ class Count:
 
 def build(targets=""):
     """Installs what is missing and builds the bench tree, or these targets of it. Ends the program if it fails."""
-    if subprocess.run(["bash", "-euo", "pipefail", "-c", BUILD, "build", str(TOP), targets], check=False).returncode != 0:
+    done = subprocess.run(["bash", "-euo", "pipefail", "-c", BUILD, "build", str(TOP), targets], check=False)
+    if done.returncode != 0:
         sys.exit(1)
 
 

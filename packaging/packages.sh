@@ -74,7 +74,7 @@ configure_and_build() {
   fi
   # shellcheck disable=SC2086
   if ! cmake --build "$top/build/$preset" --target $build_targets >>"$log" 2>&1 </dev/null; then
-    grep -E 'error|undefined reference|FAILED' "$log" | head -n 30 >&2
+    grep -E 'error|undefined reference|FAILED' "$log" | head -n 30 >&2 || tail -n 10 "$log" >&2
     echo "error: the build failed; the whole story is in ${log#"$top"/}" >&2
     return 1
   fi

@@ -27,8 +27,8 @@ class Gate(unittest.TestCase):
             paths = [pathlib.Path(folder) / name for name in ("recorded.json", "measured.json")]
             for path, content in zip(paths, (recorded, now)):
                 path.write_text(json.dumps(content), encoding="utf-8")
-            done = subprocess.run([sys.executable, "-B", BENCH / "gate", "--recorded", paths[0], "--measured", paths[1]],
-                                  capture_output=True, text=True, check=False)
+            command = [sys.executable, "-B", BENCH / "gate", "--recorded", paths[0], "--measured", paths[1]]
+            done = subprocess.run(command, capture_output=True, text=True, check=False)
         return done.returncode, done.stdout + done.stderr
 
     @staticmethod
