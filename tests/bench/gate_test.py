@@ -94,6 +94,17 @@ class Gate(unittest.TestCase):
         dearer = 1.03 * record["per message"][name]["instructions"]
         self.assertEqual(self.judge(self.setting(name, "instructions", dearer), record)[0], 1)
 
+    def test_every_script_has_help_and_refuses_what_it_does_not_understand_before_it_builds(self):
+        for script in ("run", "gate", "record"):
+            shown = subprocess.run([sys.executable, "-B", BENCH / script, "--help"], capture_output=True, text=True,
+                                   check=False)
+            self.assertEqual(shown.returncode, 0)
+            self.assertTrue(shown.stdout.startswith(f"usage: bench/{script}"), shown.stdout)
+        for command in (["run", "--only", "nothing"], ["run", "--seconds", "0"], ["gate", "x"], ["record", "x"]):
+            refused = subprocess.run([sys.executable, "-B", BENCH / command[0], *command[1:]], capture_output=True,
+                                     text=True, check=False)
+            self.assertEqual((refused.returncode, refused.stdout), (2, ""), command)
+
 
 if __name__ == "__main__":
     unittest.main()
