@@ -2,9 +2,12 @@
 #pragma once
 
 #include <bit>
+#include <chrono>
+#include <cstddef>
 #include <cstdint>
 #include <string_view>
 
+#include "platform/clock.h"
 #include "values/line_sink.h"
 
 namespace probeview {
@@ -23,6 +26,30 @@ class ServiceLog {
  private:
   LineSink& sink_;
   LogLevel level_;
+};
+
+// Hands on so many lines a minute and no more, so that nobody fills a disk who comes, is logged and goes again and
+// again; then says how many were left out.
+class BoundedLines final : public LineSink {
+ public:
+  static constexpr std::size_t mostInAMinute = 1000;
+
+  // Both outlive it.
+  BoundedLines(LineSink& sink, const Clock& clock) : sink_(sink), clock_(clock) {}
+  ~BoundedLines() override { tellLeftOut(); }
+  BoundedLines(const BoundedLines&) = delete;
+  BoundedLines& operator=(const BoundedLines&) = delete;
+
+  void line(std::string_view text) override;
+
+ private:
+  void tellLeftOut();
+
+  LineSink& sink_;
+  const Clock& clock_;
+  std::chrono::nanoseconds minuteBegan_{};
+  std::size_t lines_ = 0;
+  std::uint64_t leftOut_ = 0;
 };
 
 // The name of a level as it stands on the command line and in the log.

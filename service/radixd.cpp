@@ -11,6 +11,7 @@
 #include <utility>
 #include <vector>
 
+#include "platform/clock.h"
 #include "platform/event_loop.h"
 #include "radix/socket_path.h"
 #include "service/log.h"
@@ -144,7 +145,10 @@ int runRadixd(std::span<const std::string> arguments, LineSink& sink) {
     // Help and version arrive here too, as errors with status 0.
     return program.exit(error) == 0 ? 0 : usageError;
   }
-  ServiceLog log(sink, logLevel(options.logLevel).value_or(LogLevel::Info));
+  const LogLevel level = logLevel(options.logLevel).value_or(LogLevel::Info);
+  // Who wants to see everything is given everything.
+  BoundedLines bounded(sink, systemClock());
+  ServiceLog log(level == LogLevel::Debug ? sink : bounded, level);
   try {
     return serve(options, log);
   } catch (const std::exception& error) {

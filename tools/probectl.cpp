@@ -40,8 +40,8 @@ std::unique_ptr<CLI::App> makeProbectlGrammar(Tool& tool) {
   program->get_formatter()->column_width(36);
   program->footer(
       "Exit status: 0 done; 1 the answer is no (a payload does not decode, the service refuses or\n"
-      "is away, a file cannot be read); 2 the command line is not understood; 3 what was fed stops\n"
-      "the program.\n"
+      "is away, a file cannot be read, the disk is full); 2 the command line is not understood; 3 what\n"
+      "was fed stops the program.\n"
       "\n"
       "'probectl SUBCOMMAND --help' shows a subcommand's options with examples.");
   addSubcommands(*program, tool);

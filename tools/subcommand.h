@@ -26,7 +26,7 @@ namespace probeview {
 // The exit statuses of probectl; the manual page lists them.
 enum class ExitStatus : int {
   Success = 0,
-  Failure = 1,         // the answer is no: a payload does not decode, the service refuses or is away, a file is missing
+  Failure = 1,         // the answer is no: a payload does not decode, the service refuses, the disk is full …
   UsageError = 2,      // the command line is not understood
   BrokenContract = 3,  // what was fed stops the program (store --batch)
 };

@@ -6,6 +6,7 @@
 #include <memory>
 #include <vector>
 
+#include "platform/manual_loop.h"
 #include "service/last_records.h"
 #include "service/log.h"
 #include "service/plans.h"
@@ -97,6 +98,29 @@ TEST(ServiceLog, WritesWhatIsImportantEnoughAndALineStaysALine) {
   log.write(LogLevel::Info, "c");
   EXPECT_EQ(lines.lines,
             (std::vector<std::string>{"radixd: error: a", "radixd: warning: b?radixd: error: forged?[31m"}));
+}
+
+TEST(BoundedLines, AThousandLinesAMinuteAreHandedOnAndOfMoreOnlyTheNumber) {
+  ManualLoop clock;
+  KeptLines lines;
+  {
+    BoundedLines bounded(lines, clock);
+    for (int number = 0; number < 1000; ++number) bounded.line("a");
+    EXPECT_EQ(lines.lines.size(), 1000U);
+    bounded.line("b");
+    clock.advance(seconds(60) - nanoseconds(1));
+    bounded.line("b");
+    EXPECT_EQ(lines.lines.size(), 1000U);
+    clock.advance(nanoseconds(1));
+    bounded.line("c");
+    ASSERT_EQ(lines.lines.size(), 1002U);
+    EXPECT_EQ(lines.lines[1000],
+              "radixd: warning: 2 lines were left out here, as there were more than 1000 in a minute");
+    EXPECT_EQ(lines.lines[1001], "c");
+    for (int number = 0; number < 1000; ++number) bounded.line("d");
+    EXPECT_EQ(lines.lines.size(), 2001U);
+  }
+  EXPECT_EQ(lines.lines.back(), "radixd: warning: 1 line was left out here, as there were more than 1000 in a minute");
 }
 
 }  // namespace
