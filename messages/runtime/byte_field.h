@@ -3,12 +3,13 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <cstring>
 #include <span>
 #include <string_view>
 
-namespace probeview {
+#include "messages/runtime/block.h"
 
-class Block;
+namespace probeview {
 
 // The bytes or the text of one field; absent or present, and present even when empty. Texts keep their bytes as they
 // came, UTF-8 or not.
@@ -29,11 +30,27 @@ class PBByteField {
   // Copies the bytes, into memory of their own.
   void set(std::span<const std::uint8_t> bytes);
   // Copies the bytes into the block, which must outlive them.
-  void set(std::span<const std::uint8_t> bytes, Block& block);
+  void set(std::span<const std::uint8_t> bytes, Block& block) {
+    if (bytes.size() > longest) throwTooLong();
+    const std::uint8_t* data = noBytes;
+    if (!bytes.empty()) {
+      auto* copy = static_cast<std::uint8_t*>(block.allocate(bytes.size()));
+      std::memcpy(copy, bytes.data(), bytes.size());
+      data = copy;
+    }
+    if (ownsMemory_) clear();
+    data_ = data;
+    size_ = static_cast<std::uint32_t>(bytes.size());
+  }
   void clear() noexcept;
   bool ownsMemory() const noexcept { return ownsMemory_; }
 
  private:
+  static constexpr std::size_t longest = 0xFFFFFFFF;
+  // Where the bytes of an empty field lie: present is what has an address.
+  static constexpr std::uint8_t noBytes[1] = {};
+  [[noreturn]] static void throwTooLong();
+
   const std::uint8_t* data_ = nullptr;
   std::uint32_t size_ = 0;
   bool ownsMemory_ = false;

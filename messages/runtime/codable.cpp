@@ -6,8 +6,6 @@
 
 namespace probeview {
 
-bool PBCodable::readFrom(PBDataReader& reader) { return TableWalker::decode(*this, reader); }
-
 void PBCodable::writeTo(PBDataWriter& writer) const { TableWalker::encode(*this, writer); }
 
 Dictionary PBCodable::dictionaryRepresentation() const { return TableWalker::dictionary(*this, descriptor()); }

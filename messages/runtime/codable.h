@@ -65,6 +65,8 @@ class PBCodable {
 
  protected:
   PBCodable() noexcept = default;
+  // An element, which lies in the block.
+  explicit PBCodable(Block& block) noexcept : block_(&block), isElement_(true) {}
   PBCodable(const PBCodable&) noexcept {}  // the content is copied by the class, through its table
   PBCodable& operator=(const PBCodable&) = delete;
 
@@ -200,10 +202,6 @@ class PBCodable {
       block_->destroyLater(*this);
       isDestroyedLater_ = true;
     }
-  }
-  void becomeElement(Block& block) noexcept {
-    block_ = &block;
-    isElement_ = true;
   }
   // A deep copy of the other, which is of the same class, into this new message.
   void copyFrom(const PBCodable& other);

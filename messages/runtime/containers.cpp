@@ -15,17 +15,7 @@ void throwIndexOutOfRange(std::size_t index, std::size_t count) {
   throw std::out_of_range("idx (" + std::to_string(index) + ") is out of range (" + std::to_string(count) + ")");
 }
 
-namespace {
-
-// Where the bytes of an empty field lie: present is what has an address.
-constexpr std::uint8_t noBytes[1] = {};
-
-std::uint32_t checkedSize(std::span<const std::uint8_t> bytes) {
-  if (bytes.size() > 0xFFFFFFFF) throw std::length_error("a field has at most 4294967295 bytes");
-  return static_cast<std::uint32_t>(bytes.size());
-}
-
-}  // namespace
+void PBByteField::throwTooLong() { throw std::length_error("a field has at most 4294967295 bytes"); }
 
 PBByteField::PBByteField(PBByteField&& other) noexcept { *this = std::move(other); }
 
@@ -37,31 +27,18 @@ PBByteField& PBByteField::operator=(PBByteField&& other) noexcept {
 }
 
 void PBByteField::set(std::span<const std::uint8_t> bytes) {
-  const std::uint32_t size = checkedSize(bytes);
-  if (size == 0) {
+  if (bytes.size() > longest) throwTooLong();
+  if (bytes.empty()) {
     clear();
     data_ = noBytes;
     return;
   }
-  auto* copy = new std::uint8_t[size];
-  std::memcpy(copy, bytes.data(), size);
+  auto* copy = new std::uint8_t[bytes.size()];
+  std::memcpy(copy, bytes.data(), bytes.size());
   clear();
   data_ = copy;
-  size_ = size;
+  size_ = static_cast<std::uint32_t>(bytes.size());
   ownsMemory_ = true;
-}
-
-void PBByteField::set(std::span<const std::uint8_t> bytes, Block& block) {
-  const std::uint32_t size = checkedSize(bytes);
-  const std::uint8_t* data = noBytes;
-  if (size != 0) {
-    auto* copy = static_cast<std::uint8_t*>(block.allocate(size));
-    std::memcpy(copy, bytes.data(), size);
-    data = copy;
-  }
-  clear();
-  data_ = data;
-  size_ = size;
 }
 
 void PBByteField::clear() noexcept {

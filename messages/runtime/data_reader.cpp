@@ -10,15 +10,10 @@ std::uint8_t PBDataReader::readByte() noexcept {
 }
 
 std::uint64_t PBDataReader::readVarint() noexcept {
-  std::uint64_t value = 0;
-  const std::uint8_t* next = wire::readVarint(position_, limit_, value);
-  if (next == nullptr) {
-    hasError_ = true;
-    position_ = limit_;
-  } else {
-    position_ = next;
-  }
-  return value;
+  const wire::Varint varint = wire::readVarint(position_, limit_);
+  hasError_ = hasError_ || varint.next == nullptr;
+  position_ = varint.next == nullptr ? limit_ : varint.next;
+  return varint.value;
 }
 
 // The reader's operations stand outside its class, under the names that they have always had.

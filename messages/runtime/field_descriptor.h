@@ -64,13 +64,12 @@ union FieldMember {
   PBRepeatedInt32 PBCodable::*signed32List;
 };
 
-// Expected of a row that is not to be decoded. It is a key like any other, so whoever meets it in a payload must not
-// take it for such a row's.
-inline constexpr std::uint32_t neverRead = 0xFFFFFFFF;
+// A field that is not to be decoded expects this key, which is that of an end of group and is met before any field.
+inline constexpr std::uint32_t neverExpected = static_cast<std::uint32_t>(wire::WireType::EndGroup);
 
 struct FieldDescriptor {
-  std::uint32_t key = 0;          // as it is written: number and wire type
-  std::uint32_t expectedKey = 0;  // the same; neverRead where decoding drops the field
+  std::uint32_t key = 0;                      // as it stands on the wire: number and wire type
+  std::uint32_t expectedKey = neverExpected;  // the same where the field is to be decoded
   std::uint16_t number = 0;
   FieldKind kind = FieldKind::UInt64;
   FieldMember member;
@@ -79,13 +78,27 @@ struct FieldDescriptor {
   const MessageDescriptor* element = nullptr;     // of a nested message, single or repeated
 };
 
+// The part of a row that decoding needs while each field is the scalar that is expected next: short, so that the rows
+// of most messages lie in a few cache lines. There is one for each row, in the same order.
+struct ExpectedScalar {
+  // Stands where there is no such key: no one or two bytes make it.
+  static constexpr std::uint32_t none = 0xFFFFFFFF;
+
+  FieldMember member;
+  std::uint64_t hasBit = 0;
+  std::uint32_t shortKey = none;  // a key of one byte
+  std::uint32_t longKey = none;   // a key of two bytes, the first one in the low bits
+  FieldKind kind = FieldKind::UInt64;
+};
+
 // A field number is below this, so that the bits of all fields fit into one word.
 inline constexpr std::uint16_t fieldNumberLimit = 64;
 
 struct MessageDescriptor {
   std::string_view name;  // such as "KCellularLteTxPower"
-  // In ascending order of their numbers; one row that no key matches stands after the last.
+  // In ascending order of their numbers; one that is never met stands after the last.
   const FieldDescriptor* rows;
+  const ExpectedScalar* expected;
   std::uint16_t rowCount;
   // Where the field of that number stands in the rows; rowCount when there is none.
   std::array<std::uint8_t, fieldNumberLimit> rowOfNumber;

@@ -63,14 +63,35 @@ consteval auto collectFields() {
   [&]<std::size_t... Numbers>(std::index_sequence<Numbers...>) { (collect.template operator()<Numbers>(), ...); }
   (std::make_index_sequence<fieldNumberLimit>{});
   for (FieldDescriptor& row : rows) {
-    // A number that is also that of a metric must go the long way, where it is dropped.
-    row.expectedKey = row.key == 0 || KBBMetricUtility::isMetricId(row.number) ? neverRead : row.key;
+    // A number that is also that of a metric is dropped.
+    if (row.key != 0 && !KBBMetricUtility::isMetricId(row.number)) row.expectedKey = row.key;
   }
   return rows;
 }
 
 template <typename Message>
 inline constexpr auto fieldRows = collectFields<Message>();
+
+template <typename Message>
+consteval auto collectExpected() {
+  std::array<ExpectedScalar, fieldRows<Message>.size()> expected;
+  for (std::size_t index = 0; index < expected.size(); ++index) {
+    const FieldDescriptor& row = fieldRows<Message>[index];
+    if (!isScalar(row.kind) || row.expectedKey == neverExpected) continue;
+    expected[index].member = row.member;
+    expected[index].hasBit = std::uint64_t{1} << row.number;
+    expected[index].kind = row.kind;
+    if (row.key < 0x80) {
+      expected[index].shortKey = row.key;
+    } else {
+      expected[index].longKey = (row.key & 0x7F) | 0x80 | row.key >> 7 << 8;
+    }
+  }
+  return expected;
+}
+
+template <typename Message>
+inline constexpr auto expectedScalars = collectExpected<Message>();
 
 constexpr std::uint16_t scalarBound(const FieldDescriptor& row) noexcept {
   const std::size_t keySize = wire::varintSize(row.key);
@@ -101,6 +122,7 @@ consteval MessageDescriptor describeMessage(std::string_view name) {
   MessageDescriptor descriptor{};
   descriptor.name = name;
   descriptor.rows = fieldRows<Message>.data();
+  descriptor.expected = expectedScalars<Message>.data();
   descriptor.rowCount = count;
   descriptor.rowOfNumber.fill(count);
   descriptor.isFlat = true;
@@ -121,32 +143,29 @@ consteval MessageDescriptor describeMessage(std::string_view name) {
 
 // Macros, because a row must make names: of a member, of its accessors and of its descriptor.
 
-#define PB_MESSAGE(Class)                                                                                \
- public:                                                                                                 \
-  Class() noexcept = default;                                                                            \
-  Class(const Class& other) : PBCodable() { copyFrom(other); }                                           \
-  Class(Class&& other) noexcept : PBCodable() { moveFrom(other); }                                       \
-  Class& operator=(const Class& other) {                                                                 \
-    assignFrom(other);                                                                                   \
-    return *this;                                                                                        \
-  }                                                                                                      \
-  static const ::probeview::MessageDescriptor pbDescriptor;                                              \
-  const ::probeview::MessageDescriptor& descriptor() const noexcept override;                            \
-  std::unique_ptr<Class> copyWithZone() const { return std::make_unique<Class>(*this); }                 \
-  void copyTo(Class& target) const { PBCodable::copyTo(target); }                                        \
-  void mergeFrom(const Class& other) { PBCodable::mergeFrom(other); }                                    \
-  friend bool operator==(const Class& left, const Class& right) noexcept { return left.isEqual(right); } \
-  static Class* make(void* memory, ::probeview::Block& block) noexcept {                                 \
-    auto* element = new (memory) Class;                                                                  \
-    element->becomeElement(block);                                                                       \
-    return element;                                                                                      \
-  }                                                                                                      \
-  static void renew(Class& message) noexcept {                                                           \
-    message.~Class();                                                                                    \
-    new (&message) Class;                                                                                \
-  }                                                                                                      \
-                                                                                                         \
- private:                                                                                                \
+#define PB_MESSAGE(Class)                                                                                    \
+ public:                                                                                                     \
+  Class() noexcept = default;                                                                                \
+  Class(const Class& other) : PBCodable() { copyFrom(other); }                                               \
+  Class(Class&& other) noexcept : PBCodable() { moveFrom(other); }                                           \
+  Class& operator=(const Class& other) {                                                                     \
+    assignFrom(other);                                                                                       \
+    return *this;                                                                                            \
+  }                                                                                                          \
+  static const ::probeview::MessageDescriptor pbDescriptor;                                                  \
+  const ::probeview::MessageDescriptor& descriptor() const noexcept override;                                \
+  std::unique_ptr<Class> copyWithZone() const { return std::make_unique<Class>(*this); }                     \
+  void copyTo(Class& target) const { PBCodable::copyTo(target); }                                            \
+  void mergeFrom(const Class& other) { PBCodable::mergeFrom(other); }                                        \
+  friend bool operator==(const Class& left, const Class& right) noexcept { return left.isEqual(right); }     \
+  static Class* make(void* memory, ::probeview::Block& block) noexcept { return new (memory) Class(block); } \
+  static void renew(Class& message) noexcept {                                                               \
+    message.~Class();                                                                                        \
+    new (&message) Class;                                                                                    \
+  }                                                                                                          \
+                                                                                                             \
+ private:                                                                                                    \
+  explicit Class(::probeview::Block& block) noexcept : PBCodable(block) {}                                   \
   using Self = Class;
 
 #define PB_DEFINE(Class)                                               \

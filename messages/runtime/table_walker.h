@@ -38,9 +38,19 @@ struct TableWalker {
 
  private:
   struct Decoding;
-  struct HasBits;
-  static const std::uint8_t* decodeFields(PBCodable& message, const MessageDescriptor& descriptor,
+  struct Progress;
+  template <int KeySize>
+  static Progress decodeRun(PBCodable& message, Progress progress, const std::uint8_t* limit, const std::uint8_t* tail,
+                            std::uint64_t& hasBits) noexcept;
+  static Progress decodeExpected(PBCodable& message, Progress progress, const std::uint8_t* limit,
+                                 const Decoding& decoding) noexcept;
+  static const std::uint8_t* decodeRecord(PBCodable& message, const MessageDescriptor& descriptor,
                                           const std::uint8_t* position, const std::uint8_t* limit, Decoding& decoding);
+  static const std::uint8_t* decodeElements(PBMessageList& list, const FieldDescriptor& row,
+                                            const std::uint8_t* position, const std::uint8_t* limit,
+                                            Decoding& decoding);
+  static const std::uint8_t* decodeOthers(PBCodable& message, const MessageDescriptor& descriptor, Progress progress,
+                                          const std::uint8_t* limit, Decoding& decoding);
   static void encodeFields(const PBCodable& message, const MessageDescriptor& descriptor, PBDataWriter& writer);
   static PBCodable* makeElement(const MessageDescriptor& descriptor, Block& block) {
     return descriptor.makeElement(block.allocate(descriptor.size), block);

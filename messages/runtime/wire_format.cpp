@@ -3,33 +3,35 @@
 
 namespace probeview::wire {
 
-const std::uint8_t* readLongVarint(const std::uint8_t* position, const std::uint8_t* limit,
-                                   std::uint64_t& value) noexcept {
+Varint readLongVarint(const std::uint8_t* position, const std::uint8_t* limit) noexcept {
   const std::ptrdiff_t available = limit - position;
+  if (available >= 8) {
+    const Varint varint = readUpToEightBytes(position);
+    if (varint.next != nullptr) return varint;
+  }
   const int readable = available < static_cast<std::ptrdiff_t>(longestVarint) ? static_cast<int>(available)
                                                                               : static_cast<int>(longestVarint);
   std::uint64_t result = 0;
   for (int index = 0; index < readable; ++index) {
     const std::uint64_t byte = position[index];
     result |= (byte & 0x7F) << (7 * index);
-    if (byte < 0x80) {
-      value = result;
-      return position + index + 1;
-    }
+    if (byte < 0x80) return {position + index + 1, result};
   }
-  value = 0;
-  return readable == static_cast<int>(longestVarint) ? position + longestVarint : nullptr;
+  return {readable == static_cast<int>(longestVarint) ? position + longestVarint : nullptr, 0};
 }
 
 const std::uint8_t* skipValue(const std::uint8_t* position, const std::uint8_t* limit, std::uint32_t type) noexcept {
   std::uint64_t size = 0;
   switch (static_cast<WireType>(type)) {
     case WireType::Varint:
-      return readVarint(position, limit, size);
-    case WireType::LengthDelimited:
-      position = readVarint(position, limit, size);
-      if (position == nullptr) return nullptr;
+      return readVarint(position, limit).next;
+    case WireType::LengthDelimited: {
+      const Varint length = readVarint(position, limit);
+      if (length.next == nullptr) return nullptr;
+      position = length.next;
+      size = length.value;
       break;
+    }
     case WireType::Fixed64:
       size = 8;
       break;

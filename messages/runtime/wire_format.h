@@ -34,20 +34,40 @@ constexpr std::int32_t unZigZag(std::uint32_t value) noexcept {
   return static_cast<std::int32_t>(value >> 1 ^ (0U - (value & 1U)));
 }
 
-// What readVarint() does for a varint of more than one byte, or for none at all.
-const std::uint8_t* readLongVarint(const std::uint8_t* position, const std::uint8_t* limit,
-                                   std::uint64_t& value) noexcept;
+// A varint and the position behind it; null, and the value 0, when the data ends inside it.
+struct Varint {
+  const std::uint8_t* next;
+  std::uint64_t value;
+};
 
-// Reads a varint of at most ten bytes and returns the position after it; null, and the value 0, when the data ends
-// inside it. Bits past the 64th are dropped. A varint whose tenth byte still asks for another one reads as 0, which is
-// no error: what follows is read as if nothing had happened, so that one odd number does not cost the whole record.
-inline const std::uint8_t* readVarint(const std::uint8_t* position, const std::uint8_t* limit,
-                                      std::uint64_t& value) noexcept {
-  if (position < limit && *position < 0x80) {
-    value = *position;
-    return position + 1;
+// What readVarint() does for a varint of more than one byte, or for none at all.
+Varint readLongVarint(const std::uint8_t* position, const std::uint8_t* limit) noexcept;
+
+// A varint of at most eight bytes, read at once; null when it is longer. Eight bytes must be readable.
+inline Varint readUpToEightBytes(const std::uint8_t* position) noexcept {
+  std::uint64_t bits = 0;
+  if constexpr (std::endian::native == std::endian::little) {
+    std::memcpy(&bits, position, sizeof bits);
+  } else {
+    for (int index = 7; index >= 0; --index) bits = bits << 8 | position[index];
   }
-  return readLongVarint(position, limit, value);
+  // The first byte whose top bit is clear is the last one; what lies above it belongs to others.
+  const std::uint64_t ends = ~bits & 0x8080808080808080U;
+  if (ends == 0) return {nullptr, 0};
+  bits &= (ends ^ (ends - 1)) & 0x7F7F7F7F7F7F7F7FU;
+  // Seven bits of each byte move together: pairs, fours, all eight.
+  bits = (bits & 0x007F007F007F007FU) | (bits & 0x7F007F007F007F00U) >> 1;
+  bits = (bits & 0x00003FFF00003FFFU) | (bits & 0x3FFF00003FFF0000U) >> 2;
+  bits = (bits & 0x000000000FFFFFFFU) | (bits & 0x0FFFFFFF00000000U) >> 4;
+  return {position + (std::countr_zero(ends) + 1) / 8, bits};
+}
+
+// Reads a varint of at most ten bytes. Bits past the 64th are dropped. A varint whose tenth byte still asks for another
+// one reads as 0, which is no error: what follows is read as if nothing had happened, so that one odd number does not
+// cost the whole record.
+inline Varint readVarint(const std::uint8_t* position, const std::uint8_t* limit) noexcept {
+  if (position < limit && *position < 0x80) return {position + 1, *position};
+  return readLongVarint(position, limit);
 }
 
 // Skips one value of the given wire type (the low three bits of a key) and returns the position after it; null when the
