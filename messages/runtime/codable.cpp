@@ -6,8 +6,6 @@
 
 namespace probeview {
 
-void PBCodable::writeTo(PBDataWriter& writer) const { TableWalker::encode(*this, writer); }
-
 Dictionary PBCodable::dictionaryRepresentation() const { return TableWalker::dictionary(*this, descriptor()); }
 
 std::string PBCodable::description() const {

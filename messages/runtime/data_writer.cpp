@@ -19,17 +19,15 @@ void PBDataWriter::grow(std::size_t count) {
   buffer_.resize(std::max({std::size_t{256}, 2 * buffer_.size(), size_ + count}));
 }
 
-void PBDataWriter::closeRecord(std::size_t offset) {
-  const std::size_t content = offset + 1;
-  const std::size_t length = size_ - content;
-  // Most records are shorter than 128 bytes and their length fits where it was left room; others move up.
+std::uint8_t* PBDataWriter::closeLongRecord(std::uint8_t* position, std::size_t offset) {
+  const std::size_t length = offsetOf(position) - offset - 1;
+  // What has been written moves up for the rest of its length.
   const std::size_t extra = wire::varintSize(length) - 1;
-  if (extra != 0) {
-    reserve(extra);
-    std::memmove(buffer_.data() + content + extra, buffer_.data() + content, length);
-    size_ += extra;
-  }
-  wire::writeVarint(buffer_.data() + offset, length);
+  position = reserve(position, extra);
+  std::uint8_t* record = buffer_.data() + offset;
+  std::memmove(record + 1 + extra, record + 1, length);
+  wire::writeVarint(record, length);
+  return position + extra;
 }
 
 namespace {
@@ -95,6 +93,8 @@ void PBDataWriterPlaceMark(PBDataWriter& writer, PBWriterMark& mark, std::uint32
   writer.commit(out + 1);
 }
 
-void PBDataWriterRecallMark(PBDataWriter& writer, const PBWriterMark& mark) { writer.closeRecord(mark.offset); }
+void PBDataWriterRecallMark(PBDataWriter& writer, const PBWriterMark& mark) {
+  writer.commit(writer.closeRecord(writer.reserve(0), mark.offset));
+}
 
 }  // namespace probeview

@@ -31,12 +31,29 @@ class PBDataWriter {
     if (buffer_.size() - size_ < count) grow(count);
     return buffer_.data() + size_;
   }
-  void commit(const std::uint8_t* end) noexcept { size_ = static_cast<std::size_t>(end - buffer_.data()); }
-  // Closes a length-delimited record that began at the offset with one byte kept free for its length.
-  void closeRecord(std::size_t offset);
+  // The same in the middle of writing: the position that has been reached, which may have moved, with that room behind.
+  std::uint8_t* reserve(std::uint8_t* position, std::size_t count) {
+    if (static_cast<std::size_t>(buffer_.data() + buffer_.size() - position) >= count) return position;
+    commit(position);
+    return reserve(count);
+  }
+  void commit(const std::uint8_t* end) noexcept { size_ = offsetOf(end); }
+  std::size_t offsetOf(const std::uint8_t* position) const noexcept {
+    return static_cast<std::size_t>(position - buffer_.data());
+  }
+  // Closes a length-delimited record that began at the offset, with one byte kept free for its length, and ends at the
+  // position. Returns the position behind the record, which may have moved.
+  std::uint8_t* closeRecord(std::uint8_t* position, std::size_t offset) {
+    const std::size_t length = offsetOf(position) - offset - 1;
+    // Most records are shorter than 128 bytes and their length fits where it was left room.
+    if (length >= 0x80) return closeLongRecord(position, offset);
+    buffer_[offset] = static_cast<std::uint8_t>(length);
+    return position;
+  }
 
  private:
   void grow(std::size_t count);
+  std::uint8_t* closeLongRecord(std::uint8_t* position, std::size_t offset);
 
   std::vector<std::uint8_t> buffer_;  // its size is the room that there is
   std::size_t size_ = 0;

@@ -18,7 +18,7 @@ struct TableWalker::Decoding {
 // How far a record has been decoded, and which field is expected next.
 struct TableWalker::Progress {
   const std::uint8_t* position;
-  const ExpectedScalar* expected;
+  const ScalarRow* expected;
 };
 
 namespace {
@@ -74,9 +74,9 @@ inline const std::uint8_t* readKey(const std::uint8_t* position, const std::uint
 // A scalar from its varint. Inline, because it is most of what the loop over expected fields does.
 [[gnu::always_inline]] inline void storeScalar(PBCodable& message, FieldKind kind, const FieldMember& member,
                                                std::uint64_t value) noexcept {
-  if (kind == FieldKind::UInt32) {
+  if (kind == FieldKind::UInt32) [[likely]] {
     message.*member.unsigned32 = static_cast<std::uint32_t>(value);
-  } else if (kind == FieldKind::SInt32) {
+  } else if (kind == FieldKind::SInt32) [[likely]] {
     message.*member.signed32 = wire::unZigZag(static_cast<std::uint32_t>(value));
   } else if (kind == FieldKind::UInt64) {
     message.*member.unsigned64 = value;
@@ -89,7 +89,7 @@ inline const std::uint8_t* readKey(const std::uint8_t* position, const std::uint
 
 // Whether the key that stands at the position is that of the scalar.
 template <int KeySize>
-bool isNext(const ExpectedScalar& scalar, const std::uint8_t* position) noexcept {
+bool isNext(const ScalarRow& scalar, const std::uint8_t* position) noexcept {
   if constexpr (KeySize == 1) return position[0] == scalar.shortKey;
   return static_cast<std::uint32_t>(position[0] | position[1] << 8) == scalar.longKey;
 }
@@ -114,10 +114,12 @@ bool TableWalker::decode(PBCodable& message, PBDataReader& reader) {
 }
 
 // Decodes a message from the position to the limit. Returns the position at which that ended, null when it failed.
-inline const std::uint8_t* TableWalker::decodeRecord(PBCodable& message, const MessageDescriptor& descriptor,
-                                                     const std::uint8_t* position, const std::uint8_t* limit,
-                                                     Decoding& decoding) {
-  const Progress progress = decodeExpected(message, {position, descriptor.expected}, limit, decoding);
+[[gnu::always_inline]] inline const std::uint8_t* TableWalker::decodeRecord(PBCodable& message,
+                                                                            const MessageDescriptor& descriptor,
+                                                                            const std::uint8_t* position,
+                                                                            const std::uint8_t* limit,
+                                                                            Decoding& decoding) {
+  const Progress progress = decodeExpected(message, {position, descriptor.scalars}, limit, decoding);
   if (progress.position == limit) return limit;
   return decodeOthers(message, descriptor, progress, limit, decoding);
 }
@@ -131,12 +133,12 @@ template <int KeySize>
   // Before the tail nothing is asked byte by byte.
   const std::uint8_t* const stop = limit < tail ? limit : tail;
   while (progress.position < stop && isNext<KeySize>(*progress.expected, progress.position)) {
-    const ExpectedScalar& scalar = *progress.expected;
+    const ScalarRow& scalar = *progress.expected;
     const std::uint8_t* next = progress.position + KeySize + 1;
     std::uint64_t value = next[-1];
-    if (value >= 0x80) {
+    if (value >= 0x80) [[unlikely]] {
       const std::uint64_t second = *next++;
-      if (second < 0x80) {
+      if (second < 0x80) [[likely]] {
         value += (second << 7) - 0x80;
       } else {
         if (tail - progress.position < roomForLongValue) break;
@@ -154,7 +156,7 @@ template <int KeySize>
   // In the tail the same, with care, for scalars of one byte.
   while (limit - progress.position > KeySize && isNext<KeySize>(*progress.expected, progress.position) &&
          progress.position[KeySize] < 0x80) {
-    const ExpectedScalar& scalar = *progress.expected;
+    const ScalarRow& scalar = *progress.expected;
     storeScalar(message, scalar.kind, scalar.member, progress.position[KeySize]);
     hasBits |= scalar.hasBit;
     progress = {progress.position + KeySize + 1, progress.expected + 1};
@@ -171,7 +173,7 @@ template <int KeySize>
                                                                                 const Decoding& decoding) noexcept {
   std::uint64_t hasBits = 0;
   progress = decodeRun<1>(message, progress, limit, decoding.tail, hasBits);
-  if (progress.expected->longKey != ExpectedScalar::none)
+  if (progress.expected->longKey != ScalarRow::none)
     progress = decodeRun<2>(message, progress, limit, decoding.tail, hasBits);
   message._has |= hasBits;
   return progress;
@@ -202,7 +204,7 @@ const std::uint8_t* TableWalker::decodeOthers(PBCodable& message, const MessageD
     if (key.next == nullptr) return nullptr;
     const std::uint8_t* position = key.next;
     if ((key.value & 7) == static_cast<unsigned>(wire::WireType::EndGroup)) return position;
-    const FieldDescriptor* row = descriptor.rows + (progress.expected - descriptor.expected);
+    const FieldDescriptor* row = descriptor.rows + (progress.expected - descriptor.scalars);
     if (key.value != row->expectedKey) {
       // Only 16 bits of a field number count.
       const auto number = static_cast<std::uint16_t>(key.value >> 3);
@@ -271,7 +273,7 @@ const std::uint8_t* TableWalker::decodeOthers(PBCodable& message, const MessageD
         break;
     }
     if (position == nullptr) return nullptr;
-    progress = {position, descriptor.expected + (row - descriptor.rows) + 1};
+    progress = {position, descriptor.scalars + (row - descriptor.rows) + 1};
     if (position < limit) progress = decodeExpected(message, progress, limit, decoding);
   }
   return progress.position;

@@ -78,18 +78,25 @@ struct FieldDescriptor {
   const MessageDescriptor* element = nullptr;     // of a nested message, single or repeated
 };
 
-// The part of a row that decoding needs while each field is the scalar that is expected next: short, so that the rows
-// of most messages lie in a few cache lines. There is one for each row, in the same order.
-struct ExpectedScalar {
+// The part of a row that decoding and encoding need of a scalar: short, so that the rows of most messages lie in a few
+// cache lines. There is one for each row, in the same order.
+struct ScalarRow {
   // Stands where there is no such key: no one or two bytes make it.
   static constexpr std::uint32_t none = 0xFFFFFFFF;
 
   FieldMember member;
-  std::uint64_t hasBit = 0;
-  std::uint32_t shortKey = none;  // a key of one byte
-  std::uint32_t longKey = none;   // a key of two bytes, the first one in the low bits
-  FieldKind kind = FieldKind::UInt64;
+  std::uint64_t hasBit = 0;  // 0 where the field is no scalar
+  // The keys that decoding expects, of one byte or of two, the first one in the low bits.
+  std::uint32_t shortKey = none;
+  std::uint32_t longKey = none;
+  // The key that encoding writes, one byte or two.
+  std::uint16_t keyBytes = 0;
+  std::uint8_t keySize = 0;
+  FieldKind kind = FieldKind::RepeatedMessage;
 };
+
+// How many bytes more than it needs the last scalar may write over when it is written as a word of eight bytes.
+inline constexpr std::uint16_t wordSlack = 7;
 
 // A field number is below this, so that the bits of all fields fit into one word.
 inline constexpr std::uint16_t fieldNumberLimit = 64;
@@ -98,11 +105,12 @@ struct MessageDescriptor {
   std::string_view name;  // such as "KCellularLteTxPower"
   // In ascending order of their numbers; one that is never met stands after the last.
   const FieldDescriptor* rows;
-  const ExpectedScalar* expected;
+  const ScalarRow* scalars;
   std::uint16_t rowCount;
+  std::uint16_t shortRowCount;  // how many of them, at the front, have keys of one byte
   // Where the field of that number stands in the rows; rowCount when there is none.
   std::array<std::uint8_t, fieldNumberLimit> rowOfNumber;
-  std::uint16_t scalarBound;  // what all scalar fields of one message together take on the wire, at most
+  std::uint16_t scalarBound;  // bytes that must be free to write all scalars of one message
   bool isFlat;                // scalars only: nothing that owns memory
   std::size_t size;           // bytes of an object
   // Makes a message in memory of the given block, to which it belongs from then on.

@@ -73,25 +73,25 @@ template <typename Message>
 inline constexpr auto fieldRows = collectFields<Message>();
 
 template <typename Message>
-consteval auto collectExpected() {
-  std::array<ExpectedScalar, fieldRows<Message>.size()> expected;
-  for (std::size_t index = 0; index < expected.size(); ++index) {
+consteval auto collectScalars() {
+  std::array<ScalarRow, fieldRows<Message>.size()> scalars;
+  for (std::size_t index = 0; index + 1 < scalars.size(); ++index) {
     const FieldDescriptor& row = fieldRows<Message>[index];
-    if (!isScalar(row.kind) || row.expectedKey == neverExpected) continue;
-    expected[index].member = row.member;
-    expected[index].hasBit = std::uint64_t{1} << row.number;
-    expected[index].kind = row.kind;
-    if (row.key < 0x80) {
-      expected[index].shortKey = row.key;
-    } else {
-      expected[index].longKey = (row.key & 0x7F) | 0x80 | row.key >> 7 << 8;
-    }
+    ScalarRow& scalar = scalars[index];
+    scalar.kind = row.kind;
+    if (!isScalar(row.kind)) continue;
+    const bool isShort = row.key < 0x80;
+    scalar.member = row.member;
+    scalar.hasBit = std::uint64_t{1} << row.number;
+    scalar.keyBytes = static_cast<std::uint16_t>(isShort ? row.key : (row.key & 0x7F) | 0x80 | row.key >> 7 << 8);
+    scalar.keySize = isShort ? 1 : 2;
+    if (row.expectedKey != neverExpected) (isShort ? scalar.shortKey : scalar.longKey) = scalar.keyBytes;
   }
-  return expected;
+  return scalars;
 }
 
 template <typename Message>
-inline constexpr auto expectedScalars = collectExpected<Message>();
+inline constexpr auto scalarRows = collectScalars<Message>();
 
 constexpr std::uint16_t scalarBound(const FieldDescriptor& row) noexcept {
   const std::size_t keySize = wire::varintSize(row.key);
@@ -122,15 +122,17 @@ consteval MessageDescriptor describeMessage(std::string_view name) {
   MessageDescriptor descriptor{};
   descriptor.name = name;
   descriptor.rows = fieldRows<Message>.data();
-  descriptor.expected = expectedScalars<Message>.data();
+  descriptor.scalars = scalarRows<Message>.data();
   descriptor.rowCount = count;
   descriptor.rowOfNumber.fill(count);
+  descriptor.scalarBound = wordSlack;
   descriptor.isFlat = true;
   for (std::size_t index = 0; index < count; ++index) {
     const FieldDescriptor& row = fieldRows<Message>[index];
     descriptor.rowOfNumber[row.number] = static_cast<std::uint8_t>(index);
     descriptor.scalarBound = static_cast<std::uint16_t>(descriptor.scalarBound + scalarBound(row));
     if (!isScalar(row.kind)) descriptor.isFlat = false;
+    if (row.key < 0x80) ++descriptor.shortRowCount;
   }
   descriptor.size = sizeof(Message);
   descriptor.makeElement = [](void* memory, Block& block) -> PBCodable* { return Message::make(memory, block); };

@@ -51,7 +51,20 @@ struct TableWalker {
                                             Decoding& decoding);
   static const std::uint8_t* decodeOthers(PBCodable& message, const MessageDescriptor& descriptor, Progress progress,
                                           const std::uint8_t* limit, Decoding& decoding);
-  static void encodeFields(const PBCodable& message, const MessageDescriptor& descriptor, PBDataWriter& writer);
+  struct Output;
+  template <unsigned KeySize>
+  static Output encodeRun(const PBCodable& message, Output output, const ScalarRow* end) noexcept;
+  static Output encodeScalars(const PBCodable& message, const MessageDescriptor& descriptor, Output output) noexcept;
+  static std::uint8_t* encodeFields(const PBCodable& message, const MessageDescriptor& descriptor, std::uint8_t* out,
+                                    PBDataWriter& writer);
+  static std::uint8_t* encodeBytes(std::span<const std::uint8_t> bytes, const FieldDescriptor& row, std::uint8_t* out,
+                                   std::size_t room, PBDataWriter& writer);
+  static std::uint8_t* encodeElement(const PBCodable& element, const FieldDescriptor& row, std::uint8_t* out,
+                                     PBDataWriter& writer);
+  static std::uint8_t* encodeElements(const PBMessageList& list, const FieldDescriptor& row, std::uint8_t* out,
+                                      PBDataWriter& writer);
+  static std::uint8_t* encodeObject(const PBCodable& message, const FieldDescriptor& row, std::uint8_t* out,
+                                    PBDataWriter& writer);
   static PBCodable* makeElement(const MessageDescriptor& descriptor, Block& block) {
     return descriptor.makeElement(block.allocate(descriptor.size), block);
   }
