@@ -22,6 +22,7 @@ Key& Key::operator=(Key&& other) noexcept {
   std::swap(data_, other.data_);
   std::swap(size_, other.size_);
   std::swap(owned_, other.owned_);
+  std::swap(isFramed_, other.isFramed_);
   return *this;
 }
 

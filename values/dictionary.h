@@ -4,13 +4,14 @@
 // on a log line and of the keys in JSON.
 #pragma once
 
+#include <algorithm>
 #include <cstddef>
 #include <cstdint>
 #include <initializer_list>
 #include <string_view>
 #include <utility>
-#include <vector>
 
+#include "values/sequence.h"
 #include "values/value.h"
 
 namespace probeview {
@@ -24,12 +25,22 @@ class Key {
   // A text that lives as long as the process, such as a key of a field table.
   static Key constant(std::string_view text) noexcept { return Key(text); }
   static Key copy(std::string_view text);
+  // The same as a constant, for a text that stands in memory as it is printed: behind a quotation mark and before one,
+  // a colon and a blank, with nothing in it to escape. It is printed by copying.
+  static Key framed(std::string_view text) noexcept {
+    Key key(text);
+    key.isFramed_ = true;
+    return key;
+  }
 
-  Key(const Key& other) : data_(other.data_), size_(other.size_), owned_(false) {
+  Key(const Key& other) : data_(other.data_), size_(other.size_), owned_(false), isFramed_(other.isFramed_) {
     if (other.owned_) *this = copy(other.text());
   }
   Key(Key&& other) noexcept
-      : data_(other.data_), size_(std::exchange(other.size_, 0)), owned_(std::exchange(other.owned_, false)) {}
+      : data_(other.data_),
+        size_(std::exchange(other.size_, 0)),
+        owned_(std::exchange(other.owned_, false)),
+        isFramed_(std::exchange(other.isFramed_, false)) {}
   Key& operator=(const Key& other);
   Key& operator=(Key&& other) noexcept;
   ~Key() {
@@ -37,6 +48,7 @@ class Key {
   }
 
   std::string_view text() const noexcept { return {data_, size_}; }
+  bool isFramed() const noexcept { return isFramed_; }
   friend bool operator==(const Key& left, const Key& right) noexcept { return left.text() == right.text(); }
 
  private:
@@ -46,17 +58,24 @@ class Key {
   const char* data_;
   std::uint32_t size_;
   bool owned_;
+  bool isFramed_ = false;
 };
 
 class List {
  public:
   List() = default;
-  List(std::initializer_list<Value> values) : values_(values) {}
+  List(std::initializer_list<Value> values) {
+    values_.reserve(values.size());
+    for (const Value& value : values) values_.append(value);
+  }
 
   std::size_t size() const noexcept { return values_.size(); }
-  bool empty() const noexcept { return values_.empty(); }
+  bool empty() const noexcept { return values_.size() == 0; }
   void reserve(std::size_t count) { values_.reserve(count); }
-  void append(Value value) { values_.push_back(std::move(value)); }
+  template <typename Content>
+  void append(Content&& content) {
+    values_.append(std::forward<Content>(content));
+  }
   void clear() noexcept { values_.clear(); }
 
   // The index must be below size().
@@ -68,10 +87,12 @@ class List {
   auto begin() noexcept { return values_.begin(); }
   auto end() noexcept { return values_.end(); }
 
-  friend bool operator==(const List& left, const List& right) noexcept { return left.values_ == right.values_; }
+  friend bool operator==(const List& left, const List& right) noexcept {
+    return std::equal(left.begin(), left.end(), right.begin(), right.end());
+  }
 
  private:
-  std::vector<Value> values_;
+  Sequence<Value> values_;
 };
 
 class Dictionary {
@@ -85,7 +106,7 @@ class Dictionary {
   Dictionary(std::initializer_list<Entry> entries);
 
   std::size_t size() const noexcept { return entries_.size(); }
-  bool empty() const noexcept { return entries_.empty(); }
+  bool empty() const noexcept { return entries_.size() == 0; }
   void reserve(std::size_t count) { entries_.reserve(count); }
   void clear() noexcept { entries_.clear(); }
 
@@ -97,7 +118,11 @@ class Dictionary {
   // Replaces the value in its place, or adds the entry at the end.
   void set(Key key, Value value);
   // Adds an entry whose key is known not to be there; saves the search.
-  void append(Key key, Value value) { entries_.push_back({std::move(key), std::move(value)}); }
+  // The value is made in its place from anything that a value can be made from.
+  template <typename Content>
+  void append(Key key, Content&& content) {
+    entries_.append(std::move(key), std::forward<Content>(content));
+  }
 
   // Entries in the order of insertion; the index must be below size().
   const Entry& operator[](std::size_t index) const noexcept { return entries_[index]; }
@@ -110,7 +135,7 @@ class Dictionary {
   friend bool operator==(const Dictionary& left, const Dictionary& right) noexcept;
 
  private:
-  std::vector<Entry> entries_;
+  Sequence<Entry> entries_;
 };
 
 }  // namespace probeview

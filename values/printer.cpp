@@ -2,6 +2,7 @@
 #include "values/printer.h"
 
 #include <algorithm>
+#include <array>
 #include <charconv>
 #include <cmath>
 #include <cstdint>
@@ -43,8 +44,27 @@ class Writer {
     if (!text.empty()) std::memcpy(to, text.data(), text.size());
     return to + text.size();
   }
+  // The same for keys, names and digits, most of which are short: copied as two pieces that overlap, without a call.
+  static char* appendShort(char* to, std::string_view text) {
+    const std::size_t size = text.size();
+    if (size - 8 <= 8) {
+      copyBothEnds<8>(to, text);
+    } else if (size - 16 <= 16) {
+      copyBothEnds<16>(to, text);
+    } else if (size - 32 <= 32) {
+      copyBothEnds<32>(to, text);
+    } else {
+      return append(to, text);
+    }
+    return to + size;
+  }
 
  private:
+  template <std::size_t Piece>
+  static void copyBothEnds(char* to, std::string_view text) {
+    std::memcpy(to, text.data(), Piece);
+    std::memcpy(to + text.size() - Piece, text.data() + text.size() - Piece, Piece);
+  }
   void seat(std::size_t used, std::size_t more) {
     out_.resize(used + more);
     position_ = out_.data() + used;
@@ -71,11 +91,55 @@ void printReal(Real number, Writer& out) {
   out.advanceTo(end);
 }
 
+// "00" to "99", one after the other.
+constexpr auto digitPairs = [] {
+  std::array<char, 200> pairs{};
+  for (std::size_t number = 0; number < 100; ++number) {
+    pairs[2 * number] = static_cast<char>('0' + number / 10);
+    pairs[2 * number + 1] = static_cast<char>('0' + number % 10);
+  }
+  return pairs;
+}();
+
+constexpr std::size_t longestInteger = 20;
+
+// Twenty characters must be free.
+inline char* writeInteger(char* to, std::uint64_t number) {
+  const auto putPair = [](char* at, std::uint64_t pair) { std::memcpy(at, digitPairs.data() + 2 * pair, 2); };
+  if (number < 10) {
+    *to = static_cast<char>('0' + number);
+    return to + 1;
+  }
+  if (number < 100) {
+    putPair(to, number);
+    return to + 2;
+  }
+  char digits[longestInteger];
+  char* begin = digits + sizeof digits;
+  while (number >= 100) {
+    begin -= 2;
+    putPair(begin, number % 100);
+    number /= 100;
+  }
+  if (number >= 10) {
+    begin -= 2;
+    putPair(begin, number);
+  } else {
+    *--begin = static_cast<char>('0' + number);
+  }
+  return Writer::appendShort(to, std::string_view(begin, static_cast<std::size_t>(digits + sizeof digits - begin)));
+}
+
+inline char* writeInteger(char* to, std::int64_t number) {
+  if (number >= 0) return writeInteger(to, static_cast<std::uint64_t>(number));
+  *to = '-';
+  // Negated as an unsigned number, so that the least one has its magnitude too.
+  return writeInteger(to + 1, 0 - static_cast<std::uint64_t>(number));
+}
+
 template <typename Integer>
 void printInteger(Integer number, Writer& out) {
-  constexpr std::size_t longest = 24;
-  char* const begin = out.room(longest);
-  out.advanceTo(std::to_chars(begin, begin + longest, number).ptr);
+  out.advanceTo(writeInteger(out.room(longestInteger + 1), number));
 }
 
 struct Utf8Step {
@@ -172,14 +236,16 @@ void putEscaped(char character, Writer& out) {
   out.advanceTo(Writer::append(end, '}'));
 }
 
+// A text that needs no escape.
+void putUnescaped(std::string_view text, Writer& out) {
+  char* to = Writer::append(out.room(text.size() + 2), '"');
+  out.advanceTo(Writer::append(Writer::appendShort(to, text), '"'));
+}
+
 void putQuoted(std::string_view text, Writer& out) {
   std::size_t begin = 0;
   std::size_t index = findEscape(text, 0);
-  if (index == text.size()) {
-    char* to = Writer::append(out.room(text.size() + 2), '"');
-    out.advanceTo(Writer::append(Writer::append(to, text), '"'));
-    return;
-  }
+  if (index == text.size()) return putUnescaped(text, out);
   out.put('"');
   while (index < text.size()) {
     out.put(text.substr(begin, index - begin));
@@ -198,13 +264,22 @@ void putQuoted(std::string_view text, Writer& out) {
   out.put('"');
 }
 
-void putHex(std::string_view bytes, Writer& out) {
+// "00" to "ff", one after the other.
+constexpr auto hexPairs = [] {
   constexpr std::string_view digits = "0123456789abcdef";
+  std::array<char, 512> pairs{};
+  for (std::size_t byte = 0; byte < 256; ++byte) {
+    pairs[2 * byte] = digits[byte >> 4];
+    pairs[2 * byte + 1] = digits[byte & 15];
+  }
+  return pairs;
+}();
+
+void putHex(std::string_view bytes, Writer& out) {
   char* to = out.room(2 * bytes.size());
   for (const char character : bytes) {
-    const auto byte = static_cast<unsigned char>(character);
-    *to++ = digits[byte >> 4];
-    *to++ = digits[byte & 15];
+    std::memcpy(to, hexPairs.data() + 2 * static_cast<unsigned char>(character), 2);
+    to += 2;
   }
   out.advanceTo(to);
 }
@@ -215,9 +290,9 @@ void put(const Dictionary& dictionary, Writer& out);
 void put(const Value& value, Writer& out) {
   switch (value.kind()) {
     case ValueKind::Int32:
-      return printInteger(value.rawInt32(), out);
+      return printInteger(std::int64_t{value.rawInt32()}, out);
     case ValueKind::UInt32:
-      return printInteger(value.rawUInt32(), out);
+      return printInteger(std::uint64_t{value.rawUInt32()}, out);
     case ValueKind::Int64:
       return printInteger(value.rawInt64(), out);
     case ValueKind::UInt64:
@@ -229,7 +304,7 @@ void put(const Value& value, Writer& out) {
     case ValueKind::Double:
       return printReal(value.rawDouble(), out);
     case ValueKind::Text:
-      return putQuoted(value.rawText(), out);
+      return value.isIdentifier() ? putUnescaped(value.rawText(), out) : putQuoted(value.rawText(), out);
     case ValueKind::Bytes:
       out.put('<');
       putHex(value.rawText(), out);
@@ -256,11 +331,33 @@ void put(const Dictionary& dictionary, Writer& out) {
   out.put('[');
   bool first = true;
   for (const Dictionary::Entry& entry : dictionary) {
-    if (!first) out.put(std::string_view(", "));
+    const std::string_view key = entry.key.text();
+    const Value& value = entry.value;
+    const std::string_view name = value.isIdentifier() ? value.rawText() : std::string_view();
+    // Room at once for what most entries are: a separator, a framed key, a name in quotation marks or an integer.
+    char* to = out.room(2 + key.size() + 4 + name.size() + 2 + longestInteger);
+    if (!first) to = Writer::append(Writer::append(to, ','), ' ');
     first = false;
-    putQuoted(entry.key.text(), out);
-    out.put(std::string_view(": "));
-    put(entry.value, out);
+    if (!entry.key.isFramed()) {
+      out.advanceTo(to);
+      putQuoted(key, out);
+      out.put(std::string_view(": "));
+      put(value, out);
+      continue;
+    }
+    to = Writer::appendShort(to, std::string_view(key.data() - 1, key.size() + 4));
+    if (value.kind() == ValueKind::UInt32) {
+      out.advanceTo(writeInteger(to, std::uint64_t{value.rawUInt32()}));
+    } else if (value.kind() == ValueKind::Int32) {
+      out.advanceTo(writeInteger(to, std::int64_t{value.rawInt32()}));
+    } else if (value.isIdentifier()) {
+      out.advanceTo(Writer::append(Writer::appendShort(Writer::append(to, '"'), name), '"'));
+    } else if (value.kind() == ValueKind::UInt64) {
+      out.advanceTo(writeInteger(to, value.rawUInt64()));
+    } else {
+      out.advanceTo(to);
+      put(value, out);
+    }
   }
   out.put(']');
 }

@@ -7,15 +7,22 @@
 #include <utility>
 
 #include "values/dictionary.h"
+#include "values/pool.h"
 
 namespace probeview {
 
 struct Value::ListNode {
+  static void* operator new(std::size_t size) { return takeMemory(size); }
+  static void operator delete(void* memory, std::size_t size) noexcept { giveMemoryBack(memory, size); }
+
   std::atomic<std::uint32_t> references{1};
   List list;
 };
 
 struct Value::DictionaryNode {
+  static void* operator new(std::size_t size) { return takeMemory(size); }
+  static void operator delete(void* memory, std::size_t size) noexcept { giveMemoryBack(memory, size); }
+
   std::atomic<std::uint32_t> references{1};
   Dictionary dictionary;
 };
@@ -37,33 +44,20 @@ Value::Value(ValueKind kind, std::string_view content) : kind_(kind) {
     if (!content.empty()) std::memcpy(storage_, content.data(), content.size());
     return;
   }
-  void* memory = ::operator new(sizeof(Buffer) + content.size());
+  void* memory = takeMemory(sizeof(Buffer) + content.size());
   auto* buffer = new (memory) Buffer{{1}, static_cast<std::uint32_t>(content.size())};
   std::memcpy(buffer->data(), content.data(), content.size());
   form_ = formShared;
   store(buffer);
 }
 
-Value::Value(List list) : kind_(ValueKind::List) {
-  auto* node = new ListNode;
-  node->list = std::move(list);
-  store(node);
-}
+Value::Value(List list) : kind_(ValueKind::List) { store(new ListNode{.list = std::move(list)}); }
 
 Value::Value(Dictionary dictionary) : kind_(ValueKind::Dictionary) {
-  auto* node = new DictionaryNode;
-  node->dictionary = std::move(dictionary);
-  store(node);
+  store(new DictionaryNode{.dictionary = std::move(dictionary)});
 }
 
 Value Value::text(std::string_view text) { return Value(ValueKind::Text, text); }
-
-Value Value::constant(std::string_view text) noexcept {
-  Value value;
-  value.form_ = formConstant;
-  value.store(View{text.data(), text.size()});
-  return value;
-}
 
 Value Value::bytes(std::span<const std::uint8_t> bytes) {
   return Value(ValueKind::Bytes, {reinterpret_cast<const char*>(bytes.data()), bytes.size()});
@@ -82,20 +76,8 @@ void Value::release() noexcept {
   } else if (kind_ == ValueKind::Dictionary) {
     if (releaseReference(load<DictionaryNode*>()->references)) delete load<DictionaryNode*>();
   } else if (releaseReference(load<Buffer*>()->references)) {
-    ::operator delete(load<Buffer*>());
+    giveMemoryBack(load<Buffer*>(), sizeof(Buffer) + load<Buffer*>()->size);
   }
-}
-
-const char* Value::data() const noexcept {
-  if (form_ == formConstant) return load<View>().data;
-  if (form_ == formShared) return load<Buffer*>()->data();
-  return storage_;
-}
-
-std::size_t Value::size() const noexcept {
-  if (form_ == formConstant) return load<View>().size;
-  if (form_ == formShared) return load<Buffer*>()->size;
-  return form_;
 }
 
 std::optional<std::int32_t> Value::integer32() const noexcept {

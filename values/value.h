@@ -40,6 +40,11 @@ enum class ValueKind : std::uint8_t {
   Dictionary,
 };
 
+// A text that lives as long as the process and holds nothing that printing would escape, such as an identifier.
+struct Identifier {
+  std::string_view text;
+};
+
 class Value {
  public:
   // An empty text.
@@ -74,13 +79,15 @@ class Value {
   Value(T number) noexcept : kind_(ValueKind::Double) {
     store(number);
   }
+  // Refers to the text.
+  Value(Identifier name) noexcept : Value(name.text, formIdentifier) {}
   Value(List list);
   Value(Dictionary dictionary);
 
   // Copies the bytes of the text.
   static Value text(std::string_view text);
   // Refers to the text, which must live as long as the process (an enumeration name, a literal).
-  static Value constant(std::string_view text) noexcept;
+  static Value constant(std::string_view text) noexcept { return Value(text, formConstant); }
   // Copies the bytes.
   static Value bytes(std::span<const std::uint8_t> bytes);
 
@@ -133,6 +140,8 @@ class Value {
   float rawFloat() const noexcept { return load<float>(); }
   double rawDouble() const noexcept { return load<double>(); }
   std::string_view rawText() const noexcept { return {data(), size()}; }
+  // Whether the text is known to hold nothing that printing would escape.
+  bool isIdentifier() const noexcept { return form_ == formIdentifier; }
 
   // Same kind and same content; floating-point numbers by ==, dictionaries regardless of their order.
   friend bool operator==(const Value& left, const Value& right) noexcept;
@@ -140,7 +149,8 @@ class Value {
  private:
   static constexpr std::size_t inlineCapacity = 30;
   static constexpr std::uint8_t formConstant = 31;
-  static constexpr std::uint8_t formShared = 32;
+  static constexpr std::uint8_t formIdentifier = 32;
+  static constexpr std::uint8_t formShared = 33;
 
   struct View {
     const char* data;
@@ -167,8 +177,16 @@ class Value {
   }
 
   Value(ValueKind kind, std::string_view content);
-  const char* data() const noexcept;
-  std::size_t size() const noexcept;
+  Value(std::string_view text, std::uint8_t form) noexcept : form_(form) { store(View{text.data(), text.size()}); }
+  bool isConstant() const noexcept { return form_ == formConstant || form_ == formIdentifier; }
+  const char* data() const noexcept {
+    if (form_ <= inlineCapacity) return storage_;
+    return isConstant() ? load<View>().data : load<Buffer*>()->data();
+  }
+  std::size_t size() const noexcept {
+    if (form_ <= inlineCapacity) return form_;
+    return isConstant() ? load<View>().size : load<Buffer*>()->size;
+  }
   // One holder more, or less, of what is shared; only for a value that shares.
   void retain() const noexcept;
   void release() noexcept;
@@ -186,7 +204,7 @@ class Value {
   }
 
   alignas(8) char storage_[inlineCapacity];
-  // For text and bytes: their length when they lie inline, else one of the two forms.
+  // For text and bytes: their length when they lie inline, else one of the three forms.
   std::uint8_t form_ = 0;
   ValueKind kind_ = ValueKind::Text;
 };

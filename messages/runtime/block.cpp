@@ -6,6 +6,7 @@
 #include <new>
 
 #include "messages/runtime/codable.h"
+#include "values/pool.h"
 
 namespace probeview {
 
@@ -25,11 +26,7 @@ namespace {
 constexpr std::size_t usualSize = 8192;
 constexpr std::size_t largestChunk = std::size_t{1} << 20;
 
-#if defined(__SANITIZE_ADDRESS__)
-constexpr std::size_t keptBlocks = 0;  // so that the sanitizer sees every use of a block that has gone
-#else
-constexpr std::size_t keptBlocks = 4;
-#endif
+constexpr std::size_t keptBlocks = keepsMemory ? 4 : 0;
 
 // What a thread keeps. Trivial, so that reaching it costs nothing; the keeper below empties it when the thread ends.
 struct Kept {

@@ -8,9 +8,7 @@ namespace probeview {
 
 namespace {
 
-Value enumerationName(const EnumerationTable& table, std::int32_t value) {
-  const std::string_view name = table.name(value);
-  if (!name.empty()) return Value::constant(name);
+Value unknownName(std::int32_t value) {
   char text[32] = "(unknown: ";
   char* end = std::to_chars(text + 10, text + sizeof text - 1, value).ptr;
   *end++ = ')';
@@ -23,7 +21,7 @@ Dictionary TableWalker::dictionary(const PBCodable& message, const MessageDescri
   Dictionary dictionary;
   dictionary.reserve(descriptor.isFlat ? static_cast<std::size_t>(std::popcount(message._has)) : descriptor.rowCount);
   for (const FieldDescriptor& row : descriptor.fields()) {
-    const Key key = Key::constant(row.name);
+    const Key key = Key::framed(row.name);
     switch (row.kind) {
       case FieldKind::UInt64:
         if (message.hasBit(row.number)) dictionary.append(key, message.*row.member.unsigned64);
@@ -37,7 +35,13 @@ Dictionary TableWalker::dictionary(const PBCodable& message, const MessageDescri
         break;
       case FieldKind::Enumeration:
         if (message.hasBit(row.number)) {
-          dictionary.append(key, enumerationName(*row.enumeration, message.*row.member.signed32));
+          const std::int32_t value = message.*row.member.signed32;
+          const std::string_view name = row.enumeration->name(value);
+          if (!name.empty()) {
+            dictionary.append(key, Identifier{name});
+          } else {
+            dictionary.append(key, unknownName(value));
+          }
         }
         break;
       case FieldKind::Bool:

@@ -73,7 +73,9 @@ struct FieldDescriptor {
   std::uint16_t number = 0;
   FieldKind kind = FieldKind::UInt64;
   FieldMember member;
-  std::string_view name;                          // the key in the dictionary form, such as "tx_power_info"
+  // The key in the dictionary form, such as tx_power_info. It lies in memory as it is printed: "tx_power_info": with
+  // the quotation marks, the colon and the blank around it.
+  std::string_view name;
   const EnumerationTable* enumeration = nullptr;  // of an enumeration
   const MessageDescriptor* element = nullptr;     // of a nested message, single or repeated
 };

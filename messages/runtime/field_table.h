@@ -39,6 +39,16 @@ struct FieldNumber {};
 
 namespace detail {
 
+// The key as it is printed, with all around it, is one constant, so that it is printed by copying; the name lies in it.
+consteval std::string_view nameIn(std::string_view printedKey) {
+  const std::string_view name = printedKey.substr(1, printedKey.size() - 4);
+  for (const char character : name) {
+    const bool isLetter = (character >= 'a' && character <= 'z') || (character >= 'A' && character <= 'Z');
+    if (!isLetter && !(character >= '0' && character <= '9') && character != '_') throw "a key is an identifier";
+  }
+  return name;
+}
+
 template <typename Message, unsigned Number>
 inline constexpr bool hasField = requires {
   Message::pbField(FieldNumber<Number>{});
@@ -175,12 +185,12 @@ consteval MessageDescriptor describeMessage(std::string_view name) {
       ::probeview::detail::describeMessage<Class>(#Class);             \
   const ::probeview::MessageDescriptor& Class::descriptor() const noexcept { return pbDescriptor; }
 
-#define PB_ROW(number, key, property, type)                                                 \
-  static constexpr ::probeview::FieldDescriptor pbField(::probeview::FieldNumber<number>) { \
-    return type::describe(number, key, &Self::_##property);                                 \
-  }                                                                                         \
-                                                                                            \
- private:                                                                                   \
+#define PB_ROW(number, key, property, type)                                                          \
+  static constexpr ::probeview::FieldDescriptor pbField(::probeview::FieldNumber<number>) {          \
+    return type::describe(number, ::probeview::detail::nameIn("\"" key "\": "), &Self::_##property); \
+  }                                                                                                  \
+                                                                                                     \
+ private:                                                                                            \
   type::Stored _##property {}
 
 #define PB_FIELD(number, key, property, Property, type)                                            \
