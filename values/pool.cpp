@@ -2,69 +2,77 @@
 #include "values/pool.h"
 
 #include <array>
-#include <cstdint>
 #include <new>
+#include <utility>
 
 namespace probeview {
 
 namespace {
 
 constexpr std::size_t step = 64;
-constexpr std::size_t largest = 2048;
+constexpr std::size_t shelfCount = 32;
+// How many bytes a thread keeps: enough for the dictionaries of the largest message.
+constexpr std::size_t mostKept = keepsMemory ? std::size_t{256} << 10 : 0;
 
-constexpr std::uint32_t keptOfEach = keepsMemory ? 64 : 0;
-
+// A piece that is kept begins with a pointer to the next one of its size.
 struct Piece {
   Piece* next;
 };
 
-struct Shelf {
-  Piece* first;
-  std::uint32_t count;
-};
-
 // Trivial, so that reaching it costs nothing; the keeper below empties it when the thread ends.
 struct Shelves {
-  std::array<Shelf, largest / step> bySize;
+  std::array<Piece*, shelfCount> bySize;  // of one step, of two, …
+  std::size_t room;                       // how many bytes more may be kept; none until there is a keeper
   bool hasKeeper;
-  bool isClosed;
 };
 constinit thread_local Shelves shelves{};
 
 struct Keeper {
+  Keeper() noexcept {
+    shelves.room = mostKept;
+    shelves.hasKeeper = true;
+  }
+  // What is given back after this is not kept any more.
   ~Keeper() {
-    shelves.isClosed = true;
-    for (Shelf& shelf : shelves.bySize) {
-      while (shelf.first != nullptr) {
-        Piece* next = shelf.first->next;
-        ::operator delete(shelf.first);
-        shelf.first = next;
-      }
+    shelves.room = 0;
+    for (Piece*& first : shelves.bySize) {
+      while (first != nullptr) ::operator delete(std::exchange(first, first->next));
     }
   }
-  void wake() noexcept { shelves.hasKeeper = true; }
+  void wake() const noexcept {}
 };
-thread_local Keeper keeper;
+thread_local const Keeper keeper;
+
+// 0 for up to one step, 1 for up to two; beyond the shelves for what is larger, and for nothing at all.
+std::size_t shelfOf(std::size_t size) noexcept { return (size - 1) / step; }
+
+[[gnu::noinline]] void* takeNewMemory(std::size_t size) {
+  return ::operator new(shelfOf(size) < shelfCount ? (shelfOf(size) + 1) * step : size);
+}
+
+[[gnu::noinline]] void letMemoryGo(void* memory, std::size_t size) noexcept {
+  if (shelves.hasKeeper) return ::operator delete(memory);
+  keeper.wake();
+  giveMemoryBack(memory, size);
+}
 
 }  // namespace
 
 void* takeMemory(std::size_t size) {
-  if (size == 0 || size > largest) return ::operator new(size);
-  Shelf& shelf = shelves.bySize[(size - 1) / step];
-  if (shelf.first == nullptr) return ::operator new((size + step - 1) / step * step);
-  Piece* piece = shelf.first;
-  shelf.first = piece->next;
-  --shelf.count;
+  const std::size_t shelf = shelfOf(size);
+  if (shelf >= shelfCount || shelves.bySize[shelf] == nullptr) return takeNewMemory(size);
+  Piece* piece = shelves.bySize[shelf];
+  shelves.bySize[shelf] = piece->next;
+  shelves.room += (shelf + 1) * step;
   return piece;
 }
 
 void giveMemoryBack(void* memory, std::size_t size) noexcept {
-  if (size == 0 || size > largest || shelves.isClosed) return ::operator delete(memory);
-  Shelf& shelf = shelves.bySize[(size - 1) / step];
-  if (shelf.count >= keptOfEach) return ::operator delete(memory);
-  if (!shelves.hasKeeper) keeper.wake();
-  shelf.first = new (memory) Piece{shelf.first};
-  ++shelf.count;
+  const std::size_t shelf = shelfOf(size);
+  const std::size_t kept = (shelf + 1) * step;
+  if (shelf >= shelfCount || shelves.room < kept) return letMemoryGo(memory, size);
+  shelves.room -= kept;
+  shelves.bySize[shelf] = new (memory) Piece{shelves.bySize[shelf]};
 }
 
 }  // namespace probeview

@@ -3,10 +3,12 @@
 
 #include <algorithm>
 #include <array>
+#include <bit>
 #include <charconv>
 #include <cmath>
 #include <cstdint>
 #include <cstring>
+#include <utility>
 
 namespace probeview {
 
@@ -24,11 +26,9 @@ class Writer {
   Writer& operator=(const Writer&) = delete;
 
   // Room for that many characters more; advanceTo() says how many were used.
-  char* room(std::size_t count) {
-    if (static_cast<std::size_t>(limit_ - position_) < count) {
-      const auto used = static_cast<std::size_t>(position_ - out_.data());
-      seat(used, std::max(count, used) + 256);
-    }
+  [[gnu::always_inline]] char* room(std::size_t count) {
+    if (static_cast<std::size_t>(limit_ - position_) < count) [[unlikely]]
+      grow(count);
     return position_;
   }
   void advanceTo(char* position) { position_ = position; }
@@ -53,6 +53,8 @@ class Writer {
       copyBothEnds<16>(to, text);
     } else if (size - 32 <= 32) {
       copyBothEnds<32>(to, text);
+    } else if (size - 4 <= 4) {
+      copyBothEnds<4>(to, text);
     } else {
       return append(to, text);
     }
@@ -64,6 +66,10 @@ class Writer {
   static void copyBothEnds(char* to, std::string_view text) {
     std::memcpy(to, text.data(), Piece);
     std::memcpy(to + text.size() - Piece, text.data() + text.size() - Piece, Piece);
+  }
+  [[gnu::noinline]] void grow(std::size_t count) {
+    const auto used = static_cast<std::size_t>(position_ - out_.data());
+    seat(used, std::max(count, used) + 256);
   }
   void seat(std::size_t used, std::size_t more) {
     out_.resize(used + more);
@@ -103,31 +109,54 @@ constexpr auto digitPairs = [] {
 
 constexpr std::size_t longestInteger = 20;
 
-// Twenty characters must be free.
-inline char* writeInteger(char* to, std::uint64_t number) {
-  const auto putPair = [](char* at, std::uint64_t pair) { std::memcpy(at, digitPairs.data() + 2 * pair, 2); };
+inline void writePair(char* to, std::uint32_t below100) { std::memcpy(to, digitPairs.data() + 2 * below100, 2); }
+
+constexpr std::array<std::uint32_t, 10> powersOfTen = {1,       10,        100,        1'000,       10'000,
+                                                       100'000, 1'000'000, 10'000'000, 100'000'000, 1'000'000'000};
+
+// How many decimal digits the number has, which is not 0.
+inline std::size_t digitCount(std::uint32_t number) {
+  // 1233 / 4096 is the logarithm of 2, so this is one too few or just right.
+  const auto estimate = static_cast<std::uint32_t>(std::bit_width(number)) * 1233 / 4096;
+  return estimate + (number >= powersOfTen[estimate] ? 1 : 0);
+}
+
+inline char* writeInteger(char* to, std::uint32_t number) {
   if (number < 10) {
     *to = static_cast<char>('0' + number);
     return to + 1;
   }
-  if (number < 100) {
-    putPair(to, number);
-    return to + 2;
-  }
-  char digits[longestInteger];
-  char* begin = digits + sizeof digits;
-  while (number >= 100) {
-    begin -= 2;
-    putPair(begin, number % 100);
+  char* const end = to + (number < 100 ? 2 : digitCount(number));
+  for (char* position = end - 2; number >= 100; position -= 2) {
+    writePair(position, number % 100);
     number /= 100;
   }
   if (number >= 10) {
-    begin -= 2;
-    putPair(begin, number);
+    writePair(to, number);
   } else {
-    *--begin = static_cast<char>('0' + number);
+    *to = static_cast<char>('0' + number);
   }
-  return Writer::appendShort(to, std::string_view(begin, static_cast<std::size_t>(digits + sizeof digits - begin)));
+  return end;
+}
+
+// What is longer, a time most often, is written in parts of eight digits: to divide 32 bits is cheaper.
+[[gnu::noinline]] char* writeLongInteger(char* to, std::uint64_t number) {
+  constexpr std::uint64_t part = 100'000'000;
+  if (number <= UINT32_MAX) return writeInteger(to, static_cast<std::uint32_t>(number));
+  to = writeLongInteger(to, number / part);
+  const auto eight = static_cast<std::uint32_t>(number % part);
+  const std::uint32_t upper = eight / 10000;
+  const std::uint32_t lower = eight % 10000;
+  writePair(to, upper / 100);
+  writePair(to + 2, upper % 100);
+  writePair(to + 4, lower / 100);
+  writePair(to + 6, lower % 100);
+  return to + 8;
+}
+
+// Twenty characters must be free.
+inline char* writeInteger(char* to, std::uint64_t number) {
+  return number <= UINT32_MAX ? writeInteger(to, static_cast<std::uint32_t>(number)) : writeLongInteger(to, number);
 }
 
 inline char* writeInteger(char* to, std::int64_t number) {
@@ -138,7 +167,7 @@ inline char* writeInteger(char* to, std::int64_t number) {
 }
 
 template <typename Integer>
-void printInteger(Integer number, Writer& out) {
+inline void printInteger(Integer number, Writer& out) {
   out.advanceTo(writeInteger(out.room(longestInteger + 1), number));
 }
 
@@ -237,7 +266,7 @@ void putEscaped(char character, Writer& out) {
 }
 
 // A text that needs no escape.
-void putUnescaped(std::string_view text, Writer& out) {
+inline void putUnescaped(std::string_view text, Writer& out) {
   char* to = Writer::append(out.room(text.size() + 2), '"');
   out.advanceTo(Writer::append(Writer::appendShort(to, text), '"'));
 }
@@ -264,22 +293,33 @@ void putQuoted(std::string_view text, Writer& out) {
   out.put('"');
 }
 
-// "00" to "ff", one after the other.
-constexpr auto hexPairs = [] {
-  constexpr std::string_view digits = "0123456789abcdef";
-  std::array<char, 512> pairs{};
-  for (std::size_t byte = 0; byte < 256; ++byte) {
-    pairs[2 * byte] = digits[byte >> 4];
-    pairs[2 * byte + 1] = digits[byte & 15];
-  }
-  return pairs;
-}();
+// Sixteen bytes at once: the compilers make one vector instruction of each operation, or several where there is none.
+using Bytes = std::uint8_t __attribute__((vector_size(16)));
+
+// The hexadecimal digits of numbers below 16.
+inline Bytes hexDigits(Bytes numbers) {
+  constexpr std::uint8_t fromTenOn = 'a' - '0' - 10;
+  return numbers + '0' + (reinterpret_cast<Bytes>(numbers > 9) & fromTenOn);
+}
 
 void putHex(std::string_view bytes, Writer& out) {
   char* to = out.room(2 * bytes.size());
+  for (; bytes.size() >= sizeof(Bytes); bytes.remove_prefix(sizeof(Bytes))) {
+    Bytes sixteen;
+    std::memcpy(&sixteen, bytes.data(), sizeof sixteen);
+    const Bytes high = hexDigits(sixteen >> 4);
+    const Bytes low = hexDigits(sixteen & 15);
+    const std::array digits = {
+        __builtin_shufflevector(high, low, 0, 16, 1, 17, 2, 18, 3, 19, 4, 20, 5, 21, 6, 22, 7, 23),
+        __builtin_shufflevector(high, low, 8, 24, 9, 25, 10, 26, 11, 27, 12, 28, 13, 29, 14, 30, 15, 31)};
+    std::memcpy(to, &digits, sizeof digits);
+    to += sizeof digits;
+  }
   for (const char character : bytes) {
-    std::memcpy(to, hexPairs.data() + 2 * static_cast<unsigned char>(character), 2);
-    to += 2;
+    constexpr std::string_view digits = "0123456789abcdef";
+    const auto byte = static_cast<unsigned char>(character);
+    *to++ = digits[byte >> 4];
+    *to++ = digits[byte & 15];
   }
   out.advanceTo(to);
 }
@@ -287,12 +327,14 @@ void putHex(std::string_view bytes, Writer& out) {
 void put(const List& list, Writer& out);
 void put(const Dictionary& dictionary, Writer& out);
 
-void put(const Value& value, Writer& out) {
+[[gnu::always_inline]] inline void putInPlace(const Value& value, Writer& out) {
+  // What most values are.
+  if (value.kind() == ValueKind::UInt32) return printInteger(value.rawUInt32(), out);
   switch (value.kind()) {
     case ValueKind::Int32:
       return printInteger(std::int64_t{value.rawInt32()}, out);
     case ValueKind::UInt32:
-      return printInteger(std::uint64_t{value.rawUInt32()}, out);
+      return printInteger(value.rawUInt32(), out);
     case ValueKind::Int64:
       return printInteger(value.rawInt64(), out);
     case ValueKind::UInt64:
@@ -316,48 +358,45 @@ void put(const Value& value, Writer& out) {
   }
 }
 
+void put(const Value& value, Writer& out) { putInPlace(value, out); }
+
+// What stands between two elements: nothing before the first.
+class Separator {
+ public:
+  static constexpr std::size_t longest = 2;
+  char* append(char* to) {
+    Writer::append(to, ", ");
+    return to + std::exchange(size_, longest);
+  }
+
+ private:
+  std::size_t size_ = 0;
+};
+
 void put(const List& list, Writer& out) {
   out.put('[');
-  bool first = true;
+  Separator separator;
   for (const Value& value : list) {
-    if (!first) out.put(std::string_view(", "));
-    first = false;
-    put(value, out);
+    out.advanceTo(separator.append(out.room(Separator::longest)));
+    putInPlace(value, out);
   }
   out.put(']');
 }
 
 void put(const Dictionary& dictionary, Writer& out) {
   out.put('[');
-  bool first = true;
+  Separator separator;
   for (const Dictionary::Entry& entry : dictionary) {
     const std::string_view key = entry.key.text();
-    const Value& value = entry.value;
-    const std::string_view name = value.isIdentifier() ? value.rawText() : std::string_view();
-    // Room at once for what most entries are: a separator, a framed key, a name in quotation marks or an integer.
-    char* to = out.room(2 + key.size() + 4 + name.size() + 2 + longestInteger);
-    if (!first) to = Writer::append(Writer::append(to, ','), ' ');
-    first = false;
-    if (!entry.key.isFramed()) {
+    char* const to = separator.append(out.room(Separator::longest + key.size() + 4));
+    if (entry.key.isFramed()) {
+      out.advanceTo(Writer::appendShort(to, std::string_view(key.data() - 1, key.size() + 4)));
+    } else {
       out.advanceTo(to);
       putQuoted(key, out);
       out.put(std::string_view(": "));
-      put(value, out);
-      continue;
     }
-    to = Writer::appendShort(to, std::string_view(key.data() - 1, key.size() + 4));
-    if (value.kind() == ValueKind::UInt32) {
-      out.advanceTo(writeInteger(to, std::uint64_t{value.rawUInt32()}));
-    } else if (value.kind() == ValueKind::Int32) {
-      out.advanceTo(writeInteger(to, std::int64_t{value.rawInt32()}));
-    } else if (value.isIdentifier()) {
-      out.advanceTo(Writer::append(Writer::appendShort(Writer::append(to, '"'), name), '"'));
-    } else if (value.kind() == ValueKind::UInt64) {
-      out.advanceTo(writeInteger(to, value.rawUInt64()));
-    } else {
-      out.advanceTo(to);
-      put(value, out);
-    }
+    putInPlace(entry.value, out);
   }
   out.put(']');
 }

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
-#include <bit>
 #include <charconv>
+#include <utility>
 
 #include "messages/runtime/table_walker.h"
 
@@ -19,47 +19,51 @@ Value unknownName(std::int32_t value) {
 
 Dictionary TableWalker::dictionary(const PBCodable& message, const MessageDescriptor& descriptor) {
   Dictionary dictionary;
-  dictionary.reserve(descriptor.isFlat ? static_cast<std::size_t>(std::popcount(message._has)) : descriptor.rowCount);
+  dictionary.reserve(descriptor.rowCount);
+  const std::uint64_t has = message._has;
   for (const FieldDescriptor& row : descriptor.fields()) {
-    const Key key = Key::framed(row.name);
+    if (isScalar(row.kind) && (has >> row.number & 1U) == 0) continue;
+    const auto add = [&]<typename Content>(Content&& content) {
+      dictionary.append(Key::framed(row.name), std::forward<Content>(content));
+    };
+    const auto addName = [&](std::int32_t value) {
+      const std::string_view name = row.enumeration->name(value);
+      if (!name.empty()) {
+        add(Identifier{name});
+      } else {
+        add(unknownName(value));
+      }
+    };
     switch (row.kind) {
       case FieldKind::UInt64:
-        if (message.hasBit(row.number)) dictionary.append(key, message.*row.member.unsigned64);
+        add(message.*row.member.unsigned64);
         break;
       case FieldKind::UInt32:
-        if (message.hasBit(row.number)) dictionary.append(key, message.*row.member.unsigned32);
+        add(message.*row.member.unsigned32);
         break;
       case FieldKind::Int32:
       case FieldKind::SInt32:
-        if (message.hasBit(row.number)) dictionary.append(key, message.*row.member.signed32);
+        add(message.*row.member.signed32);
         break;
       case FieldKind::Enumeration:
-        if (message.hasBit(row.number)) {
-          const std::int32_t value = message.*row.member.signed32;
-          const std::string_view name = row.enumeration->name(value);
-          if (!name.empty()) {
-            dictionary.append(key, Identifier{name});
-          } else {
-            dictionary.append(key, unknownName(value));
-          }
-        }
+        addName(message.*row.member.signed32);
         break;
       case FieldKind::Bool:
-        if (message.hasBit(row.number)) dictionary.append(key, message.*row.member.truth);
+        add(message.*row.member.truth);
         break;
       case FieldKind::Bytes: {
         const PBByteField& field = message.*row.member.bytes;
-        if (field.isPresent()) dictionary.append(key, Value::bytes(field.bytes()));
+        if (field.isPresent()) add(Value::bytes(field.bytes()));
         break;
       }
       case FieldKind::Text: {
         const PBByteField& field = message.*row.member.bytes;
-        if (field.isPresent()) dictionary.append(key, Value::text(field.text()));
+        if (field.isPresent()) add(Value::text(field.text()));
         break;
       }
       case FieldKind::Message: {
         const PBCodable* element = (message.*row.member.message).element();
-        if (element != nullptr) dictionary.append(key, TableWalker::dictionary(*element, *row.element));
+        if (element != nullptr) add(TableWalker::dictionary(*element, *row.element));
         break;
       }
       case FieldKind::RepeatedMessage: {
@@ -70,17 +74,17 @@ Dictionary TableWalker::dictionary(const PBCodable& message, const MessageDescri
         for (std::size_t index = 0; index < elements.count(); ++index) {
           list.append(TableWalker::dictionary(elements[index], *row.element));
         }
-        dictionary.append(key, std::move(list));
+        add(std::move(list));
         break;
       }
       case FieldKind::RepeatedUInt32: {
         const PBRepeatedUInt32& numbers = message.*row.member.unsigned32List;
-        if (numbers.count() != 0) dictionary.append(key, numbers.toList());
+        if (numbers.count() != 0) add(numbers.toList());
         break;
       }
       case FieldKind::RepeatedSInt32: {
         const PBRepeatedInt32& numbers = message.*row.member.signed32List;
-        if (numbers.count() != 0) dictionary.append(key, numbers.toList());
+        if (numbers.count() != 0) add(numbers.toList());
         break;
       }
     }
