@@ -1,7 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
+#include <algorithm>
 #include <cstdio>
 
 #include "messages/runtime/metric_utility.h"
+#include "messages/runtime/scalar_run.h"
 #include "messages/runtime/table_walker.h"
 
 namespace probeview {
@@ -13,12 +15,6 @@ struct TableWalker::Decoding {
   const std::uint8_t* tail;  // the last few bytes of the payload, which are read with care
 
   Block& block() { return blockOf(root); }
-};
-
-// How far a record has been decoded, and which field is expected next.
-struct TableWalker::Progress {
-  const std::uint8_t* position;
-  const ScalarRow* expected;
 };
 
 namespace {
@@ -71,42 +67,22 @@ inline const std::uint8_t* readKey(const std::uint8_t* position, const std::uint
   return isThere ? position + 2 : position;
 }
 
-// A scalar from its varint. Inline, because it is most of what the loop over expected fields does.
-[[gnu::always_inline]] inline void storeScalar(PBCodable& message, FieldKind kind, const FieldMember& member,
-                                               std::uint64_t value) noexcept {
-  if (kind == FieldKind::UInt32) [[likely]] {
-    message.*member.unsigned32 = static_cast<std::uint32_t>(value);
-  } else if (kind == FieldKind::SInt32) [[likely]] {
-    message.*member.signed32 = wire::unZigZag(static_cast<std::uint32_t>(value));
-  } else if (kind == FieldKind::UInt64) {
-    message.*member.unsigned64 = value;
-  } else if (kind == FieldKind::Bool) {
-    message.*member.truth = value != 0;
-  } else {
-    message.*member.signed32 = static_cast<std::int32_t>(value);
-  }
+// Where the tail of the payload begins.
+inline const std::uint8_t* tailOf(const std::uint8_t* begin, const std::uint8_t* end) noexcept {
+  return end - begin > static_cast<std::ptrdiff_t>(decodingTailSize) ? end - decodingTailSize : begin;
 }
-
-// Whether the key that stands at the position is that of the scalar.
-template <int KeySize>
-bool isNext(const ScalarRow& scalar, const std::uint8_t* position) noexcept {
-  if constexpr (KeySize == 1) return position[0] == scalar.shortKey;
-  return static_cast<std::uint32_t>(position[0] | position[1] << 8) == scalar.longKey;
-}
-
-// How many bytes before the payload's end the tail begins: a key of two bytes and a value of two fit before it, and
-// with some more room the eight bytes in which longer values are read at once.
-constexpr std::ptrdiff_t tailSize = 3;
-constexpr std::ptrdiff_t roomForLongValue = 10 - tailSize;
 
 }  // namespace
+
+wire::Varint ScalarRun::readLongValue(const std::uint8_t* position, const std::uint8_t* tail) noexcept {
+  return readEight(position, tail);
+}
 
 bool PBCodable::readFrom(PBDataReader& reader) { return TableWalker::decode(*this, reader); }
 
 bool TableWalker::decode(PBCodable& message, PBDataReader& reader) {
   if (reader.hasError_) return false;
-  const std::ptrdiff_t size = reader.limit_ - reader.position_;
-  Decoding decoding{message, reader.log_, size > tailSize ? reader.limit_ - tailSize : reader.position_};
+  Decoding decoding{message, reader.log_, tailOf(reader.position_, reader.limit_)};
   const std::uint8_t* end = decodeRecord(message, message.descriptor(), reader.position_, reader.limit_, decoding);
   reader.hasError_ = end == nullptr;
   reader.position_ = end == nullptr ? reader.limit_ : end;
@@ -119,64 +95,65 @@ bool TableWalker::decode(PBCodable& message, PBDataReader& reader) {
                                                                             const std::uint8_t* position,
                                                                             const std::uint8_t* limit,
                                                                             Decoding& decoding) {
-  const Progress progress = decodeExpected(message, {position, descriptor.scalars}, limit, decoding);
+  DecodingProgress progress = descriptor.decodeFront(message, position, limit, decoding.tail);
   if (progress.position == limit) return limit;
+  if (progress.position >= decoding.tail) {
+    progress = decodeTail(message, progress, limit);
+    if (progress.position == limit) return limit;
+  }
   return decodeOthers(message, descriptor, progress, limit, decoding);
 }
 
-// Decodes scalars for as long as each is the field that is expected next and has a key of so many bytes.
-template <int KeySize>
-[[gnu::always_inline]] inline TableWalker::Progress TableWalker::decodeRun(PBCodable& message, Progress progress,
-                                                                           const std::uint8_t* limit,
-                                                                           const std::uint8_t* tail,
-                                                                           std::uint64_t& hasBits) noexcept {
-  // Before the tail nothing is asked byte by byte.
-  const std::uint8_t* const stop = limit < tail ? limit : tail;
-  while (progress.position < stop && isNext<KeySize>(*progress.expected, progress.position)) {
+// The last few bytes of a payload: scalars of one byte for as long as each is the field that is expected next.
+DecodingProgress TableWalker::decodeTail(PBCodable& message, DecodingProgress progress,
+                                         const std::uint8_t* limit) noexcept {
+  const auto decodeNext = [&]<std::size_t KeySize>() {
     const ScalarRow& scalar = *progress.expected;
-    const std::uint8_t* next = progress.position + KeySize + 1;
-    std::uint64_t value = next[-1];
-    if (value >= 0x80) [[unlikely]] {
-      const std::uint64_t second = *next++;
-      if (second < 0x80) [[likely]] {
-        value += (second << 7) - 0x80;
-      } else {
-        if (tail - progress.position < roomForLongValue) break;
-        const wire::Varint varint = wire::readUpToEightBytes(next - 2);
-        if (varint.next == nullptr) break;
-        next = varint.next;
-        value = varint.value;
-      }
-    }
-    if (next > limit) break;
-    storeScalar(message, scalar.kind, scalar.member, value);
-    hasBits |= scalar.hasBit;
-    progress = {next, progress.expected + 1};
+    if (limit - progress.position <= static_cast<std::ptrdiff_t>(KeySize)) return false;
+    if (!ScalarRun::isNext<KeySize>(scalar, progress.position) || progress.position[KeySize] >= 0x80) return false;
+    ScalarRun::store(message, scalar.kind, scalar.member, progress.position[KeySize]);
+    message._has |= scalar.hasBit;
+    progress = {progress.position + KeySize + 1, &scalar + 1};
+    return true;
+  };
+  while (decodeNext.template operator()<1>() || decodeNext.template operator()<2>()) {
   }
-  // In the tail the same, with care, for scalars of one byte.
-  while (limit - progress.position > KeySize && isNext<KeySize>(*progress.expected, progress.position) &&
-         progress.position[KeySize] < 0x80) {
+  return progress;
+}
+
+// Decodes scalars for as long as each is the field that is expected next and has a key of so many bytes. Stops, before
+// the key, at whatever else there is, at a value that the record cuts off, and at the tail.
+template <std::size_t KeySize>
+[[gnu::always_inline]] inline DecodingProgress TableWalker::decodeRun(PBCodable& message, DecodingProgress progress,
+                                                                      const std::uint8_t* limit,
+                                                                      const std::uint8_t* tail) noexcept {
+  const std::uint8_t* const stop = std::min(limit, tail);
+  std::uint64_t hasBits = 0;
+  while (progress.position < stop && ScalarRun::isNext<KeySize>(*progress.expected, progress.position)) {
     const ScalarRow& scalar = *progress.expected;
-    storeScalar(message, scalar.kind, scalar.member, progress.position[KeySize]);
+    const wire::Varint varint = ScalarRun::readValue<false>(progress.position + KeySize, tail);
+    if (varint.next == nullptr || varint.next > limit) break;
+    ScalarRun::store(message, scalar.kind, scalar.member, varint.value);
     hasBits |= scalar.hasBit;
-    progress = {progress.position + KeySize + 1, progress.expected + 1};
+    progress = {varint.next, &scalar + 1};
   }
+  message._has |= hasBits;
   return progress;
 }
 
 // Decodes scalars for as long as each is the field that is expected next: who encodes a message writes its fields in
-// order, so this is where most of the time goes. Stops, before the key, at whatever else there is: another field, a
-// field that is no scalar, a value that the record cuts off. The caller goes on from there. It calls nothing, so that
-// all that it needs stays in registers.
-[[gnu::always_inline]] inline TableWalker::Progress TableWalker::decodeExpected(PBCodable& message, Progress progress,
-                                                                                const std::uint8_t* limit,
-                                                                                const Decoding& decoding) noexcept {
-  std::uint64_t hasBits = 0;
-  progress = decodeRun<1>(message, progress, limit, decoding.tail, hasBits);
-  if (progress.expected->longKey != ScalarRow::none)
-    progress = decodeRun<2>(message, progress, limit, decoding.tail, hasBits);
-  message._has |= hasBits;
-  return progress;
+// order.
+[[gnu::always_inline]] inline DecodingProgress TableWalker::decodeExpected(PBCodable& message,
+                                                                           DecodingProgress progress,
+                                                                           const std::uint8_t* limit,
+                                                                           const Decoding& decoding) noexcept {
+  if (progress.expected->shortKey != ScalarRow::none) {
+    progress = decodeRun<1>(message, progress, limit, decoding.tail);
+  }
+  if (progress.expected->longKey != ScalarRow::none) {
+    progress = decodeRun<2>(message, progress, limit, decoding.tail);
+  }
+  return progress.position < decoding.tail ? progress : decodeTail(message, progress, limit);
 }
 
 // Elements of a list that follow one another, each behind the same key; the first key has been read.
@@ -198,7 +175,8 @@ const std::uint8_t* TableWalker::decodeElements(PBMessageList& list, const Field
 
 // Goes on where decodeExpected() has stopped.
 const std::uint8_t* TableWalker::decodeOthers(PBCodable& message, const MessageDescriptor& descriptor,
-                                              Progress progress, const std::uint8_t* limit, Decoding& decoding) {
+                                              DecodingProgress progress, const std::uint8_t* limit,
+                                              Decoding& decoding) {
   while (progress.position < limit) {
     const wire::Varint key = wire::readVarint(progress.position, limit);
     if (key.next == nullptr) return nullptr;
@@ -234,7 +212,7 @@ const std::uint8_t* TableWalker::decodeOthers(PBCodable& message, const MessageD
       case FieldKind::Bool: {
         // Present even if the data ends inside it; it is 0 then.
         const wire::Varint scalar = wire::readVarint(position, limit);
-        storeScalar(message, row->kind, row->member, scalar.value);
+        ScalarRun::store(message, row->kind, row->member, scalar.value);
         message.setBit(row->number);
         position = scalar.next;
         break;

@@ -2,6 +2,7 @@
 #include <bit>
 #include <cstring>
 
+#include "messages/runtime/scalar_run.h"
 #include "messages/runtime/table_walker.h"
 
 namespace probeview {
@@ -18,16 +19,6 @@ namespace {
 // together, so some bytes more than they need must be free.
 constexpr std::size_t recordHeadBound = 2 + 5 + wordSlack;
 
-// The bytes of a word, those in the low bits first.
-template <typename Word>
-[[gnu::always_inline]] inline void writeWord(std::uint8_t* out, Word word) noexcept {
-  if constexpr (std::endian::native == std::endian::little) {
-    std::memcpy(out, &word, sizeof word);
-  } else {
-    for (std::size_t index = 0; index < sizeof word; ++index) out[index] = static_cast<std::uint8_t>(word >> 8 * index);
-  }
-}
-
 // A varint of at most eight bytes, written at once; eight bytes must be free.
 inline std::uint8_t* writeUpToEightBytes(std::uint8_t* out, std::uint64_t value) noexcept {
   // Seven bits for each byte move apart together: all eight, fours, pairs. To move some bits of a number up by n is to
@@ -36,7 +27,7 @@ inline std::uint8_t* writeUpToEightBytes(std::uint8_t* out, std::uint64_t value)
   bytes += (bytes & 0x0FFFC0000FFFC000U) * 3;
   bytes += bytes & 0x3F803F803F803F80U;
   const std::size_t size = wire::varintSize(value);
-  writeWord(out, bytes | (0x8080808080808080U & ((std::uint64_t{1} << 8 * (size - 1)) - 1)));
+  ScalarRun::writeWord(out, bytes | (0x8080808080808080U & ((std::uint64_t{1} << 8 * (size - 1)) - 1)));
   return out + size;
 }
 
@@ -50,37 +41,11 @@ std::uint8_t* writeKey(std::uint8_t* out, std::uint32_t key) noexcept {
   return out + 2;
 }
 
-// A key of so many bytes, and the value behind it.
-template <unsigned KeySize>
-[[gnu::always_inline]] inline std::uint8_t* writeScalar(std::uint8_t* out, std::uint32_t keyBytes,
-                                                        std::uint64_t value) noexcept {
-  if (value < 0x80) [[likely]] {
-    writeWord(out, keyBytes | static_cast<std::uint32_t>(value) << 8 * KeySize);
-    return out + KeySize + 1;
-  }
-  if (value < 0x4000) [[likely]] {
-    // The upper seven bits move up by one.
-    const auto twoBytes = static_cast<std::uint32_t>(value + (value & 0x3F80) + 0x80);
-    writeWord(out, keyBytes | twoBytes << 8 * KeySize);
-    return out + KeySize + 2;
-  }
-  writeWord(out, keyBytes);
-  if (value < std::uint64_t{1} << 56) return writeUpToEightBytes(out + KeySize, value);
-  return wire::writeVarint(out + KeySize, value);
-}
-
-[[gnu::always_inline]] inline std::uint64_t loadScalar(const PBCodable& message, const ScalarRow& row) noexcept {
-  if (row.kind == FieldKind::UInt32) [[likely]]
-    return message.*row.member.unsigned32;
-  if (row.kind == FieldKind::SInt32) [[likely]]
-    return wire::zigZag(message.*row.member.signed32);
-  if (row.kind == FieldKind::Bool) return message.*row.member.truth ? 1 : 0;
-  if (row.kind == FieldKind::UInt64) return message.*row.member.unsigned64;
-  // Signed numbers that are not ZigZag are extended to 64 bits.
-  return static_cast<std::uint64_t>(std::int64_t{message.*row.member.signed32});
-}
-
 }  // namespace
+
+std::uint8_t* ScalarRun::writeLongValue(std::uint8_t* out, std::uint64_t value) noexcept {
+  return value < std::uint64_t{1} << 56 ? writeUpToEightBytes(out, value) : wire::writeVarint(out, value);
+}
 
 // Writes scalars with keys of so many bytes up to the next field that is no scalar, or to the end.
 template <unsigned KeySize>
@@ -94,7 +59,7 @@ template <unsigned KeySize>
       if (isScalar(row->kind)) continue;
       break;
     }
-    out = writeScalar<KeySize>(out, row->keyBytes, loadScalar(message, *row));
+    out = ScalarRun::write<KeySize>(out, row->keyBytes, ScalarRun::load(message, row->kind, row->member));
   }
   return {out, row};
 }
@@ -116,7 +81,7 @@ void TableWalker::encode(const PBCodable& message, PBDataWriter& writer) {
   const MessageDescriptor& descriptor = message.descriptor();
   std::uint8_t* out = writer.reserve(descriptor.scalarBound);
   if (descriptor.isFlat) {
-    writer.commit(encodeScalars(message, descriptor, {out, descriptor.scalars}).out);
+    writer.commit(descriptor.encodeFront(message, out));
   } else {
     writer.commit(encodeFields(message, descriptor, out, writer));
   }
@@ -126,7 +91,7 @@ void TableWalker::encode(const PBCodable& message, PBDataWriter& writer) {
 std::uint8_t* TableWalker::encodeFields(const PBCodable& message, const MessageDescriptor& descriptor,
                                         std::uint8_t* out, PBDataWriter& writer) {
   const ScalarRow* const end = descriptor.scalars + descriptor.rowCount;
-  Output output = encodeScalars(message, descriptor, {out, descriptor.scalars});
+  Output output = {descriptor.encodeFront(message, out), descriptor.scalars + descriptor.frontCount};
   while (output.row != end) {
     const FieldDescriptor& row = descriptor.rows[output.row - descriptor.scalars];
     out = output.out;
@@ -160,7 +125,7 @@ inline std::uint8_t* TableWalker::encodeBytes(std::span<const std::uint8_t> byte
   if (descriptor.isFlat) {
     // Everything has its room, so the record does not move while it is written.
     std::uint8_t* const start = out;
-    out = encodeScalars(element, descriptor, {start + 1, descriptor.scalars}).out;
+    out = descriptor.encodeFront(element, start + 1);
     const std::ptrdiff_t length = out - start - 1;
     if (length >= 0x80) return writer.closeRecord(out, writer.offsetOf(start));
     *start = static_cast<std::uint8_t>(length);

@@ -97,6 +97,16 @@ struct ScalarRow {
   FieldKind kind = FieldKind::RepeatedMessage;
 };
 
+// How far a record has been decoded, and which field is expected next.
+struct DecodingProgress {
+  const std::uint8_t* position;
+  const ScalarRow* expected;
+};
+
+// How many bytes before the payload's end the tail begins, which is read with care: a key of two bytes and a value of
+// two fit before it.
+inline constexpr std::size_t decodingTailSize = 3;
+
 // How many bytes more than it needs the last scalar may write over when it is written as a word of eight bytes.
 inline constexpr std::uint16_t wordSlack = 7;
 
@@ -110,11 +120,16 @@ struct MessageDescriptor {
   const ScalarRow* scalars;
   std::uint16_t rowCount;
   std::uint16_t shortRowCount;  // how many of them, at the front, have keys of one byte
+  std::uint16_t frontCount;     // how many of them, at the front, are scalars
   // Where the field of that number stands in the rows; rowCount when there is none.
   std::array<std::uint8_t, fieldNumberLimit> rowOfNumber;
   std::uint16_t scalarBound;  // bytes that must be free to write all scalars of one message
   bool isFlat;                // scalars only: nothing that owns memory
   std::size_t size;           // bytes of an object
+  // Straight-line code for the scalars at the front (scalar_run.h).
+  DecodingProgress (*decodeFront)(PBCodable& message, const std::uint8_t* position, const std::uint8_t* limit,
+                                  const std::uint8_t* tail) noexcept;
+  std::uint8_t* (*encodeFront)(const PBCodable& message, std::uint8_t* out) noexcept;
   // Makes a message in memory of the given block, to which it belongs from then on.
   PBCodable* (*makeElement)(void* memory, Block& block);
   std::unique_ptr<PBCodable> (*make)();

@@ -31,6 +31,7 @@
 
 #include "messages/runtime/codable.h"
 #include "messages/runtime/metric_utility.h"
+#include "messages/runtime/scalar_run.h"
 
 namespace probeview {
 
@@ -143,8 +144,11 @@ consteval MessageDescriptor describeMessage(std::string_view name) {
     descriptor.scalarBound = static_cast<std::uint16_t>(descriptor.scalarBound + scalarBound(row));
     if (!isScalar(row.kind)) descriptor.isFlat = false;
     if (row.key < 0x80) ++descriptor.shortRowCount;
+    if (isScalar(row.kind) && descriptor.frontCount == index) ++descriptor.frontCount;
   }
   descriptor.size = sizeof(Message);
+  descriptor.decodeFront = ScalarRun::decodeFront<scalarRows<Message>>;
+  descriptor.encodeFront = ScalarRun::encodeFront<scalarRows<Message>>;
   descriptor.makeElement = [](void* memory, Block& block) -> PBCodable* { return Message::make(memory, block); };
   descriptor.make = []() -> std::unique_ptr<PBCodable> { return std::make_unique<Message>(); };
   descriptor.renew = [](PBCodable& message) { Message::renew(static_cast<Message&>(message)); };

@@ -38,19 +38,19 @@ struct TableWalker {
 
  private:
   struct Decoding;
-  struct Progress;
-  template <int KeySize>
-  static Progress decodeRun(PBCodable& message, Progress progress, const std::uint8_t* limit, const std::uint8_t* tail,
-                            std::uint64_t& hasBits) noexcept;
-  static Progress decodeExpected(PBCodable& message, Progress progress, const std::uint8_t* limit,
-                                 const Decoding& decoding) noexcept;
+  template <std::size_t KeySize>
+  static DecodingProgress decodeRun(PBCodable& message, DecodingProgress progress, const std::uint8_t* limit,
+                                    const std::uint8_t* tail) noexcept;
+  static DecodingProgress decodeTail(PBCodable& message, DecodingProgress progress, const std::uint8_t* limit) noexcept;
+  static DecodingProgress decodeExpected(PBCodable& message, DecodingProgress progress, const std::uint8_t* limit,
+                                         const Decoding& decoding) noexcept;
   static const std::uint8_t* decodeRecord(PBCodable& message, const MessageDescriptor& descriptor,
                                           const std::uint8_t* position, const std::uint8_t* limit, Decoding& decoding);
   static const std::uint8_t* decodeElements(PBMessageList& list, const FieldDescriptor& row,
                                             const std::uint8_t* position, const std::uint8_t* limit,
                                             Decoding& decoding);
-  static const std::uint8_t* decodeOthers(PBCodable& message, const MessageDescriptor& descriptor, Progress progress,
-                                          const std::uint8_t* limit, Decoding& decoding);
+  static const std::uint8_t* decodeOthers(PBCodable& message, const MessageDescriptor& descriptor,
+                                          DecodingProgress progress, const std::uint8_t* limit, Decoding& decoding);
   struct Output;
   template <unsigned KeySize>
   static Output encodeRun(const PBCodable& message, Output output, const ScalarRow* end) noexcept;
