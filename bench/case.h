@@ -29,6 +29,7 @@ struct Contender {
 };
 
 std::vector<Contender> ourContenders();
+std::vector<Contender> unpredictedContenders();
 std::vector<Contender> libprotobufContenders();
 std::vector<Contender> protozeroContenders();
 std::vector<Contender> nanopbContenders();

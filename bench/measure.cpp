@@ -16,7 +16,8 @@ namespace probeview::bench {
 
 std::vector<Contender> allContenders() {
   std::vector<Contender> all;
-  for (auto part : {ourContenders, libprotobufContenders, protozeroContenders, nanopbContenders}) {
+  for (auto part :
+       {ourContenders, unpredictedContenders, libprotobufContenders, protozeroContenders, nanopbContenders}) {
     const std::vector<Contender> contenders = part();
     all.insert(all.end(), contenders.begin(), contenders.end());
   }
