@@ -182,8 +182,8 @@ const std::uint8_t* TableWalker::decodeOthers(PBCodable& message, const MessageD
     if (key.next == nullptr) return nullptr;
     const std::uint8_t* position = key.next;
     if ((key.value & 7) == static_cast<unsigned>(wire::WireType::EndGroup)) return position;
-    const FieldDescriptor* row = descriptor.rows + (progress.expected - descriptor.scalars);
-    if (key.value != row->expectedKey) {
+    auto index = static_cast<std::size_t>(progress.expected - descriptor.scalars);
+    if (key.value != descriptor.rows[index].expectedKey) {
       // Only 16 bits of a field number count.
       const auto number = static_cast<std::uint16_t>(key.value >> 3);
       // Before the fields: one that has the number of a metric is written, but never decoded.
@@ -195,13 +195,14 @@ const std::uint8_t* TableWalker::decodeOthers(PBCodable& message, const MessageD
         progress.position = dropped.next;
         continue;
       }
-      row = descriptor.field(number);
-      if (row == nullptr) {
+      index = number < fieldNumberLimit ? descriptor.rowOfNumber[number] : descriptor.rowCount;
+      if (index == descriptor.rowCount) {
         progress.position = wire::skipValue(position, limit, key.value & 7);
         if (progress.position == nullptr) return nullptr;
         continue;
       }
     }
+    const FieldDescriptor* const row = &descriptor.rows[index];
     // The key's wire type plays no part, but for the two forms of repeated numbers.
     switch (row->kind) {
       case FieldKind::UInt64:
@@ -251,8 +252,10 @@ const std::uint8_t* TableWalker::decodeOthers(PBCodable& message, const MessageD
         break;
     }
     if (position == nullptr) return nullptr;
-    progress = {position, descriptor.scalars + (row - descriptor.rows) + 1};
-    if (position < limit) progress = decodeExpected(message, progress, limit, decoding);
+    progress = {position, &descriptor.scalars[index + 1]};
+    // One look, so that fields in another order cost little more than that.
+    const bool mayBeNext = position < limit && *position == static_cast<std::uint8_t>(progress.expected->keyBytes);
+    if (mayBeNext) progress = decodeExpected(message, progress, limit, decoding);
   }
   return progress.position;
 }
