@@ -4,8 +4,8 @@
 #include <fcntl.h>
 #include <poll.h>
 #include <signal.h>
-#include <spawn.h>
 #include <stdlib.h>
+#include <sys/prctl.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -33,16 +33,19 @@ class RadixdProcess {
     if (::pipe2(ends, O_CLOEXEC) != 0) return false;
     errors_ = FileDescriptor(ends[0]);
     const FileDescriptor writing(ends[1]);
-    posix_spawn_file_actions_t actions;
-    posix_spawn_file_actions_init(&actions);
-    posix_spawn_file_actions_adddup2(&actions, writing.number(), STDERR_FILENO);
     std::vector<std::string> arguments{RADIXD, "--socket", socket(), "--source", source_};
     std::vector<char*> pointers;
     for (auto& argument : arguments) pointers.push_back(argument.data());
     pointers.push_back(nullptr);
-    const int refused = ::posix_spawn(&process_, RADIXD, &actions, nullptr, pointers.data(), environ);
-    posix_spawn_file_actions_destroy(&actions);
-    if (refused != 0) {
+    process_ = ::fork();
+    if (process_ == 0) {
+      // Also when the test itself is killed.
+      ::prctl(PR_SET_PDEATHSIG, SIGKILL);
+      ::dup2(writing.number(), STDERR_FILENO);
+      ::execv(RADIXD, pointers.data());
+      ::_exit(127);
+    }
+    if (process_ < 0) {
       process_ = 0;
       return false;
     }

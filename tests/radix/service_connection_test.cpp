@@ -107,6 +107,13 @@ class ServiceConnectionTest : public ::testing::Test {
     });
   }
 
+  // What still waits for handlers holds on to their queue.
+  void closeWith(ManualLoop& queue) {
+    manager_.reset();
+    loop_.run();
+    queue.run();
+  }
+
   PlayedService& current() { return *services_.back(); }
 
   std::vector<milliseconds> attemptTimes() const {
@@ -564,9 +571,7 @@ TEST_F(ServiceConnectionTest, FourThousandAndNinetySixEventsWaitForTheHandlersAn
     queue->run();
     loop_.run();
     EXPECT_EQ(roomLeft(current()), 256U);
-    manager_.reset();
-    queue->run();
-    loop_.run();
+    closeWith(*queue);
   }
 }
 
@@ -583,9 +588,7 @@ TEST_F(ServiceConnectionTest, TwoThousandAndFortyEightBytesOfPayloadCountAsOneEv
     roomLeft(current());
     loop_.run();
     EXPECT_EQ(roomLeft(current()), size == 2047 ? 256U : 0U);
-    manager_.reset();
-    queue->run();
-    loop_.run();
+    closeWith(*queue);
   }
 }
 
@@ -602,8 +605,7 @@ TEST_F(ServiceConnectionTest, LargeEventsThatComeAllAtOnceAreLeftInTheServiceLik
   const std::size_t taken = roomLeft(current()) + 200 - 256;
   EXPECT_LE(taken, 92U);
   EXPECT_GE(taken, 80U);
-  manager_.reset();
-  queue->run();
+  closeWith(*queue);
 }
 
 TEST_F(ServiceConnectionTest, SixtyFourAnswersMayBeLeftUnreadAndAServiceThatAsksOnceMoreIsLeft) {
