@@ -212,7 +212,7 @@ class PBCodable {
 
  private:
   friend struct TableWalker;
-  friend struct ScalarRun;
+  friend struct FieldRun;
 
   std::uint64_t _has = 0;  // bit n: the scalar field of number n is present
   Block* block_ = nullptr;

@@ -2,20 +2,11 @@
 #include <algorithm>
 #include <cstdio>
 
+#include "messages/runtime/field_run.h"
 #include "messages/runtime/metric_utility.h"
-#include "messages/runtime/scalar_run.h"
 #include "messages/runtime/table_walker.h"
 
 namespace probeview {
-
-// What the decoding of one payload shares between the records nested in it.
-struct TableWalker::Decoding {
-  PBCodable& root;
-  LineSink* log;
-  const std::uint8_t* tail;  // the last few bytes of the payload, which are read with care
-
-  Block& block() { return blockOf(root); }
-};
 
 namespace {
 
@@ -41,8 +32,8 @@ inline Record readRecord(const std::uint8_t* position, const std::uint8_t* limit
 // Hands over the numbers of one occurrence of a repeated scalar, packed or single. A last number inside which the data
 // ends is handed over as 0 before decoding fails.
 template <typename Add>
-const std::uint8_t* decodeNumbers(std::uint64_t key, const std::uint8_t* position, const std::uint8_t* limit,
-                                  const Add& add) {
+const std::uint8_t* handOverNumbers(std::uint64_t key, const std::uint8_t* position, const std::uint8_t* limit,
+                                    const Add& add) {
   if ((key & 7) != static_cast<unsigned>(wire::WireType::LengthDelimited)) {
     const wire::Varint number = wire::readVarint(position, limit);
     add(static_cast<std::uint32_t>(number.value));
@@ -67,6 +58,9 @@ inline const std::uint8_t* readKey(const std::uint8_t* position, const std::uint
   return isThere ? position + 2 : position;
 }
 
+// The block for all that the decoded message owns.
+inline Block& blockOf(Decoding& decoding) { return TableWalker::blockOf(decoding.root); }
+
 // Where the tail of the payload begins.
 inline const std::uint8_t* tailOf(const std::uint8_t* begin, const std::uint8_t* end) noexcept {
   return end - begin > static_cast<std::ptrdiff_t>(decodingTailSize) ? end - decodingTailSize : begin;
@@ -74,7 +68,7 @@ inline const std::uint8_t* tailOf(const std::uint8_t* begin, const std::uint8_t*
 
 }  // namespace
 
-wire::Varint ScalarRun::readLongValue(const std::uint8_t* position, const std::uint8_t* tail) noexcept {
+wire::Varint FieldRun::readLongValue(const std::uint8_t* position, const std::uint8_t* tail) noexcept {
   return readEight(position, tail);
 }
 
@@ -95,8 +89,8 @@ bool TableWalker::decode(PBCodable& message, PBDataReader& reader) {
                                                                             const std::uint8_t* position,
                                                                             const std::uint8_t* limit,
                                                                             Decoding& decoding) {
-  DecodingProgress progress = descriptor.decodeFront(message, position, limit, decoding.tail);
-  if (progress.position == limit) return limit;
+  DecodingProgress progress = descriptor.decodeInOrder(message, position, limit, decoding);
+  if (progress.position == limit || progress.position == nullptr) return progress.position;
   if (progress.position >= decoding.tail) {
     progress = decodeTail(message, progress, limit);
     if (progress.position == limit) return limit;
@@ -110,8 +104,8 @@ DecodingProgress TableWalker::decodeTail(PBCodable& message, DecodingProgress pr
   const auto decodeNext = [&]<std::size_t KeySize>() {
     const ScalarRow& scalar = *progress.expected;
     if (limit - progress.position <= static_cast<std::ptrdiff_t>(KeySize)) return false;
-    if (!ScalarRun::isNext<KeySize>(scalar, progress.position) || progress.position[KeySize] >= 0x80) return false;
-    ScalarRun::store(message, scalar.kind, scalar.member, progress.position[KeySize]);
+    if (!FieldRun::isNext<KeySize>(scalar, progress.position) || progress.position[KeySize] >= 0x80) return false;
+    FieldRun::store(message, scalar.kind, scalar.member, progress.position[KeySize]);
     message._has |= scalar.hasBit;
     progress = {progress.position + KeySize + 1, &scalar + 1};
     return true;
@@ -129,11 +123,11 @@ template <std::size_t KeySize>
                                                                       const std::uint8_t* tail) noexcept {
   const std::uint8_t* const stop = std::min(limit, tail);
   std::uint64_t hasBits = 0;
-  while (progress.position < stop && ScalarRun::isNext<KeySize>(*progress.expected, progress.position)) {
+  while (progress.position < stop && FieldRun::isNext<KeySize>(*progress.expected, progress.position)) {
     const ScalarRow& scalar = *progress.expected;
-    const wire::Varint varint = ScalarRun::readValue<false>(progress.position + KeySize, tail);
+    const wire::Varint varint = FieldRun::readValue<false>(progress.position + KeySize, tail);
     if (varint.next == nullptr || varint.next > limit) break;
-    ScalarRun::store(message, scalar.kind, scalar.member, varint.value);
+    FieldRun::store(message, scalar.kind, scalar.member, varint.value);
     hasBits |= scalar.hasBit;
     progress = {varint.next, &scalar + 1};
   }
@@ -156,21 +150,52 @@ template <std::size_t KeySize>
   return progress.position < decoding.tail ? progress : decodeTail(message, progress, limit);
 }
 
+const std::uint8_t* FieldRun::decodeBytes(PBByteField& field, const std::uint8_t* position, const std::uint8_t* limit,
+                                          Decoding& decoding) {
+  const Record record = readRecord(position, limit);
+  if (record.end != nullptr) field.set({record.begin, record.end}, blockOf(decoding));
+  return record.end;
+}
+
+const std::uint8_t* FieldRun::decodeElement(PBMessageField& field, const FieldDescriptor& row,
+                                            const std::uint8_t* position, const std::uint8_t* limit,
+                                            Decoding& decoding) {
+  // Attached before it is decoded: what was decoded before a fault stays.
+  PBCodable* element = TableWalker::makeElement(*row.element, blockOf(decoding));
+  field.setLocal(element);
+  const Record record = readRecord(position, limit);
+  if (record.end == nullptr) return nullptr;
+  if (TableWalker::decodeRecord(*element, *row.element, record.begin, record.end, decoding) == nullptr) return nullptr;
+  // Also when an end of group has ended the element early.
+  return record.end;
+}
+
 // Elements of a list that follow one another, each behind the same key; the first key has been read.
-const std::uint8_t* TableWalker::decodeElements(PBMessageList& list, const FieldDescriptor& row,
-                                                const std::uint8_t* position, const std::uint8_t* limit,
-                                                Decoding& decoding) {
-  Block& block = decoding.block();
+const std::uint8_t* FieldRun::decodeElements(PBMessageList& list, const FieldDescriptor& row,
+                                             const std::uint8_t* position, const std::uint8_t* limit,
+                                             Decoding& decoding) {
+  Block& block = blockOf(decoding);
   const MessageDescriptor& descriptor = *row.element;
   while (true) {
-    PBCodable* element = makeElement(descriptor, block);
+    PBCodable* element = TableWalker::makeElement(descriptor, block);
     list.addLocal(element, block);
     const Record record = readRecord(position, limit);
     if (record.end == nullptr) return nullptr;
-    if (decodeRecord(*element, descriptor, record.begin, record.end, decoding) == nullptr) return nullptr;
+    if (TableWalker::decodeRecord(*element, descriptor, record.begin, record.end, decoding) == nullptr) return nullptr;
     position = readKey(record.end, limit, row.key);
     if (position == record.end) return position;
   }
+}
+
+const std::uint8_t* FieldRun::decodeNumbers(PBRepeatedUInt32& list, std::uint64_t key, const std::uint8_t* position,
+                                            const std::uint8_t* limit, Decoding& decoding) {
+  return handOverNumbers(key, position, limit, [&](std::uint32_t element) { list.add(element, blockOf(decoding)); });
+}
+
+const std::uint8_t* FieldRun::decodeNumbers(PBRepeatedInt32& list, std::uint64_t key, const std::uint8_t* position,
+                                            const std::uint8_t* limit, Decoding& decoding) {
+  return handOverNumbers(key, position, limit,
+                         [&](std::uint32_t element) { list.add(wire::unZigZag(element), blockOf(decoding)); });
 }
 
 // Goes on where decodeExpected() has stopped.
@@ -213,48 +238,33 @@ const std::uint8_t* TableWalker::decodeOthers(PBCodable& message, const MessageD
       case FieldKind::Bool: {
         // Present even if the data ends inside it; it is 0 then.
         const wire::Varint scalar = wire::readVarint(position, limit);
-        ScalarRun::store(message, row->kind, row->member, scalar.value);
+        FieldRun::store(message, row->kind, row->member, scalar.value);
         message.setBit(row->number);
         position = scalar.next;
         break;
       }
       case FieldKind::Bytes:
-      case FieldKind::Text: {
-        const Record record = readRecord(position, limit);
-        if (record.end == nullptr) return nullptr;
-        (message.*row->member.bytes).set({record.begin, record.end}, decoding.block());
-        position = record.end;
+      case FieldKind::Text:
+        position = FieldRun::decodeBytes(message.*row->member.bytes, position, limit, decoding);
         break;
-      }
-      case FieldKind::Message: {
-        // Attached before it is decoded: what was decoded before a fault stays.
-        PBCodable* element = makeElement(*row->element, decoding.block());
-        (message.*row->member.message).setLocal(element);
-        const Record record = readRecord(position, limit);
-        if (record.end == nullptr) return nullptr;
-        if (decodeRecord(*element, *row->element, record.begin, record.end, decoding) == nullptr) return nullptr;
-        // Also when an end of group has ended the element early.
-        position = record.end;
+      case FieldKind::Message:
+        position = FieldRun::decodeElement(message.*row->member.message, *row, position, limit, decoding);
         break;
-      }
       case FieldKind::RepeatedMessage:
-        position = decodeElements(message.*row->member.messages, *row, position, limit, decoding);
+        position = FieldRun::decodeElements(message.*row->member.messages, *row, position, limit, decoding);
         break;
       case FieldKind::RepeatedUInt32:
-        position = decodeNumbers(key.value, position, limit, [&](std::uint32_t element) {
-          (message.*row->member.unsigned32List).add(element, decoding.block());
-        });
+        position = FieldRun::decodeNumbers(message.*row->member.unsigned32List, key.value, position, limit, decoding);
         break;
       case FieldKind::RepeatedSInt32:
-        position = decodeNumbers(key.value, position, limit, [&](std::uint32_t element) {
-          (message.*row->member.signed32List).add(wire::unZigZag(element), decoding.block());
-        });
+        position = FieldRun::decodeNumbers(message.*row->member.signed32List, key.value, position, limit, decoding);
         break;
     }
     if (position == nullptr) return nullptr;
     progress = {position, &descriptor.scalars[index + 1]};
-    // One look, so that fields in another order cost little more than that.
-    const bool mayBeNext = position < limit && *position == static_cast<std::uint8_t>(progress.expected->keyBytes);
+    // One look, so that fields in another order cost little more than that. The key that there is not has all bits.
+    const bool mayBeNext = position < limit && *position == static_cast<std::uint8_t>(progress.expected->shortKey &
+                                                                                      progress.expected->longKey);
     if (mayBeNext) progress = decodeExpected(message, progress, limit, decoding);
   }
   return progress.position;

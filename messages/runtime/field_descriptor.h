@@ -19,6 +19,8 @@
 namespace probeview {
 
 class PBCodable;
+class PBDataWriter;
+struct Decoding;
 struct MessageDescriptor;
 
 enum class FieldKind : std::uint8_t {
@@ -80,20 +82,17 @@ struct FieldDescriptor {
   const MessageDescriptor* element = nullptr;     // of a nested message, single or repeated
 };
 
-// The part of a row that decoding and encoding need of a scalar: short, so that the rows of most messages lie in a few
-// cache lines. There is one for each row, in the same order.
+// The part of a row that decoding a scalar needs where the straight-line code has stopped: short, so that the rows of
+// most messages lie in a few cache lines. There is one for each row, in the same order.
 struct ScalarRow {
   // Stands where there is no such key: no one or two bytes make it.
   static constexpr std::uint32_t none = 0xFFFFFFFF;
 
   FieldMember member;
   std::uint64_t hasBit = 0;  // 0 where the field is no scalar
-  // The keys that decoding expects, of one byte or of two, the first one in the low bits.
+  // The keys that are expected, of one byte or of two, the first one in the low bits.
   std::uint32_t shortKey = none;
   std::uint32_t longKey = none;
-  // The key that encoding writes, one byte or two.
-  std::uint16_t keyBytes = 0;
-  std::uint8_t keySize = 0;
   FieldKind kind = FieldKind::RepeatedMessage;
 };
 
@@ -119,17 +118,15 @@ struct MessageDescriptor {
   const FieldDescriptor* rows;
   const ScalarRow* scalars;
   std::uint16_t rowCount;
-  std::uint16_t shortRowCount;  // how many of them, at the front, have keys of one byte
-  std::uint16_t frontCount;     // how many of them, at the front, are scalars
   // Where the field of that number stands in the rows; rowCount when there is none.
   std::array<std::uint8_t, fieldNumberLimit> rowOfNumber;
   std::uint16_t scalarBound;  // bytes that must be free to write all scalars of one message
   bool isFlat;                // scalars only: nothing that owns memory
   std::size_t size;           // bytes of an object
-  // Straight-line code for the scalars at the front (scalar_run.h).
-  DecodingProgress (*decodeFront)(PBCodable& message, const std::uint8_t* position, const std::uint8_t* limit,
-                                  const std::uint8_t* tail) noexcept;
-  std::uint8_t* (*encodeFront)(const PBCodable& message, std::uint8_t* out) noexcept;
+  // Straight-line code for the fields in their order (field_run.h).
+  DecodingProgress (*decodeInOrder)(PBCodable& message, const std::uint8_t* position, const std::uint8_t* limit,
+                                    Decoding& decoding);
+  std::uint8_t* (*encodeFields)(const PBCodable& message, std::uint8_t* out, PBDataWriter& writer);
   // Makes a message in memory of the given block, to which it belongs from then on.
   PBCodable* (*makeElement)(void* memory, Block& block);
   std::unique_ptr<PBCodable> (*make)();

@@ -30,8 +30,8 @@
 #include <span>
 
 #include "messages/runtime/codable.h"
+#include "messages/runtime/field_run.h"
 #include "messages/runtime/metric_utility.h"
-#include "messages/runtime/scalar_run.h"
 
 namespace probeview {
 
@@ -94,38 +94,13 @@ consteval auto collectScalars() {
     const bool isShort = row.key < 0x80;
     scalar.member = row.member;
     scalar.hasBit = std::uint64_t{1} << row.number;
-    scalar.keyBytes = static_cast<std::uint16_t>(isShort ? row.key : (row.key & 0x7F) | 0x80 | row.key >> 7 << 8);
-    scalar.keySize = isShort ? 1 : 2;
-    if (row.expectedKey != neverExpected) (isShort ? scalar.shortKey : scalar.longKey) = scalar.keyBytes;
+    if (row.expectedKey != neverExpected) (isShort ? scalar.shortKey : scalar.longKey) = FieldRun::keyBytes(row.key);
   }
   return scalars;
 }
 
 template <typename Message>
 inline constexpr auto scalarRows = collectScalars<Message>();
-
-constexpr std::uint16_t scalarBound(const FieldDescriptor& row) noexcept {
-  const std::size_t keySize = wire::varintSize(row.key);
-  switch (row.kind) {
-    case FieldKind::UInt64:
-    case FieldKind::Int32:  // negative numbers take ten bytes
-    case FieldKind::Enumeration:
-      return static_cast<std::uint16_t>(keySize + 10);
-    case FieldKind::UInt32:
-    case FieldKind::SInt32:
-      return static_cast<std::uint16_t>(keySize + 5);
-    case FieldKind::Bool:
-      return static_cast<std::uint16_t>(keySize + 1);
-    case FieldKind::Bytes:
-    case FieldKind::Text:
-    case FieldKind::Message:
-    case FieldKind::RepeatedMessage:
-    case FieldKind::RepeatedUInt32:
-    case FieldKind::RepeatedSInt32:
-      return 0;
-  }
-  return 0;
-}
 
 template <typename Message>
 consteval MessageDescriptor describeMessage(std::string_view name) {
@@ -136,19 +111,16 @@ consteval MessageDescriptor describeMessage(std::string_view name) {
   descriptor.scalars = scalarRows<Message>.data();
   descriptor.rowCount = count;
   descriptor.rowOfNumber.fill(count);
-  descriptor.scalarBound = wordSlack;
+  descriptor.scalarBound = FieldRun::roomFrom<fieldRows<Message>>(0);
   descriptor.isFlat = true;
   for (std::size_t index = 0; index < count; ++index) {
     const FieldDescriptor& row = fieldRows<Message>[index];
     descriptor.rowOfNumber[row.number] = static_cast<std::uint8_t>(index);
-    descriptor.scalarBound = static_cast<std::uint16_t>(descriptor.scalarBound + scalarBound(row));
     if (!isScalar(row.kind)) descriptor.isFlat = false;
-    if (row.key < 0x80) ++descriptor.shortRowCount;
-    if (isScalar(row.kind) && descriptor.frontCount == index) ++descriptor.frontCount;
   }
   descriptor.size = sizeof(Message);
-  descriptor.decodeFront = ScalarRun::decodeFront<scalarRows<Message>>;
-  descriptor.encodeFront = ScalarRun::encodeFront<scalarRows<Message>>;
+  descriptor.decodeInOrder = FieldRun::decode<fieldRows<Message>, scalarRows<Message>>;
+  descriptor.encodeFields = FieldRun::encode<fieldRows<Message>>;
   descriptor.makeElement = [](void* memory, Block& block) -> PBCodable* { return Message::make(memory, block); };
   descriptor.make = []() -> std::unique_ptr<PBCodable> { return std::make_unique<Message>(); };
   descriptor.renew = [](PBCodable& message) { Message::renew(static_cast<Message&>(message)); };

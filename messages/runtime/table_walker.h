@@ -37,7 +37,7 @@ struct TableWalker {
   }
 
  private:
-  struct Decoding;
+  friend struct FieldRun;
   template <std::size_t KeySize>
   static DecodingProgress decodeRun(PBCodable& message, DecodingProgress progress, const std::uint8_t* limit,
                                     const std::uint8_t* tail) noexcept;
@@ -46,25 +46,8 @@ struct TableWalker {
                                          const Decoding& decoding) noexcept;
   static const std::uint8_t* decodeRecord(PBCodable& message, const MessageDescriptor& descriptor,
                                           const std::uint8_t* position, const std::uint8_t* limit, Decoding& decoding);
-  static const std::uint8_t* decodeElements(PBMessageList& list, const FieldDescriptor& row,
-                                            const std::uint8_t* position, const std::uint8_t* limit,
-                                            Decoding& decoding);
   static const std::uint8_t* decodeOthers(PBCodable& message, const MessageDescriptor& descriptor,
                                           DecodingProgress progress, const std::uint8_t* limit, Decoding& decoding);
-  struct Output;
-  template <unsigned KeySize>
-  static Output encodeRun(const PBCodable& message, Output output, const ScalarRow* end) noexcept;
-  static Output encodeScalars(const PBCodable& message, const MessageDescriptor& descriptor, Output output) noexcept;
-  static std::uint8_t* encodeFields(const PBCodable& message, const MessageDescriptor& descriptor, std::uint8_t* out,
-                                    PBDataWriter& writer);
-  static std::uint8_t* encodeBytes(std::span<const std::uint8_t> bytes, const FieldDescriptor& row, std::uint8_t* out,
-                                   std::size_t room, PBDataWriter& writer);
-  static std::uint8_t* encodeElement(const PBCodable& element, const FieldDescriptor& row, std::uint8_t* out,
-                                     PBDataWriter& writer);
-  static std::uint8_t* encodeElements(const PBMessageList& list, const FieldDescriptor& row, std::uint8_t* out,
-                                      PBDataWriter& writer);
-  static std::uint8_t* encodeObject(const PBCodable& message, const FieldDescriptor& row, std::uint8_t* out,
-                                    PBDataWriter& writer);
   static PBCodable* makeElement(const MessageDescriptor& descriptor, Block& block) {
     return descriptor.makeElement(block.allocate(descriptor.size), block);
   }
