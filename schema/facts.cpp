@@ -9,7 +9,8 @@ namespace {
 
 // clang-format off
 
-constexpr std::array fieldFacts = {
+// A plain array, because clang gives up on guessing the size of so large a std::array.
+constexpr FieldFacts fieldFacts[] = {
     // KCellularLteRrcState
     FieldFacts{"KCellularLteRrcState", "timestamp", "Time of the values, ms since 1970-01-01 UTC", "shown as text in the time zone of the device"},
     FieldFacts{"KCellularLteRrcState", "state", "RRC state (3GPP TS 36.331, 4.2.1)", ""},
