@@ -128,7 +128,9 @@ TEST(WindowSoak, ARestlessHandStopsNothingLosesNothingAndLeaksNothing) {
   RecordProperty("resident_kB_at_the_end", static_cast<int>(finalMemory));
   if (!isLong) return;
   EXPECT_TRUE(filled) << "every metric that the service can fill has come";
-  EXPECT_LT(finalMemory, settledMemory + 4096);
+  // Pages that are opened for the first time still fill the toolkit's caches, some 4 MB of them in the second half of a
+  // drive on a busy machine; what every record or page leaked would be many times as much.
+  EXPECT_LT(finalMemory, settledMemory + 8192);
 }
 
 }  // namespace
