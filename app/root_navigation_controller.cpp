@@ -31,6 +31,7 @@ void RootNavigationController::viewDidLoad() {
   NavigationStack::viewDidLoad();
   if (myRadixWrapper) myRadixWrapper->removeTelemConfigForAppid(myAppID);
   const auto path = resourcePath(metricFileName, metricFileType);
+  metricFileIsMissing_ = !path;
   if (!path) {
     consoleLog_.line("Metric Log File path doesnt exist");
     return;

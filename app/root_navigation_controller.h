@@ -42,7 +42,11 @@ class RootNavigationController final : public SessionProperties, public Navigati
   void viewDidLoad() override;
   void didReceiveMemoryWarning() override;
 
+  // Whether there was no configuration file to push when the session began; the pages keep their defaults then.
+  bool metricFileIsMissing() const { return metricFileIsMissing_; }
+
  private:
+  bool metricFileIsMissing_ = false;
   LineSink& consoleLog_;
 };
 

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "client/radix_wrapper.h"
 
+#include <algorithm>
 #include <charconv>
 #include <fstream>
 #include <span>
@@ -47,7 +48,7 @@ struct RadixWrapper::Shared {
   LineSink& systemLog;
   const Clock& clock;
   Guarded<std::weak_ptr<RadixWrapperDelegate>> delegate;
-  std::optional<ServiceStatus::LastRecord> lastRecord;  // main thread
+  ServiceStatus status;  // main thread
 
   // On the wrapper's queue.
   static void take(const std::shared_ptr<Shared>& shared, const radix::client::ObjectHandle& event,
@@ -70,13 +71,32 @@ struct RadixWrapper::Shared {
 
   void noteRecord(const Dictionary& event) {
     ServiceStatus::LastRecord record;
+    if (const Value* metric = event.find(radix::kKeyMetricID)) record.metricId = metric->int64().value_or(0);
     if (const Value* origin = event.find(radix::kKeyOrigin)) record.origin = origin->text().value_or("");
-    if (const Value* time = event.find(radix::kKeyTime); time != nullptr && time->int64()) {
-      record.time = std::chrono::milliseconds(*time->int64());
-    }
+    record.time = milliseconds(event, radix::kKeyTime);
+    record.age = span(event, radix::kKeyAge);
+    record.period = span(event, radix::kKeyPeriod);
     record.receivedWallTime = clock.wallTime();
     record.receivedMonotonicTime = clock.monotonicTime();
-    lastRecord = std::move(record);
+    if (const auto known = status.lastRecords.find(record.metricId); known != status.lastRecords.end()) {
+      known->second = record;
+    } else if (status.lastRecords.size() < ServiceStatus::mostMetrics) {
+      status.lastRecords.emplace(record.metricId, record);
+    }
+    status.lastRecord = std::move(record);
+  }
+
+  static std::optional<std::chrono::milliseconds> milliseconds(const Dictionary& event, std::string_view key) {
+    const Value* value = event.find(key);
+    if (value == nullptr || !value->int64()) return std::nullopt;
+    return std::chrono::milliseconds(*value->int64());
+  }
+
+  // Whatever the library in use has let pass, sums of spans must not overflow.
+  static std::optional<std::chrono::milliseconds> span(const Dictionary& event, std::string_view key) {
+    const auto given = milliseconds(event, key);
+    if (!given) return std::nullopt;
+    return std::clamp(*given, std::chrono::milliseconds(0), radix::longestSpan);
   }
 };
 
@@ -159,8 +179,9 @@ void RadixWrapper::setDelegate(std::weak_ptr<RadixWrapperDelegate> delegate) {
   shared_->delegate.set(std::move(delegate));
 }
 
-ServiceStatus RadixWrapper::serviceStatus() const {
-  return {radix::client::Connection(radixManager_), shared_->lastRecord};
+const ServiceStatus& RadixWrapper::serviceStatus() const {
+  shared_->status.connection = radix::client::Connection(radixManager_);
+  return shared_->status;
 }
 
 std::optional<std::set<std::int64_t>> RadixWrapper::fillableMetrics() const {

@@ -5,6 +5,7 @@
 
 #include <chrono>
 #include <cstdint>
+#include <map>
 #include <memory>
 #include <optional>
 #include <set>
@@ -20,17 +21,31 @@
 
 namespace probeview {
 
-// Whether the service is there, what feeds it and how old the last record is; for saying why values stand still.
+using radix::client::ConfigurationOutcome;
+
+// Whether the service is there, what feeds it, what it made of the configuration and how old the last records are; for
+// saying why values stand still.
 struct ServiceStatus {
   struct LastRecord {
     std::string origin;                                // such as "scenario:city"; empty when the event names none
     std::optional<std::chrono::milliseconds> time;     // when it was measured, since 1970-01-01 UTC
     std::chrono::milliseconds receivedWallTime{};      // when it reached the main thread, since 1970-01-01 UTC
     std::chrono::nanoseconds receivedMonotonicTime{};  // the same moment on the clock that only goes forward
+    // How old it was when it left the service, 0 to radix::longestSpan; absent when the service does not say. From then
+    // on it has grown older by what has gone by since receivedMonotonicTime.
+    std::optional<std::chrono::milliseconds> age{};
+    // Its source's period for the metric, 0 to radix::longestSpan; 0: on change, or asked for once. Absent when the
+    // service does not say.
+    std::optional<std::chrono::milliseconds> period{};
+    std::int64_t metricId = 0;  // such as 0x3C4E04; 0 when the event names none
   };
+  // More metrics than there are: a service that invents identifiers does not fill the memory.
+  static constexpr std::size_t mostMetrics = 256;
 
   radix::client::ConnectionState connection;
-  std::optional<LastRecord> lastRecord;  // the last metric event that was handed to a delegate
+  std::optional<LastRecord> lastRecord{};  // the last metric event that was handed to a delegate
+  // The last one of each metric, by its identifier; at most mostMetrics.
+  std::map<std::int64_t, LastRecord> lastRecords{};
 };
 
 // Commands run on the caller's thread and return whether the service's status is 0. Events come on the wrapper's queue,
@@ -72,8 +87,9 @@ class RadixWrapper {
   // Kept weakly. Set on the main thread.
   void setDelegate(std::weak_ptr<RadixWrapperDelegate> delegate);
 
-  // Main thread.
-  ServiceStatus serviceStatus() const;
+  // Main thread. As it is now; the reference holds until the next call, and nothing but the connection's few words is
+  // copied.
+  const ServiceStatus& serviceStatus() const;
   // The identifiers of the metrics that the service's sources can fill; absent when it does not say. Asks the service.
   std::optional<std::set<std::int64_t>> fillableMetrics() const;
 

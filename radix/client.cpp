@@ -13,7 +13,12 @@ probeview::Dictionary nativeDictionary(const Object& object) { return object.con
 ObjectHandle makeObject(const probeview::Dictionary& dictionary) { return std::make_shared<Object>(dictionary); }
 
 ManagerHandle CreateManager(std::string clientName, std::shared_ptr<probeview::TaskQueue> queue) {
-  return makeSocketManager(std::move(clientName), std::move(queue), SocketSurroundings::ofThisProcess());
+  return CreateManager(std::move(clientName), std::move(queue), ManagerOptions{});
+}
+
+ManagerHandle CreateManager(std::string clientName, std::shared_ptr<probeview::TaskQueue> queue,
+                            ManagerOptions options) {
+  return makeSocketManager(std::move(clientName), std::move(queue), SocketSurroundings::ofThisProcess(), options);
 }
 
 Result PerformCommand(const ManagerHandle& manager, std::string_view command, const probeview::Dictionary& arguments,

@@ -15,6 +15,7 @@
 #include <optional>
 #include <string>
 #include <string_view>
+#include <vector>
 
 #include "platform/task_queue.h"
 #include "values/dictionary.h"
@@ -33,6 +34,15 @@ inline constexpr char kKeyTriggerType[] = "kKeyTriggerType";  // 64-bit integer
 // Events of this service also say when and by whom they were measured.
 inline constexpr char kKeyTime[] = "kKeyTime";      // 64-bit integer, milliseconds since 1970-01-01 UTC
 inline constexpr char kKeyOrigin[] = "kKeyOrigin";  // text, such as "scenario:city"
+// How old the record was when it left the service, by a clock that is never set: 64-bit integer, milliseconds, 0 to
+// longestSpan. Absent when the service is older than this key.
+inline constexpr char kKeyAge[] = "kKeyAge";
+// How often its source reports the metric as things are: 64-bit integer, milliseconds, 0 to longestSpan; 0: on change,
+// or because it was asked for. Absent when the service is older than this key.
+inline constexpr char kKeyPeriod[] = "kKeyPeriod";
+
+// Thirty years. What a service says beyond that is cut to it, so that sums of some of them fit into nanoseconds.
+inline constexpr std::chrono::milliseconds longestSpan{std::int64_t{30} * 365 * 24 * 3600 * 1000};
 
 // What our programs call themselves in kKeyAppID.
 inline constexpr std::int64_t serviceAppId = 2;
@@ -66,12 +76,41 @@ struct Result {
 using EventHandler = std::function<void(const ObjectHandle& event, Group group)>;
 
 ManagerHandle CreateManager(std::string clientName, std::shared_ptr<probeview::TaskQueue> queue);
+
+struct ManagerOptions {
+  // An observer needs no configuration: it is given the last record of each metric when it first switches events on,
+  // then every record that flows, and for it sources run at their own periods. Others are given what the configuration
+  // that they have pushed names, and the answers to their queries. A service older than this option gives everything
+  // to whoever has pushed nothing.
+  bool observes = false;
+};
+ManagerHandle CreateManager(std::string clientName, std::shared_ptr<probeview::TaskQueue> queue,
+                            ManagerOptions options);
+
 Result PerformCommand(const ManagerHandle& manager, std::string_view command, const probeview::Dictionary& arguments,
                       ObjectHandle& reply);
 // Replaces the handler registered for the event name before.
 void RegisterEventHandler(const ManagerHandle& manager, std::string_view event, EventHandler handler);
 void EventsOn(const ManagerHandle& manager);
 void EventsOff(const ManagerHandle& manager);
+
+// What the service says of one of its sources.
+struct SourceState {
+  enum class Phase : std::uint8_t { Running, Ended, Failed };
+  std::string origin;                 // as in kKeyOrigin; at most 1024 bytes
+  Phase phase = Phase::Running;       // Ended: it has told all that it had, such as a trace that was played
+  std::string reason;                 // why it failed, for people; at most 512 bytes
+  std::vector<std::int64_t> metrics;  // the identifiers of the metrics that it can fill, or could; at most 256
+  friend bool operator==(const SourceState&, const SourceState&) = default;
+};
+
+// What has become of the configuration that was pushed last, on this connection or restored on it.
+enum class ConfigurationOutcome : std::uint8_t {
+  NotPushed,  // none was, or it was cleared
+  Accepted,
+  Refused,  // by the service, or by this library, as it fits into no frame
+  Unsent,   // no service has judged it so far; it is pushed when one comes
+};
 
 // Whether a service answers, and since when; for showing why values stand still.
 struct ConnectionState {
@@ -81,6 +120,10 @@ struct ConnectionState {
   std::string serviceName{};     // what the service last called itself, such as "radixd 0.1.0"
   std::string trouble{};         // why there is no connection, for people; empty while there is one
   std::uint64_t lostEvents = 0;  // events that the service could not deliver because this client was too slow
+  // What feeds the service, at most 32 of them; absent while there is no connection and when the service does not say.
+  std::optional<std::vector<SourceState>> sources{};
+  ConfigurationOutcome configuration = ConfigurationOutcome::NotPushed;
+  std::string configurationTrouble{};  // why it was refused or is unsent, for people; empty otherwise
 };
 ConnectionState Connection(const ManagerHandle& manager);
 

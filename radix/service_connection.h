@@ -58,6 +58,7 @@ class ServiceConnection final : public std::enable_shared_from_this<ServiceConne
 
   struct Identity {
     std::string clientName;
+    bool observes = false;
     std::uint32_t version = protocolVersion;
     std::uint32_t oldestVersion = oldestProtocolVersion;
   };

@@ -17,10 +17,12 @@ using probeview::TaskQueue;
 
 class SocketManager final : public Manager {
  public:
-  SocketManager(std::string clientName, std::shared_ptr<TaskQueue> queue, SocketSurroundings surroundings)
+  SocketManager(std::string clientName, std::shared_ptr<TaskQueue> queue, SocketSurroundings surroundings,
+                ManagerOptions options)
       : thread_("radix.client"),
         manager_(makeConnectionManager(thread_.loop(), makeSocketConnector(thread_.loop(), std::move(surroundings)),
-                                       {.clientName = std::move(clientName)}, std::move(queue))) {}
+                                       {.clientName = std::move(clientName), .observes = options.observes},
+                                       std::move(queue))) {}
 
   Result performCommand(std::string_view command, const Dictionary& arguments, ObjectHandle& reply) override {
     return manager_->performCommand(command, arguments, reply);
@@ -57,9 +59,9 @@ class UnableManager final : public Manager {
 }  // namespace
 
 std::shared_ptr<Manager> makeSocketManager(std::string clientName, std::shared_ptr<TaskQueue> queue,
-                                           SocketSurroundings surroundings) {
+                                           SocketSurroundings surroundings, ManagerOptions options) {
   try {
-    return std::make_shared<SocketManager>(std::move(clientName), std::move(queue), std::move(surroundings));
+    return std::make_shared<SocketManager>(std::move(clientName), std::move(queue), std::move(surroundings), options);
   } catch (const std::system_error& error) {
     return std::make_shared<UnableManager>(std::string("cannot connect to the baseband service: ") + error.what());
   }

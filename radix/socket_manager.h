@@ -11,6 +11,6 @@ namespace radix::client {
 
 // A manager that speaks to the service over its socket, with a thread of its own for the connection.
 std::shared_ptr<Manager> makeSocketManager(std::string clientName, std::shared_ptr<probeview::TaskQueue> queue,
-                                           SocketSurroundings surroundings);
+                                           SocketSurroundings surroundings, ManagerOptions options = {});
 
 }  // namespace radix::client

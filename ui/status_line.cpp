@@ -31,7 +31,8 @@ std::string ageText(std::chrono::nanoseconds age) {
 }
 
 std::string StatusLine::text(const ServiceStatus& status) const {
-  const auto& [connection, lastRecord] = status;
+  const auto& connection = status.connection;
+  const auto& lastRecord = status.lastRecord;
   if (!connection.connected) {
     // Why it does not come is worth its place: who waits may be waiting at the wrong socket.
     if (!connection.everConnected) {
