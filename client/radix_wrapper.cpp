@@ -9,7 +9,6 @@
 #include <vector>
 
 #include "platform/serial_queue.h"
-#include "radix/service_commands.h"
 #include "values/printer.h"
 
 namespace probeview {
@@ -185,20 +184,12 @@ const ServiceStatus& RadixWrapper::serviceStatus() const {
 }
 
 std::optional<std::set<std::int64_t>> RadixWrapper::fillableMetrics() const {
-  radix::client::ObjectHandle reply;
-  const auto result = radix::client::PerformCommand(radixManager_, radix::kCommandShowStatus, {}, reply);
-  if (result.status != 0 || reply == nullptr) return std::nullopt;
-  const Dictionary report = radix::client::nativeDictionary(*reply);
-  const Value* sources = report.find("sources");
-  if (sources == nullptr || sources->list() == nullptr) return std::nullopt;
+  const auto& sources = serviceStatus().connection.sources;
+  if (!sources) return std::nullopt;
   std::set<std::int64_t> metrics;
-  for (const Value& source : *sources->list()) {
-    const Value* identifiers = source.dictionary() == nullptr ? nullptr : source.dictionary()->find("metric_ids");
-    // A service that does not say it of one source has not said it at all.
-    if (identifiers == nullptr || identifiers->list() == nullptr) return std::nullopt;
-    for (const Value& identifier : *identifiers->list()) {
-      if (identifier.int64()) metrics.insert(*identifier.int64());
-    }
+  for (const radix::client::SourceState& source : *sources) {
+    if (source.phase == radix::client::SourceState::Phase::Failed) continue;
+    metrics.insert(source.metrics.begin(), source.metrics.end());
   }
   return metrics;
 }

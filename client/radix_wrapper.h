@@ -90,7 +90,8 @@ class RadixWrapper {
   // Main thread. As it is now; the reference holds until the next call, and nothing but the connection's few words is
   // copied.
   const ServiceStatus& serviceStatus() const;
-  // The identifiers of the metrics that the service's sources can fill; absent when it does not say. Asks the service.
+  // The identifiers of the metrics that the service's sources can fill, those that have failed apart; absent while
+  // there is no service and when it does not say.
   std::optional<std::set<std::int64_t>> fillableMetrics() const;
 
  private:

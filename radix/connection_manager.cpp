@@ -2,6 +2,7 @@
 #include "radix/connection_manager.h"
 
 #include <atomic>
+#include <deque>
 #include <map>
 #include <utility>
 
@@ -43,13 +44,17 @@ ObjectHandle makeEventObject(const Event& event) {
     content.append(kKeyTriggerRef, number(event.triggerRef));
     content.append(kKeyTriggerType, number(event.triggerType));
   } else {
-    content.reserve(5);
+    content.reserve(7);
     content.append(kKeyMetricID, number(event.metricId));
     content.append(kKeyPayload, Value::bytes(event.payload));
     content.append(kKeyProfileID, number(event.profileId));
   }
   content.append(kKeyTime, number(event.time));
   content.append(kKeyOrigin, Value::text(event.origin));
+  if (event.kind == EventKind::Metric) {
+    if (event.age) content.append(kKeyAge, number(event.age->count()));
+    if (event.period) content.append(kKeyPeriod, number(event.period->count()));
+  }
   return std::make_shared<Object>(std::move(content));
 }
 
@@ -69,7 +74,12 @@ class EventRoad : public std::enable_shared_from_this<EventRoad> {
     handlers_.set(std::move(changed));
   }
 
-  void setOn(bool on) { on_ = on; }
+  // Once this has returned from switching off, no event begins to be handed over. What the service sent before it knew
+  // of that is kept for the next switching on: it is sent once only, and switching off and on again loses nothing.
+  void setOn(bool on) {
+    on_ = on;
+    if (on && waiting_ > 0) queue_->post([self = shared_from_this()] { self->handOver(); });
+  }
   void close() { closed_ = true; }
 
   // On the worker.
@@ -77,23 +87,44 @@ class EventRoad : public std::enable_shared_from_this<EventRoad> {
     const std::size_t weight = weightOf(events);
     const std::size_t before = waiting_.fetch_add(weight);
     if (before + weight > mostEventsWaiting && !stopped_.exchange(true)) connection->setEventsWelcome(false);
-    queue_->post(
-        [self = shared_from_this(), batch = std::move(events),
-         weak = std::weak_ptr<ServiceConnection>(connection)]() mutable { self->handle(batch, std::move(weak)); });
+    queue_->post([self = shared_from_this(), batch = Batch{std::move(events), connection}]() mutable {
+      self->batches_.push_back(std::move(batch));
+      self->handOver();
+    });
   }
 
  private:
+  // Events that came together, and those of them that have been handed over.
+  struct Batch {
+    std::vector<Event> events;
+    std::weak_ptr<ServiceConnection> connection;
+    std::size_t handedOver = 0;
+  };
+
   // On the handlers' queue.
-  void handle(const std::vector<Event>& batch, std::weak_ptr<ServiceConnection> connection) {
-    for (const Event& event : batch) {
-      if (closed_ || !on_) continue;
-      // Asked for each event: the handler before it may have registered another one.
-      const auto handlers = handlers_.get();
-      if (!handlers) continue;
-      const auto found = handlers->find(event.kind == EventKind::Trigger ? kEventTrigger : kEventMetric);
-      if (found == handlers->end() || !found->second) continue;
-      found->second(makeEventObject(event), event.group);
+  void handOver() {
+    while (!batches_.empty()) {
+      Batch& batch = batches_.front();
+      while (batch.handedOver < batch.events.size() && !closed_) {
+        if (!on_) return;
+        hand(batch.events[batch.handedOver++]);
+      }
+      const Batch done = std::move(batch);
+      batches_.pop_front();
+      settle(done.events, done.connection);
     }
+  }
+
+  void hand(const Event& event) const {
+    // Asked for each event: the handler before it may have registered another one.
+    const auto handlers = handlers_.get();
+    if (!handlers) return;
+    const auto found = handlers->find(event.kind == EventKind::Trigger ? kEventTrigger : kEventMetric);
+    if (found == handlers->end() || !found->second) return;
+    found->second(makeEventObject(event), event.group);
+  }
+
+  void settle(const std::vector<Event>& batch, std::weak_ptr<ServiceConnection> connection) {
     const std::size_t weight = weightOf(batch);
     const std::size_t left = waiting_.fetch_sub(weight) - weight;
     if (left > fewEventsWaiting || closed_ || !stopped_.exchange(false)) return;
@@ -109,6 +140,7 @@ class EventRoad : public std::enable_shared_from_this<EventRoad> {
   std::atomic<bool> closed_ = false;
   std::atomic<std::size_t> waiting_ = 0;
   std::atomic<bool> stopped_ = false;
+  std::deque<Batch> batches_;  // on the handlers' queue
 };
 
 class ConnectionManager final : public Manager {
@@ -149,11 +181,15 @@ class ConnectionManager final : public Manager {
     if (size > longestFrame) {
       const Value* payload = arguments.find(kKeyPayload);
       const std::size_t given = payload != nullptr && payload->bytes() ? payload->bytes()->size() : size;
-      return {static_cast<std::int32_t>(Status::TooLarge),
-              (command == kCommandAddConfiguration || command == kCommandSetBaseConfiguration ? "the configuration has "
-                                                                                              : "the command has ") +
-                  std::to_string(given) + " bytes; at most " + std::to_string(longestFrame - (size - given)) +
-                  " fit into one frame"};
+      std::string reason =
+          (command == kCommandAddConfiguration || command == kCommandSetBaseConfiguration ? "the configuration has "
+                                                                                          : "the command has ") +
+          std::to_string(given) + " bytes; at most " + std::to_string(longestFrame - (size - given)) +
+          " fit into one frame";
+      if (command == kCommandAddConfiguration) {
+        worker_.post([connection = connection_, reason] { connection->refuseConfiguration(reason); });
+      }
+      return {static_cast<std::int32_t>(Status::TooLarge), std::move(reason)};
     }
     pending->deadline = worker_.clock().monotonicTime() + commandDeadline;
     pending->done = worker_.makeGate();

@@ -1,9 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
 //
 // How frames look on the wire: protocol-buffer messages, written as tables of their fields. A frame is one Frame with
-// one of its fields set. Numbers are never given a second meaning; signed 64-bit numbers travel as their two's
-// complement. No number above 18: the runtime drops fields whose number is also a metric identifier, the first
-// being 19.
+// one of its fields set, and the age behind an event. Numbers are never given a second meaning; signed 64-bit numbers
+// travel as their two's complement. No number above 18: the runtime drops fields whose number is also a metric
+// identifier, the first being 19.
 #pragma once
 
 #include "messages/runtime/field_table.h"
@@ -21,6 +21,7 @@ class HelloFrame final : public PBCodable {
   PB_OBJECT(3, "name",           name,          Name,          string);
   PB_FIELD (4, "refusal_status", refusalStatus, RefusalStatus, int32);
   PB_OBJECT(5, "refusal",        refusal,       Refusal,       string);
+  PB_FIELD (6, "observes",       observes,      Observes,      boolean);  // the client's
 };
 
 class CommandFrame final : public PBCodable {
@@ -55,6 +56,7 @@ class EventFrame final : public PBCodable {
   PB_FIELD (8,  "trigger_id",   triggerId,   TriggerId,   uint64);
   PB_FIELD (9,  "trigger_ref",  triggerRef,  TriggerRef,  uint64);
   PB_FIELD (10, "trigger_type", triggerType, TriggerType, uint64);
+  PB_FIELD (11, "period",       period,      Period,      uint64);  // milliseconds; 0 on change
 };
 
 class DroppedFrame final : public PBCodable {
@@ -68,6 +70,24 @@ class PingFrame final : public PBCodable {
   PB_FIELD(2, "is_answer", isAnswer, IsAnswer, boolean);
 };
 
+class MetricFrame final : public PBCodable {
+  PB_MESSAGE(MetricFrame)
+  PB_FIELD(1, "id", identifier, Identifier, uint64);
+};
+
+class SourceFrame final : public PBCodable {
+  PB_MESSAGE(SourceFrame)
+  PB_OBJECT(1, "origin",  origin,  Origin,  string);
+  PB_FIELD (2, "phase",   phase,   Phase,   uint32);  // 0 running, 1 ended, 2 failed
+  PB_OBJECT(3, "reason",  reason,  Reason,  string);
+  PB_LIST  (4, "metrics", metrics, Metrics, metric, Metric, repeated<message<MetricFrame>>);
+};
+
+class SourcesFrame final : public PBCodable {
+  PB_MESSAGE(SourcesFrame)
+  PB_LIST(1, "sources", sources, Sources, source, Source, repeated<message<SourceFrame>>);
+};
+
 class Frame final : public PBCodable {
   PB_MESSAGE(Frame)
   PB_OBJECT(1, "hello",    hello,    Hello,    message<HelloFrame>);
@@ -77,6 +97,10 @@ class Frame final : public PBCodable {
   PB_OBJECT(5, "event",    event,    Event,    message<EventFrame>);
   PB_OBJECT(6, "dropped",  dropped,  Dropped,  message<DroppedFrame>);
   PB_OBJECT(7, "ping",     ping,     Ping,     message<PingFrame>);
+  PB_OBJECT(8, "sources",  sources,  Sources,  message<SourcesFrame>);
+  // Beside an event: how old its record is, in milliseconds. It stands in the frame and not in the event, so that it can
+  // follow the bytes of an event that many share.
+  PB_FIELD (9, "age",      age,      Age,      uint64);
 };
 
 // One entry of a dictionary, or one value of a list (without a key). Lists and dictionaries inside are again one Items,

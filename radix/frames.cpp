@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "radix/frames.h"
 
+#include <algorithm>
 #include <bit>
 #include <memory>
 #include <utility>
@@ -8,6 +9,7 @@
 #include "messages/runtime/data_reader.h"
 #include "messages/runtime/data_writer.h"
 #include "radix/frame_tables.h"
+#include "values/plain_text.h"
 
 namespace radix {
 
@@ -20,6 +22,9 @@ PB_DEFINE(DeliveryFrame)
 PB_DEFINE(EventFrame)
 PB_DEFINE(DroppedFrame)
 PB_DEFINE(PingFrame)
+PB_DEFINE(MetricFrame)
+PB_DEFINE(SourceFrame)
+PB_DEFINE(SourcesFrame)
 PB_DEFINE(Frame)
 PB_DEFINE(Item)
 PB_DEFINE(Items)
@@ -28,6 +33,7 @@ PB_DEFINE(Items)
 
 namespace {
 
+using probeview::beginningOf;
 using probeview::Dictionary;
 using probeview::Key;
 using probeview::List;
@@ -193,6 +199,38 @@ bool readDictionary(std::span<const std::uint8_t> bytes, int depth, Dictionary& 
   return true;
 }
 
+// What a peer says may be any number.
+std::optional<std::chrono::milliseconds> spanOf(bool isThere, std::uint64_t milliseconds) {
+  if (!isThere) return std::nullopt;
+  const auto longest = static_cast<std::uint64_t>(longestSpan.count());
+  return std::chrono::milliseconds(signedOf(std::min(milliseconds, longest)));
+}
+
+client::SourceState::Phase phaseOf(std::uint32_t number) {
+  using Phase = client::SourceState::Phase;
+  for (const Phase known : {Phase::Ended, Phase::Failed}) {
+    if (number == static_cast<std::uint32_t>(known)) return known;
+  }
+  // Also what only a later service knows: nothing bad can be said of it.
+  return Phase::Running;
+}
+
+Sources sourcesOf(const wire::SourcesFrame& frame) {
+  Sources sources;
+  for (const wire::SourceFrame& source : frame.sources()) {
+    if (sources.states.size() == Sources::most) break;
+    client::SourceState& state = sources.states.emplace_back();
+    state.origin = beginningOf(source.origin(), Sources::longestOrigin);
+    state.phase = phaseOf(source.phase());
+    state.reason = beginningOf(source.reason(), Sources::longestReason);
+    for (const wire::MetricFrame& metric : source.metrics()) {
+      if (state.metrics.size() == Sources::mostMetrics) break;
+      state.metrics.push_back(signedOf(metric.identifier()));
+    }
+  }
+  return sources;
+}
+
 }  // namespace
 
 FrameBytes encode(const Hello& hello) {
@@ -204,6 +242,7 @@ FrameBytes encode(const Hello& hello) {
     content->setRefusalStatus(hello.refusalStatus);
     content->setRefusal(hello.refusal);
   }
+  if (hello.observes) content->setObserves(true);
   wire::Frame frame;
   frame.setHello(std::move(content));
   return bytesOf(frame);
@@ -251,6 +290,8 @@ FrameBytes encode(const Event& event) {
   if (event.triggerId != 0) content->setTriggerId(unsignedOf(event.triggerId));
   if (event.triggerRef != 0) content->setTriggerRef(unsignedOf(event.triggerRef));
   if (event.triggerType != 0) content->setTriggerType(unsignedOf(event.triggerType));
+  // 0 is said, too: that a metric comes on change is more than that nothing is known.
+  if (event.period) content->setPeriod(unsignedOf(event.period->count()));
   wire::Frame frame;
   frame.setEvent(std::move(content));
   return bytesOf(frame);
@@ -273,6 +314,38 @@ FrameBytes encode(const Ping& ping) {
   return bytesOf(frame);
 }
 
+FrameBytes encode(const Sources& sources) {
+  // The last ones go when so many of them name so much that no frame holds it.
+  for (std::size_t count = std::min(sources.states.size(), Sources::most);; --count) {
+    auto content = Shared<wire::SourcesFrame>::make();
+    for (std::size_t index = 0; index < count; ++index) {
+      const client::SourceState& state = sources.states[index];
+      wire::SourceFrame& source = content->addSource();
+      source.setOrigin(beginningOf(state.origin, Sources::longestOrigin));
+      source.setPhase(static_cast<std::uint32_t>(state.phase));
+      if (!state.reason.empty()) source.setReason(beginningOf(state.reason, Sources::longestReason));
+      for (std::size_t metric = 0; metric < std::min(state.metrics.size(), Sources::mostMetrics); ++metric) {
+        source.addMetric().setIdentifier(unsignedOf(state.metrics[metric]));
+      }
+    }
+    wire::Frame frame;
+    frame.setSources(std::move(content));
+    FrameBytes bytes = bytesOf(frame);
+    if (count == 0 || bytes->size() <= longestFrame) return bytes;
+  }
+}
+
+Trailer ageTrailer(std::chrono::nanoseconds age) {
+  constexpr std::uint8_t keyOfAge = 9 << 3;  // wire::Frame's field, a varint
+  const auto milliseconds = std::chrono::duration_cast<std::chrono::milliseconds>(age).count();
+  Trailer trailer;
+  trailer.bytes[trailer.size++] = keyOfAge;
+  auto rest = static_cast<std::uint64_t>(std::clamp<std::int64_t>(milliseconds, 0, longestSpan.count()));
+  for (; rest >= 0x80; rest >>= 7) trailer.bytes[trailer.size++] = static_cast<std::uint8_t>(0x80 | (rest & 0x7F));
+  trailer.bytes[trailer.size++] = static_cast<std::uint8_t>(rest);
+  return trailer;
+}
+
 bool decodeFrame(std::span<const std::uint8_t> bytes, FrameHandler& handler) {
   wire::Frame frame;
   PBDataReader reader(bytes);
@@ -282,7 +355,8 @@ bool decodeFrame(std::span<const std::uint8_t> bytes, FrameHandler& handler) {
                      .oldestVersion = hello->oldestVersion(),
                      .name = std::string(hello->name()),
                      .refusalStatus = hello->refusalStatus(),
-                     .refusal = std::string(hello->refusal())});
+                     .refusal = std::string(hello->refusal()),
+                     .observes = hello->observes()});
   } else if (const auto command = frame.command()) {
     handler.onCommand({.sequence = command->sequence(),
                        .name = std::string(command->name()),
@@ -309,11 +383,15 @@ bool decodeFrame(std::span<const std::uint8_t> bytes, FrameHandler& handler) {
                      .group = signedOf(event->group()),
                      .triggerId = signedOf(event->triggerId()),
                      .triggerRef = signedOf(event->triggerRef()),
-                     .triggerType = signedOf(event->triggerType())});
+                     .triggerType = signedOf(event->triggerType()),
+                     .period = spanOf(event->hasPeriod(), event->period()),
+                     .age = spanOf(frame.hasAge(), frame.age())});
   } else if (const auto dropped = frame.dropped()) {
     handler.onDropped({.count = dropped->count()});
   } else if (const auto ping = frame.ping()) {
     handler.onPing({.number = ping->number(), .isAnswer = ping->isAnswer()});
+  } else if (const auto sources = frame.sources()) {
+    handler.onSources(sourcesOf(*sources));
   }
   return true;
 }

@@ -11,12 +11,21 @@ class InProcessLink;
 
 // One direction: what was sent and not yet taken.
 struct Pipe {
-  std::deque<FrameBytes> frames;
+  std::deque<OutgoingFrame> frames;
   InProcessLink* receiver = nullptr;
   InProcessLink* sender = nullptr;
   bool senderWaits = false;
   bool deliveryPosted = false;
 };
+
+FrameBytes joined(OutgoingFrame outgoing) {
+  if (outgoing.trailer.size == 0) return std::move(outgoing.frame);
+  std::vector<std::uint8_t> bytes;
+  bytes.reserve(outgoing.frame->size() + outgoing.trailer.size);
+  bytes.assign(outgoing.frame->begin(), outgoing.frame->end());
+  bytes.insert(bytes.end(), outgoing.trailer.bytes.begin(), outgoing.trailer.bytes.begin() + outgoing.trailer.size);
+  return std::make_shared<const std::vector<std::uint8_t>>(std::move(bytes));
+}
 
 class InProcessLink final : public Link {
  public:
@@ -38,9 +47,9 @@ class InProcessLink final : public Link {
     postDelivery(queue_, in_);
   }
 
-  std::size_t send(std::span<const FrameBytes> frames) override {
+  std::size_t send(std::span<const OutgoingFrame> frames) override {
     std::size_t taken = 0;
-    for (const FrameBytes& frame : frames) {
+    for (const OutgoingFrame& frame : frames) {
       if (out_->frames.size() >= capacity_) {
         out_->senderWaits = true;
         break;
@@ -73,7 +82,7 @@ class InProcessLink final : public Link {
     // The receiver is looked up for each frame: any of them may be the last that it wants.
     while (!pipe->frames.empty() && pipe->receiver != nullptr && pipe->receiver->listener_ != nullptr &&
            pipe->receiver->reading_) {
-      const FrameBytes frame = std::move(pipe->frames.front());
+      const FrameBytes frame = joined(std::move(pipe->frames.front()));
       pipe->frames.pop_front();
       any = true;
       if (frame->size() > longestFrame) {

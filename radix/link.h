@@ -4,11 +4,13 @@
 // a socket or within one process they behave the same, and the same tests prove it.
 #pragma once
 
+#include <array>
 #include <cstddef>
 #include <cstdint>
 #include <memory>
 #include <span>
 #include <string>
+#include <utility>
 #include <vector>
 
 namespace radix {
@@ -18,6 +20,19 @@ inline constexpr std::size_t longestFrame = 128 * 1024;
 
 // An encoded frame. It is never changed, so that all who send it share it.
 using FrameBytes = std::shared_ptr<const std::vector<std::uint8_t>>;
+
+// A few bytes behind a frame that are not shared with others.
+struct Trailer {
+  static constexpr std::size_t longest = 12;
+  std::array<std::uint8_t, longest> bytes{};
+  std::uint8_t size = 0;
+};
+
+// A frame on its way to one receiver: it gets the frame's bytes and then the trailer's, as one record.
+struct OutgoingFrame {
+  FrameBytes frame{};
+  Trailer trailer{};
+};
 
 // Is told what happens on a link, on the link's own thread. It may destroy the link from inside each of these.
 class LinkListener {
@@ -42,7 +57,12 @@ class Link {
   // Begins to report. The listener outlives the link. Called once, first.
   virtual void start(LinkListener& listener) = 0;
   // Takes frames from the front as long as there is room; how many. Less than all means that onWritable() will follow.
-  virtual std::size_t send(std::span<const FrameBytes> frames) = 0;
+  virtual std::size_t send(std::span<const OutgoingFrame> frames) = 0;
+  // Whether the one frame was taken.
+  bool sendOne(FrameBytes frame) {
+    const OutgoingFrame one{std::move(frame), {}};
+    return send({&one, 1}) == 1;
+  }
   // Whether frames are wanted now; they wait in the transport otherwise, and the peer feels it in the end.
   virtual void setReading(bool reading) = 0;
 };

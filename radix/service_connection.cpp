@@ -17,11 +17,13 @@ std::string versionTrouble(const ServiceConnection::Identity& own, const Hello& 
          std::to_string(own.oldestVersion) + ": update " + (clientIsTooOld ? "the client" : "the service");
 }
 
+// Of what a service says, as much is kept as anybody reads.
+constexpr std::size_t longestTrouble = 1000;
+
 // In the form in which the results of commands stand in the log.
 std::string refusedRestoring(const Reply& reply) {
-  constexpr std::size_t longest = 1000;
   return "the baseband service refuses the configuration that is pushed again: error=" + std::to_string(reply.status) +
-         " msg=" + probeview::onOneLine(probeview::beginningOf(reply.message, longest));
+         " msg=" + probeview::onOneLine(probeview::beginningOf(reply.message, longestTrouble));
 }
 
 }  // namespace
@@ -108,7 +110,8 @@ void ServiceConnection::attempt() {
                     .oldestVersion = identity_.oldestVersion,
                     .name = identity_.clientName,
                     .refusalStatus = 0,
-                    .refusal = {}}));
+                    .refusal = {},
+                    .observes = identity_.observes}));
 }
 
 void ServiceConnection::scheduleAttempt(std::chrono::nanoseconds delay) {
@@ -125,6 +128,7 @@ void ServiceConnection::lose(Status status, const std::string& reason) {
     state_.connected = false;
     state_.since = worker_.clock().wallTime();
   }
+  state_.sources.reset();
   state_.trouble = reason;
   // Events that came with the last batch were received in full.
   onBatchEnd();
@@ -149,11 +153,28 @@ void ServiceConnection::finish(Waiting waiting, Status status, std::string messa
       configuration_ = command.arguments;
       unjudgedConfiguration_ = judge == Judge::Nobody ? waiting.sequence : 0;
     }
+    setConfigurationOutcome(judge == Judge::Nobody ? ConfigurationOutcome::Unsent
+                            : status == Status::Ok ? ConfigurationOutcome::Accepted
+                                                   : ConfigurationOutcome::Refused,
+                            command.result.message);
   } else if (command.name == kCommandClearConfiguration) {
     // Wanted or not by the service: who clears a configuration does not want it back on the next connection.
     configuration_.reset();
+    setConfigurationOutcome(ConfigurationOutcome::NotPushed);
   }
+  // Last: whoever waits for it may ask at once what has become of it.
   command.done->open();
+}
+
+void ServiceConnection::refuseConfiguration(const std::string& reason) {
+  setConfigurationOutcome(ConfigurationOutcome::Refused, reason);
+}
+
+void ServiceConnection::setConfigurationOutcome(ConfigurationOutcome outcome, const std::string& trouble) {
+  state_.configuration = outcome;
+  const bool isTrouble = outcome == ConfigurationOutcome::Refused || outcome == ConfigurationOutcome::Unsent;
+  state_.configurationTrouble = isTrouble ? probeview::beginningOf(trouble, longestTrouble) : std::string_view();
+  publish();
 }
 
 void ServiceConnection::restore() {
@@ -186,8 +207,7 @@ void ServiceConnection::send(FrameBytes frame) {
 
 void ServiceConnection::flush() {
   while (!blocked_ && !outgoing_.empty() && link_) {
-    const FrameBytes next = outgoing_.front();
-    if (link_->send({&next, 1}) == 1) {
+    if (link_->sendOne(outgoing_.front())) {
       outgoing_.pop_front();
     } else {
       blocked_ = true;
@@ -267,7 +287,10 @@ void ServiceConnection::onReply(Reply reply) {
       unjudgedConfiguration_ = 0;
       if (static_cast<Status>(reply.status) != Status::Ok) {
         configuration_.reset();
+        setConfigurationOutcome(ConfigurationOutcome::Refused, reply.message);
         if (events_.notice) events_.notice(refusedRestoring(reply));
+      } else {
+        setConfigurationOutcome(ConfigurationOutcome::Accepted);
       }
     }
     return;
@@ -288,6 +311,12 @@ void ServiceConnection::onEvent(Event event) {
 
 void ServiceConnection::onDropped(Dropped dropped) {
   state_.lostEvents += dropped.count;
+  publish();
+}
+
+void ServiceConnection::onSources(Sources sources) {
+  if (phase_ != Phase::Ready) return;
+  state_.sources = std::move(sources.states);
   publish();
 }
 

@@ -71,6 +71,8 @@ class ServiceConnection final : public std::enable_shared_from_this<ServiceConne
   // Sends the command as soon as there is a service. Fails it when there is none, when the connection ends before the
   // reply and at its deadline.
   void perform(std::shared_ptr<PendingCommand> command);
+  // The configuration that was to be pushed is refused without asking a service. What was pushed before stays.
+  void refuseConfiguration(const std::string& reason);
   // Whether events are to be delivered, on this connection and on those after it.
   void setDelivery(bool on);
   // Whether events may come in now. While a command waits they do in any case: its reply stands behind them.
@@ -96,6 +98,7 @@ class ServiceConnection final : public std::enable_shared_from_this<ServiceConne
   void onEvent(Event event) override;
   void onDropped(Dropped dropped) override;
   void onPing(Ping ping) override;
+  void onSources(Sources sources) override;
 
   void attempt();
   void scheduleAttempt(std::chrono::nanoseconds delay);
@@ -104,6 +107,7 @@ class ServiceConnection final : public std::enable_shared_from_this<ServiceConne
   void failAll(Status status, const std::string& reason);
   void finish(Waiting waiting, Status status, std::string message, Judge judge = Judge::Nobody);
   void restore();
+  void setConfigurationOutcome(ConfigurationOutcome outcome, const std::string& trouble = {});
   std::uint32_t nextSequence();
   void sendWaiting();
   void send(FrameBytes frame);

@@ -35,18 +35,21 @@ class SocketLink final : public Link {
     }
   }
 
-  std::size_t send(std::span<const FrameBytes> frames) override {
+  std::size_t send(std::span<const OutgoingFrame> frames) override {
     std::size_t sent = 0;
     while (sent < frames.size()) {
-      std::array<iovec, framesPerCall> contents;
+      // Frame and trailer of each; they meet in the system's memory.
+      std::array<std::array<iovec, 2>, framesPerCall> contents;
       std::array<mmsghdr, framesPerCall> headers{};
       const std::size_t count = std::min(framesPerCall, frames.size() - sent);
       for (std::size_t index = 0; index < count; ++index) {
-        const auto& bytes = *frames[sent + index];
+        const std::vector<std::uint8_t>& bytes = *frames[sent + index].frame;
+        const Trailer& trailer = frames[sent + index].trailer;
         // The system only reads what it sends.
-        contents[index] = {const_cast<std::uint8_t*>(bytes.data()), bytes.size()};
-        headers[index].msg_hdr.msg_iov = &contents[index];
-        headers[index].msg_hdr.msg_iovlen = 1;
+        contents[index][0] = {const_cast<std::uint8_t*>(bytes.data()), bytes.size()};
+        contents[index][1] = {const_cast<std::uint8_t*>(trailer.bytes.data()), trailer.size};
+        headers[index].msg_hdr.msg_iov = contents[index].data();
+        headers[index].msg_hdr.msg_iovlen = trailer.size == 0 ? 1 : 2;
       }
       const int taken =
           ::sendmmsg(socket_.number(), headers.data(), static_cast<unsigned>(count), MSG_NOSIGNAL | MSG_DONTWAIT);

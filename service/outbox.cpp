@@ -15,14 +15,14 @@ constexpr std::size_t mostMetricsKnown = 256;
 
 }  // namespace
 
-void Outbox::addRecord(std::int64_t metricId, radix::FrameBytes frame) {
-  const std::size_t size = frame->size();
-  if (records_ + 1 > limits_.records || bytes_ + size > limits_.bytes) makeRoom(metricId, size);
+void Outbox::addRecord(Record record) {
+  const std::size_t size = record.frame->size();
+  if (records_ + 1 > limits_.records || bytes_ + size > limits_.bytes) makeRoom(record.metricId, size);
   if (ofMetric_.size() > mostMetricsKnown) {
     std::erase_if(ofMetric_, [](const auto& one) { return one.second.empty(); });
   }
-  ofMetric_[metricId].push_back(firstNumber_ + queue_.size());
-  queue_.push_back({metricId, std::move(frame)});
+  ofMetric_[record.metricId].push_back(firstNumber_ + queue_.size());
+  queue_.push_back(std::move(record));
   ++records_;
   bytes_ += size;
 }
@@ -40,7 +40,7 @@ void Outbox::makeRoom(std::int64_t metricId, std::size_t size) {
 }
 
 void Outbox::dropOldest(std::deque<std::uint64_t>& waiting) {
-  Entry& entry = queue_[static_cast<std::size_t>(waiting.front() - firstNumber_)];
+  Record& entry = queue_[static_cast<std::size_t>(waiting.front() - firstNumber_)];
   waiting.pop_front();
   bytes_ -= entry.frame->size();
   entry.frame.reset();
@@ -55,11 +55,14 @@ void Outbox::discardDropped() {
     ++firstNumber_;
   }
   // Holes in the middle may outnumber what is left, when one metric is dropped behind another that waits: close them.
-  if (queue_.size() <= 2 * limits_.records) return;
-  std::deque<Entry> kept;
+  if (queue_.size() > 2 * limits_.records) closeHoles();
+}
+
+void Outbox::closeHoles() {
+  std::deque<Record> kept;
   ofMetric_.clear();
   firstNumber_ += queue_.size();
-  for (Entry& entry : queue_) {
+  for (Record& entry : queue_) {
     if (entry.frame == nullptr) continue;
     ofMetric_[entry.metricId].push_back(firstNumber_ + kept.size());
     kept.push_back(std::move(entry));
@@ -67,19 +70,32 @@ void Outbox::discardDropped() {
   queue_ = std::move(kept);
 }
 
-std::size_t Outbox::next(std::span<radix::FrameBytes> frames) {
+void Outbox::discard(const std::function<bool(const Record& record)>& isUnwanted) {
+  bool any = false;
+  for (Record& entry : queue_) {
+    if (entry.frame == nullptr || entry.isAnswer || !isUnwanted(entry)) continue;
+    bytes_ -= entry.frame->size();
+    entry.frame.reset();
+    --records_;
+    any = true;
+  }
+  if (any) closeHoles();
+}
+
+std::size_t Outbox::next(std::span<radix::OutgoingFrame> frames, std::chrono::nanoseconds now) {
   if (lost_ != told_) {
     words_.push_back(radix::encode(radix::Dropped{lost_ - told_}));
     told_ = lost_;
   }
+  if (news_ != nullptr) words_.push_back(std::exchange(news_, nullptr));
   std::size_t count = 0;
   for (const radix::FrameBytes& word : words_) {
     if (count == frames.size()) return count;
-    frames[count++] = word;
+    frames[count++] = {word, {}};
   }
-  for (const Entry& entry : queue_) {
+  for (const Record& entry : queue_) {
     if (count == frames.size()) break;
-    if (entry.frame != nullptr) frames[count++] = entry.frame;
+    if (entry.frame != nullptr) frames[count++] = {entry.frame, radix::ageTrailer(now - entry.born)};
   }
   return count;
 }
@@ -88,7 +104,7 @@ void Outbox::sent(std::size_t count) {
   for (; count > 0 && !words_.empty(); --count) words_.pop_front();
   for (; count > 0; --count) {
     discardDropped();
-    Entry& entry = queue_.front();
+    const Record& entry = queue_.front();
     ofMetric_[entry.metricId].pop_front();
     bytes_ -= entry.frame->size();
     --records_;

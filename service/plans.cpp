@@ -5,9 +5,9 @@
 
 namespace probeview {
 
-std::optional<MetricPlan> unite(std::span<const MetricPlan* const> plans) {
+std::optional<MetricPlan> unite(std::span<const MetricPlan* const> plans, bool observed) {
   if (plans.empty()) return std::nullopt;
-  MetricPlan all;
+  MetricPlan all{.metrics = {}, .observed = observed};
   for (const MetricPlan* plan : plans) {
     for (const auto& [metric, period] : plan->metrics) {
       const auto [place, isNew] = all.metrics.try_emplace(metric, period);

@@ -9,7 +9,7 @@
 namespace probeview {
 
 // What all plans together ask for, each metric at the shortest period; "on every change" is more than any period, as it
-// leaves nothing out. Absent when there is no plan at all.
-std::optional<MetricPlan> unite(std::span<const MetricPlan* const> plans);
+// leaves nothing out. Absent when there is no plan at all, observed or not: then sources run at their own periods.
+std::optional<MetricPlan> unite(std::span<const MetricPlan* const> plans, bool observed);
 
 }  // namespace probeview

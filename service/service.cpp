@@ -99,12 +99,17 @@ Service::~Service() {
 }
 
 void Service::addSource(std::unique_ptr<MetricSource> source) {
-  sources_.push_back(std::make_unique<SourceSlot>(std::move(source), worker_, log_,
-                                                  [this](MetricRecord record) { route(std::move(record)); }));
+  sources_.push_back(std::make_unique<SourceSlot>(
+      std::move(source), worker_, log_,
+      SourceSlot::Ears{
+          .record = [this, place = sources_.size()](
+                        MetricRecord record, std::chrono::nanoseconds now) { route(place, std::move(record), now); },
+          .conditionChanged = [this] { sourcesChanged(); }}));
   SourceSlot& slot = *sources_.back();
   log_.write(LogLevel::Info,
              "source " + slot.origin() + " can fill " + std::to_string(slot.metrics().size()) + " metrics");
   slot.start(plan_, listening_);
+  sourcesChanged();
 }
 
 void Service::accept(std::unique_ptr<radix::Link> link, Peer peer) {
@@ -152,13 +157,13 @@ Reply Service::addConfiguration(Session& session, const Dictionary& arguments) {
   PushedConfiguration pushed = readConfiguration(arguments, log_, nameOf(session));
   if (!pushed.configuration) return pushed.reply;
   session.setConfiguration(std::move(pushed.configuration));
-  updatePlan();
+  wishesChanged(session);
   return pushed.reply;
 }
 
 Reply Service::clearConfiguration(Session& session) {
   session.setConfiguration(std::nullopt);
-  updatePlan();
+  wishesChanged(session);
   return answer(Status::Ok);
 }
 
@@ -201,16 +206,20 @@ Reply Service::queryMetric(Session& session, const Dictionary& arguments) {
   bool any = false;
   List asked;
   for (const std::int64_t metric : metrics) {
-    // Before the source is asked, as it may answer at once.
-    const bool wanted = session.wants(metric);
     bool taken = false;
     bool canFill = false;
-    for (const auto& source : sources_) {
-      if (!source->canFill(metric)) continue;
-      if (!wanted) session.expectMetric(metric);
-      taken = source->query(metric) || taken;
+    for (std::size_t place = 0; place < sources_.size(); ++place) {
+      SourceSlot& source = *sources_[place];
+      if (!source.canFill(metric)) continue;
+      // Before the source is asked, as it may answer at once.
+      session.expectAnswer(place, metric);
+      if (source.query(metric)) {
+        taken = true;
+      } else {
+        session.forgetAnswer(place, metric);
+      }
       // Not one that has failed over the question.
-      canFill = canFill || source->canFill(metric);
+      canFill = canFill || source.canFill(metric);
     }
     any = any || taken;
     if (taken) {
@@ -248,14 +257,36 @@ Reply Service::showStatus() const {
   return reply;
 }
 
-void Service::deliveryChanged(Session& session, bool switchedOn) {
-  if (switchedOn && session.takeLastRecordsDue()) {
-    const auto now = worker_.clock().monotonicTime();
-    for (const auto& [arrival, record] : lastRecords_.records()) {
-      if (session.wants(record.metricId)) session.send(record.metricId, record.frame, now);
-    }
-  }
+void Service::deliveryChanged(Session& session, bool) { wishesChanged(session); }
+
+void Service::wishesChanged(Session& session) {
+  // What is known goes first, then what a source has to say at the news.
+  session.offerKept(lastRecords_);
+  updatePlan();
   updateListening();
+}
+
+radix::FrameBytes Service::sources() {
+  radix::Sources sources;
+  for (const auto& source : sources_) {
+    SourceCondition condition = source->condition();
+    sources.states.push_back({.origin = source->origin(),
+                              .phase = condition.phase,
+                              .reason = std::move(condition.reason),
+                              .metrics = source->metrics()});
+  }
+  return radix::encode(sources);
+}
+
+void Service::sourcesChanged() {
+  // A source that fails while it is stopped is no news any more.
+  if (!*alive_) return;
+  radix::FrameBytes frame;
+  for (const auto& session : sessions_) {
+    if (!session->isActive()) continue;
+    if (frame == nullptr) frame = sources();
+    session->tellSources(frame);
+  }
 }
 
 void Service::ended(Session&) {
@@ -274,34 +305,33 @@ void Service::removeEnded() {
   updateListening();
 }
 
-void Service::route(MetricRecord record) {
-  const auto frame = radix::encode(radix::Event{.kind = radix::EventKind::Metric,
-                                                .metricId = record.metricId,
-                                                .payload = std::move(record.payload),
-                                                .profileId = 0,
-                                                .time = record.time.count(),
-                                                .origin = std::move(record.origin),
-                                                .group = 0,
-                                                .triggerId = 0,
-                                                .triggerRef = 0,
-                                                .triggerType = 0});
-  lastRecords_.keep(record.metricId, frame);
-  if (!listening_) return;
-  const auto now = worker_.clock().monotonicTime();
-  for (const auto& session : sessions_) {
-    if (session->isListening() && session->wants(record.metricId)) session->send(record.metricId, frame, now);
-  }
+void Service::route(std::size_t source, MetricRecord record, std::chrono::nanoseconds now) {
+  LastRecords::Record kept{.metricId = record.metricId, .frame = {}, .born = now - record.age};
+  kept.frame = radix::encode(radix::Event{.kind = radix::EventKind::Metric,
+                                          .metricId = record.metricId,
+                                          .payload = std::move(record.payload),
+                                          .profileId = 0,
+                                          .time = record.time.count(),
+                                          .origin = std::move(record.origin),
+                                          .group = 0,
+                                          .triggerId = 0,
+                                          .triggerRef = 0,
+                                          .triggerType = 0,
+                                          .period = record.period});
+  const std::uint64_t number = lastRecords_.keep(kept);
+  for (const auto& session : sessions_) session->offer(source, kept, number, now);
 }
 
 void Service::updatePlan() {
   std::vector<const MetricPlan*> plans;
+  bool observed = false;
   if (baseConfiguration_) plans.push_back(&baseConfiguration_->plan);
   for (const auto& session : sessions_) {
     if (session->isActive() && session->configuration()) plans.push_back(&session->configuration()->plan);
+    observed = observed || (session->observes() && session->isListening());
   }
-  std::optional<MetricPlan> plan = unite(plans);
-  const bool same = plan.has_value() == plan_.has_value() && (!plan || plan->metrics == plan_->metrics);
-  if (same) return;
+  std::optional<MetricPlan> plan = unite(plans, observed);
+  if (plan == plan_) return;
   plan_ = std::move(plan);
   for (const auto& source : sources_) source->setPlan(plan_);
 }

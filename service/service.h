@@ -59,6 +59,7 @@ class Service final : Session::Host {
   void deliveryChanged(Session& session, bool switchedOn) override;
   void ended(Session& session) override;
   std::uint64_t countSilent() override { return ++silentClients_; }
+  radix::FrameBytes sources() override;
 
   radix::Reply addConfiguration(Session& session, const Dictionary& arguments);
   radix::Reply clearConfiguration(Session& session);
@@ -71,8 +72,12 @@ class Service final : Session::Host {
   // Empty when no configuration that counts for the session says what the trigger stands for.
   std::vector<std::int64_t> metricsOfTrigger(const Session& session, std::int64_t trigger) const;
 
-  // Takes a record of a source to all who want it.
-  void route(MetricRecord record);
+  // Takes a record of a source, known by its place in the row, to all who want it.
+  void route(std::size_t source, MetricRecord record, std::chrono::nanoseconds now);
+  // Tells all clients what feeds the service.
+  void sourcesChanged();
+  // A session listens from now on, or no more, or for something else.
+  void wishesChanged(Session& session);
   // Tells the sources what has changed for them.
   void updatePlan();
   void updateListening();

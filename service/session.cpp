@@ -21,6 +21,8 @@ constexpr std::size_t framesPerFlush = 64;
 constexpr std::chrono::microseconds flushInterval{500};
 // Replies that a client may leave unread before it is no longer listened to.
 constexpr std::size_t mostWordsUnread = 64;
+// How long a source may take to answer a query: what comes later is no answer. A modem reads files from a card for it.
+constexpr std::chrono::seconds longestAnswer{30};
 
 }  // namespace
 
@@ -58,24 +60,94 @@ void Session::start() {
 
 double Session::recordsPerSecond() const { return rate_.perSecond(worker_.clock().monotonicTime(), started_); }
 
-bool Session::wants(std::int64_t metricId) const {
-  return !configuration_ || configured_.contains(metricId) || asked_.contains(metricId);
-}
+bool Session::wants(std::int64_t metricId) const { return observes_ || configured_.contains(metricId); }
 
 void Session::setConfiguration(std::optional<Configuration> configuration) {
   configuration_ = std::move(configuration);
   configured_.clear();
-  asked_.clear();
-  if (!configuration_) return;
-  lastRecordsGiven_ = false;
-  for (const auto& [metric, period] : configuration_->plan.metrics) configured_.insert(metric);
-  for (const auto& [trigger, metrics] : configuration_->triggers) configured_.insert(metrics.begin(), metrics.end());
+  if (configuration_) {
+    for (const auto& [metric, period] : configuration_->plan.metrics) configured_.insert(metric);
+    for (const auto& [trigger, metrics] : configuration_->triggers) configured_.insert(metrics.begin(), metrics.end());
+  }
+  discardUnwanted();
 }
 
-bool Session::takeLastRecordsDue() { return !std::exchange(lastRecordsGiven_, true); }
+void Session::discardUnwanted() {
+  if (observes_ || outbox_.records() == 0) return;
+  outbox_.discard([this](const Outbox::Record& record) {
+    if (wants(record.metricId)) return false;
+    // It was not sent after all: a later configuration may bring it.
+    if (const auto last = sent_.find(record.metricId); last != sent_.end() && last->second == record.number) {
+      sent_.erase(last);
+    }
+    return true;
+  });
+}
 
-void Session::send(std::int64_t metricId, const radix::FrameBytes& frame, std::chrono::nanoseconds now) {
-  outbox_.addRecord(metricId, frame);
+void Session::expectAnswer(std::size_t source, std::int64_t metricId) {
+  forgetAnswer(source, metricId);
+  awaited_.push_back(
+      {.source = source, .metricId = metricId, .until = worker_.clock().monotonicTime() + longestAnswer, .number = 0});
+}
+
+void Session::forgetAnswer(std::size_t source, std::int64_t metricId) {
+  std::erase_if(awaited_, [&](const AwaitedAnswer& one) { return one.source == source && one.metricId == metricId; });
+}
+
+bool Session::settlesQuery(std::size_t source, std::int64_t metricId, std::uint64_t number,
+                           std::chrono::nanoseconds now) {
+  const auto found = std::find_if(awaited_.begin(), awaited_.end(), [&](const AwaitedAnswer& one) {
+    return one.source == source && one.metricId == metricId && one.number == 0;
+  });
+  if (found == awaited_.end()) return false;
+  const bool isInTime = now <= found->until;
+  if (isInTime && !takesEvents()) {
+    // For when it does, so that switching events off and on loses no answer.
+    found->number = number;
+  } else {
+    awaited_.erase(found);
+  }
+  return isInTime;
+}
+
+bool Session::settlesQueryLate(std::int64_t metricId, std::uint64_t number) {
+  // A record that came after the one that was asked for answers as well; that one is not kept any more.
+  return std::erase_if(awaited_, [&](const AwaitedAnswer& one) {
+           return one.metricId == metricId && one.number != 0 && one.number <= number;
+         }) > 0;
+}
+
+void Session::offer(std::size_t source, const LastRecords::Record& record, std::uint64_t number,
+                    std::chrono::nanoseconds now) {
+  const bool isAnswer = !awaited_.empty() && settlesQuery(source, record.metricId, number, now);
+  if (takesEvents() && (isAnswer || wants(record.metricId))) send(record, number, isAnswer, now);
+}
+
+void Session::offerKept(const LastRecords& records) {
+  if (!takesEvents()) return;
+  const std::chrono::nanoseconds now = worker_.clock().monotonicTime();
+  for (const auto& [number, record] : records.records()) {
+    const bool isAnswer = !awaited_.empty() && settlesQueryLate(record.metricId, number);
+    if (!isAnswer && !wants(record.metricId)) continue;
+    const auto last = sent_.find(record.metricId);
+    if (last == sent_.end() || last->second < number) send(record, number, isAnswer, now);
+  }
+}
+
+void Session::tellSources(radix::FrameBytes frame) {
+  outbox_.setNews(std::move(frame));
+  flushWords();
+}
+
+void Session::send(const LastRecords::Record& record, std::uint64_t number, bool isAnswer,
+                   std::chrono::nanoseconds now) {
+  outbox_.addRecord({.metricId = record.metricId,
+                     .frame = record.frame,
+                     .born = record.born,
+                     .number = number,
+                     .isAnswer = isAnswer});
+  // What is not kept is never offered again.
+  if (number != 0) sent_[record.metricId] = number;
   rate_.add(now);
   if (!blocked_ && outbox_.records() >= framesPerFlush) {
     flush();
@@ -140,12 +212,14 @@ void Session::onHello(radix::Hello hello) {
   }
   deadline_.reset();
   phase_ = Phase::Active;
+  observes_ = hello.observes;
   log_.write(LogLevel::Info, description() + " has connected");
   say(radix::encode(radix::Hello{.version = settings_.version,
                                  .oldestVersion = settings_.oldestVersion,
                                  .name = settings_.serviceName,
                                  .refusalStatus = 0,
                                  .refusal = {}}));
+  tellSources(host_.sources());
 }
 
 void Session::onCommand(radix::Command command) {
@@ -223,9 +297,9 @@ void Session::flushRecords(std::chrono::nanoseconds now) {
 void Session::flush() {
   flushTimer_.reset();
   lastFlush_ = worker_.clock().monotonicTime();
-  std::array<radix::FrameBytes, framesPerFlush> frames;
+  std::array<radix::OutgoingFrame, framesPerFlush> frames;
   while (!blocked_ && link_ && !outbox_.empty()) {
-    const std::size_t count = outbox_.next(frames);
+    const std::size_t count = outbox_.next(frames, lastFlush_);
     const std::size_t taken = link_->send({frames.data(), count});
     outbox_.sent(taken);
     if (taken < count) blocked_ = true;

@@ -10,12 +10,15 @@
 #include <optional>
 #include <set>
 #include <string>
+#include <unordered_map>
+#include <vector>
 
 #include "platform/worker.h"
 #include "radix/frames.h"
 #include "radix/link.h"
 #include "radix/status.h"
 #include "service/configuration.h"
+#include "service/last_records.h"
 #include "service/log.h"
 #include "service/outbox.h"
 #include "service/rate_meter.h"
@@ -44,6 +47,8 @@ class Session final : radix::LinkListener, radix::FrameHandler {
     virtual void deliveryChanged(Session& session, bool switchedOn) = 0;
     // The session is over: to be destroyed, but not from inside this call.
     virtual void ended(Session& session) = 0;
+    // What feeds the service, as one frame; a client is told once it has been greeted.
+    virtual radix::FrameBytes sources() = 0;
     // One more that did not greet: how many there were so far, this one included.
     virtual std::uint64_t countSilent() = 0;
   };
@@ -72,21 +77,30 @@ class Session final : radix::LinkListener, radix::FrameHandler {
   // Whether it has greeted and was welcome.
   bool isActive() const { return phase_ == Phase::Active; }
   bool hasEnded() const { return phase_ == Phase::Ended; }
-  // Whether it takes records now.
-  bool isListening() const { return isActive() && delivery_; }
-  // Whether it would take records of this metric.
+  // Whether it wants records without asking for them by a configuration.
+  bool observes() const { return observes_; }
+  // Whether it takes events now.
+  bool takesEvents() const { return isActive() && delivery_; }
+  // Whether it takes them as they come, so that sources must not sleep; answers to its queries it takes in any case.
+  bool isListening() const { return takesEvents() && (observes_ || configuration_.has_value()); }
+  // Whether it would take records of this metric as they come.
   bool wants(std::int64_t metricId) const;
 
   // What it has pushed.
   const std::optional<Configuration>& configuration() const { return configuration_; }
   void setConfiguration(std::optional<Configuration> configuration);
-  // It has asked for the metric: it wants the answer whatever its configuration says.
-  void expectMetric(std::int64_t metricId) { asked_.insert(metricId); }
-  // Whether the last records are due to it now: at its first listening with each configuration. Asking settles it.
-  bool takeLastRecordsDue();
+  // It has asked the source for the metric: it is owed the next record of it, whatever its configuration says. A source
+  // that takes the question may answer on a later turn, but not for ever.
+  void expectAnswer(std::size_t source, std::int64_t metricId);
+  // The source does not answer.
+  void forgetAnswer(std::size_t source, std::int64_t metricId);
 
-  // Queues the record; it leaves soon, together with others.
-  void send(std::int64_t metricId, const radix::FrameBytes& frame, std::chrono::nanoseconds now);
+  // Takes a record that flows, if it is one for this client. It leaves soon, together with others.
+  void offer(std::size_t source, const LastRecords::Record& record, std::uint64_t number, std::chrono::nanoseconds now);
+  // Takes those of the kept records that are for this client and were not sent to it: each record is sent once at most.
+  void offerKept(const LastRecords& records);
+  // What feeds the service has changed.
+  void tellSources(radix::FrameBytes frame);
 
  private:
   enum class Phase { Greeting, Active, Refused, Ended };
@@ -100,6 +114,21 @@ class Session final : radix::LinkListener, radix::FrameHandler {
   void onCommand(radix::Command command) override;
   void onDelivery(radix::Delivery delivery) override;
   void onPing(radix::Ping ping) override;
+
+  // An answer to a query that has been asked.
+  struct AwaitedAnswer {
+    std::size_t source = 0;
+    std::int64_t metricId = 0;
+    std::chrono::nanoseconds until{};
+    // The record that came while the client took no events; 0: none so far.
+    std::uint64_t number = 0;
+  };
+  // Whether the record answers a query; that question is settled then.
+  bool settlesQuery(std::size_t source, std::int64_t metricId, std::uint64_t number, std::chrono::nanoseconds now);
+  bool settlesQueryLate(std::int64_t metricId, std::uint64_t number);
+  void send(const LastRecords::Record& record, std::uint64_t number, bool isAnswer, std::chrono::nanoseconds now);
+  // Takes back what has not left yet and is not wanted any more.
+  void discardUnwanted();
 
   void say(radix::FrameBytes frame);
   // Tells the client why and ends the conversation.
@@ -124,11 +153,13 @@ class Session final : radix::LinkListener, radix::FrameHandler {
   Phase phase_ = Phase::Greeting;
   ScheduledTaskHandle deadline_;
 
+  bool observes_ = false;
   bool delivery_ = false;
-  bool lastRecordsGiven_ = false;
   std::optional<Configuration> configuration_;
   std::set<std::int64_t> configured_;  // all metrics that the configuration names, its triggers' included
-  std::set<std::int64_t> asked_;
+  std::vector<AwaitedAnswer> awaited_;
+  // The number of the last record of each kept metric that was sent.
+  std::unordered_map<std::int64_t, std::uint64_t> sent_;
 
   Outbox outbox_;
   RateMeter rate_;

@@ -49,10 +49,10 @@ class SourceSlot::SourceLog final : public LineSink {
   SourceSlot& slot_;
 };
 
-SourceSlot::SourceSlot(std::unique_ptr<MetricSource> source, Worker& worker, ServiceLog& log, Taker taker)
+SourceSlot::SourceSlot(std::unique_ptr<MetricSource> source, Worker& worker, ServiceLog& log, Ears ears)
     : worker_(worker),
       log_(log),
-      taker_(std::move(taker)),
+      ears_(std::move(ears)),
       scheduler_(std::make_unique<GuardedScheduler>(*this)),
       sourceLog_(std::make_unique<SourceLog>(*this)),
       source_(std::move(source)),
@@ -75,6 +75,12 @@ void SourceSlot::start(const std::optional<MetricPlan>& plan, bool listening) {
     source_->setPlan(plan);
     source_->setListening(listening);
   });
+  guarded("telling what it has read", [&] { intake_ = source_->intake(); });
+}
+
+SourceCondition SourceSlot::condition() const {
+  if (failure_.empty()) return condition_;
+  return {SourceCondition::Phase::Failed, failure_};
 }
 
 void SourceSlot::setPlan(const std::optional<MetricPlan>& plan) {
@@ -86,7 +92,8 @@ void SourceSlot::setListening(bool listening) {
 }
 
 bool SourceSlot::canFill(std::int64_t metricId) const {
-  return failure_.empty() && std::find(metrics_.begin(), metrics_.end(), metricId) != metrics_.end();
+  return failure_.empty() && condition_.phase != SourceCondition::Phase::Failed &&
+         std::find(metrics_.begin(), metrics_.end(), metricId) != metrics_.end();
 }
 
 bool SourceSlot::query(std::int64_t metricId) {
@@ -109,10 +116,24 @@ void SourceSlot::emit(MetricRecord record) {
   }
   if (record.origin.empty()) record.origin = origin_;
   record.origin.resize(beginningOf(record.origin, longestOrigin).size());
+  constexpr std::chrono::nanoseconds longestAge = radix::longestSpan;
+  record.age = std::clamp(record.age, std::chrono::nanoseconds(0), longestAge);
+  record.period = std::clamp(record.period, std::chrono::milliseconds(0), radix::longestSpan);
+  const std::chrono::nanoseconds now = worker_.clock().monotonicTime();
   ++records_;
-  rate_.add(worker_.clock().monotonicTime());
+  rate_.add(now);
   lastRecord_ = record.time;
-  taker_(std::move(record));
+  lastRecordBorn_ = now - record.age;
+  ears_.record(std::move(record), now);
+}
+
+void SourceSlot::conditionChanged(SourceCondition condition) {
+  if (!failure_.empty()) return;
+  if (condition.phase == SourceCondition::Phase::Failed) {
+    log_.write(LogLevel::Error, origin_ + " has failed: " + condition.reason);
+  }
+  condition_ = std::move(condition);
+  if (ears_.conditionChanged) ears_.conditionChanged();
 }
 
 void SourceSlot::withhold(const MetricRecord& record, const std::string& reason) {
@@ -137,6 +158,7 @@ void SourceSlot::guarded(const char* occasion, const std::function<void()>& call
 void SourceSlot::fail(const char* occasion, const std::string& reason) {
   failure_ = std::string("failed ") + occasion + ": " + reason;
   log_.write(LogLevel::Error, (origin_.empty() ? "a source" : origin_) + " " + failure_ + "; it runs no more");
+  if (ears_.conditionChanged) ears_.conditionChanged();
   // Not from inside its own code.
   worker_.post([this, alive = alive_] {
     if (*alive) source_.reset();

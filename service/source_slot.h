@@ -20,10 +20,15 @@ namespace probeview {
 // and what it emits is looked at before anybody sees it.
 class SourceSlot final : MetricSink {
  public:
-  // Takes the records that are fit to be sent.
-  using Taker = std::function<void(MetricRecord record)>;
+  // What the service hears of the source.
+  struct Ears {
+    // A record that is fit to be sent, and the moment on the monotonic clock.
+    std::function<void(MetricRecord record, std::chrono::nanoseconds now)> record;
+    // It has ended, failed, or runs again.
+    std::function<void()> conditionChanged{};
+  };
 
-  SourceSlot(std::unique_ptr<MetricSource> source, Worker& worker, ServiceLog& log, Taker taker);
+  SourceSlot(std::unique_ptr<MetricSource> source, Worker& worker, ServiceLog& log, Ears ears);
   ~SourceSlot() override;
 
   void start(const std::optional<MetricPlan>& plan, bool listening);
@@ -35,37 +40,43 @@ class SourceSlot final : MetricSink {
 
   const std::string& origin() const { return origin_; }
   const std::vector<std::int64_t>& metrics() const { return metrics_; }
-  // Why the source runs no more; empty while it does.
-  const std::string& failure() const { return failure_; }
+  // Whether it runs; what has thrown runs no more.
+  SourceCondition condition() const;
+  std::optional<SourceIntake> intake() const { return intake_; }
   std::uint64_t records() const { return records_; }
   std::uint64_t withheld() const { return withheld_; }
   double recordsPerSecond() const;
-  // Wall time of the last record, if there was one.
+  // Wall time of the last record, if there was one; and how old its values are by now, by the monotonic clock.
   const std::optional<std::chrono::milliseconds>& lastRecord() const { return lastRecord_; }
+  std::chrono::nanoseconds lastRecordAge() const { return worker_.clock().monotonicTime() - lastRecordBorn_; }
 
  private:
   class GuardedScheduler;
   class SourceLog;
 
   void emit(MetricRecord record) override;
+  void conditionChanged(SourceCondition condition) override;
   void withhold(const MetricRecord& record, const std::string& reason);
   void guarded(const char* occasion, const std::function<void()>& call);
   void fail(const char* occasion, const std::string& reason);
 
   Worker& worker_;
   ServiceLog& log_;
-  Taker taker_;
+  Ears ears_;
   std::unique_ptr<GuardedScheduler> scheduler_;
   std::unique_ptr<SourceLog> sourceLog_;
   std::unique_ptr<MetricSource> source_;
   std::string origin_;
   std::vector<std::int64_t> metrics_;
-  std::string failure_;
+  SourceCondition condition_;
+  std::string failure_;  // what it has thrown
+  std::optional<SourceIntake> intake_;
   std::uint64_t records_ = 0;
   std::uint64_t withheld_ = 0;
   RateMeter rate_;
   std::chrono::nanoseconds started_;
   std::optional<std::chrono::milliseconds> lastRecord_;
+  std::chrono::nanoseconds lastRecordBorn_{};
   std::shared_ptr<bool> alive_;
 };
 

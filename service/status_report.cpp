@@ -15,6 +15,18 @@ Value milliseconds(std::chrono::nanoseconds time) {
   return std::int64_t{std::chrono::duration_cast<std::chrono::milliseconds>(time).count()};
 }
 
+std::string_view nameOf(SourceCondition::Phase phase) {
+  switch (phase) {
+    case SourceCondition::Phase::Running:
+      return "running";
+    case SourceCondition::Phase::Ended:
+      return "ended";
+    case SourceCondition::Phase::Failed:
+      return "failed";
+  }
+  return {};
+}
+
 Dictionary describe(const SourceSlot& source) {
   List identifiers;
   for (const std::int64_t metric : source.metrics()) identifiers.append(metric);
@@ -24,8 +36,17 @@ Dictionary describe(const SourceSlot& source) {
                    {"records", count(source.records())},
                    {"records_per_second", source.recordsPerSecond()},
                    {"withheld", count(source.withheld())}};
-  if (source.lastRecord()) entry.append("last_record_ms", milliseconds(*source.lastRecord()));
-  if (!source.failure().empty()) entry.append("failure", Value::text(source.failure()));
+  const SourceCondition condition = source.condition();
+  entry.append("state", Value::text(nameOf(condition.phase)));
+  if (condition.phase == SourceCondition::Phase::Failed) entry.append("failure", Value::text(condition.reason));
+  if (const auto intake = source.intake()) {
+    entry.append("rows_read", count(intake->rowsRead));
+    entry.append("rows_skipped", count(intake->rowsSkipped));
+  }
+  if (source.lastRecord()) {
+    entry.append("last_record_ms", milliseconds(*source.lastRecord()));
+    entry.append("last_record_age_ms", milliseconds(source.lastRecordAge()));
+  }
   return entry;
 }
 
@@ -36,6 +57,7 @@ Dictionary describe(const Session& client) {
           {"user", std::int64_t{client.peer().user}},
           {"connected_since_ms", milliseconds(client.connectedSince())},
           {"listening", client.isListening()},
+          {"observes", client.observes()},
           {"configured", client.configuration().has_value()},
           {"records", count(client.outbox().sentRecords())},
           {"records_per_second", client.recordsPerSecond()},

@@ -37,7 +37,7 @@ ExitStatus query(const Options& options, Tool& tool) {
     const Value* id = event.find(radix::kKeyMetricID);
     if (id != nullptr && id->int64() == wanted && !answer) answer = event;
   });
-  // The last records come first; they are no answer.
+  // An older service sends every record to whoever has pushed nothing, the last ones first; they are no answer.
   if (const ExitStatus status = client.drain(); status != ExitStatus::Success) return status;
   answer.reset();
   const Dictionary arguments{{radix::kKeyAppID, radix::serviceAppId}, {radix::kKeyMetricID, *metric}};

@@ -9,8 +9,10 @@
 
 namespace probeview {
 
-ServiceClient::ServiceClient(Tool& tool)
-    : tool_(tool), loop_(std::make_shared<EventLoop>()), manager_(radix::client::CreateManager("probectl", loop_)) {}
+ServiceClient::ServiceClient(Tool& tool, radix::client::ManagerOptions options)
+    : tool_(tool),
+      loop_(std::make_shared<EventLoop>()),
+      manager_(radix::client::CreateManager("probectl", loop_, options)) {}
 
 ExitStatus ServiceClient::perform(std::string_view command, const Dictionary& arguments, Dictionary* reply,
                                   const std::string& subject) {

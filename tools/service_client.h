@@ -16,7 +16,7 @@ namespace probeview {
 class ServiceClient {
  public:
   // Throws std::system_error when the system gives no loop.
-  explicit ServiceClient(Tool& tool);
+  explicit ServiceClient(Tool& tool, radix::client::ManagerOptions options = {});
 
   EventLoop& loop() { return *loop_; }
   // Failure, with the reason written to the tool's errors, when the service refuses or is away. What a service says

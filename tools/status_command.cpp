@@ -1,13 +1,11 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/status_command.h"
 
-#include <chrono>
 #include <memory>
 #include <ostream>
 #include <string>
 #include <string_view>
 
-#include "platform/clock.h"
 #include "radix/service_commands.h"
 #include "tools/service_client.h"
 #include "values/json.h"
@@ -58,13 +56,16 @@ const List& list(const Dictionary& report, std::string_view key) {
 }
 
 void showSource(const Dictionary& source, std::ostream& output) {
-  output << "  " << text(source, "origin") << ": " << text(source, "records") << " records, " << rate(source) << ", "
-         << text(source, "withheld") << " withheld, can fill " << text(source, "metrics") << " metrics";
-  const Value* last = source.find("last_record_ms");
-  if (last != nullptr && last->int64()) {
-    const std::int64_t age = systemClock().wallTime().count() - *last->int64();
-    // The records of a log bear the times of their rows.
-    if (age >= 0 && age < std::int64_t{24} * 3600 * 1000) output << ", last one " << duration(age) << " old";
+  output << "  " << text(source, "origin") << ": ";
+  if (source.contains("state")) output << text(source, "state") << ", ";
+  if (source.contains("rows_read")) {
+    output << text(source, "rows_read") << " rows read, " << text(source, "rows_skipped") << " skipped, ";
+  }
+  output << text(source, "records") << " records, " << rate(source) << ", " << text(source, "withheld")
+         << " withheld, can fill " << text(source, "metrics") << " metrics";
+  const Value* age = source.find("last_record_age_ms");
+  if (age != nullptr && age->int64().value_or(-1) >= 0) {
+    output << ", last record " << duration(*age->int64()) << " old";
   }
   if (source.contains("failure")) output << "; " << text(source, "failure");
   output << '\n';
@@ -73,9 +74,10 @@ void showSource(const Dictionary& source, std::ostream& output) {
 void showClient(const Dictionary& client, std::ostream& output) {
   output << "  " << text(client, "number") << " '" << text(client, "name") << "' (process " << text(client, "process")
          << ", user " << text(client, "user") << "): " << (truth(client, "listening") ? "listens" : "does not listen")
-         << ", " << (truth(client, "configured") ? "own configuration" : "no configuration") << ", "
-         << text(client, "records") << " records, " << rate(client) << ", " << text(client, "queued") << " queued, "
-         << text(client, "lost") << " lost\n";
+         << ", " << (truth(client, "observes") ? "observes, " : "")
+         << (truth(client, "configured") ? "own configuration" : "no configuration") << ", " << text(client, "records")
+         << " records, " << rate(client) << ", " << text(client, "queued") << " queued, " << text(client, "lost")
+         << " lost\n";
 }
 
 ExitStatus showStatus(bool json, Tool& tool) {
@@ -94,7 +96,7 @@ ExitStatus showStatus(bool json, Tool& tool) {
               << '\n';
   tool.output << "configured: "
               << (report.contains("configured_metrics") ? text(report, "configured_metrics") + " metrics"
-                                                        : std::string("nothing, sources run at their own periods"))
+                                                        : std::string("nothing"))
               << (truth(report, "base_configuration") ? ", with a base configuration" : "") << '\n';
   tool.output << "sources:\n";
   for (const Value& source : list(report, "sources")) {
@@ -114,8 +116,11 @@ void addStatusCommand(CLI::App& program, Tool& tool) {
   auto json = std::make_shared<bool>(false);
   command->add_flag("--json", *json, "One JSON object instead of text");
   command->footer(
-      "Rates are the mean of the last ten seconds. Withheld records did not decode; lost ones a client was too\n"
-      "slow for.\n"
+      "A source runs, has ended (a trace that was played) or has failed; how old its last record is, is told by a "
+      "clock\n"
+      "that is never set. Rates are the mean of the last ten seconds. Withheld records did not decode; lost ones a "
+      "client\n"
+      "was too slow for. A client that neither observes nor has a configuration gets answers to its queries alone.\n"
       "\n"
       "Examples:\n"
       "  probectl status\n"

@@ -53,7 +53,7 @@ class ServiceNotes {
 };
 
 ExitStatus watch(const Options& options, Tool& tool) {
-  ServiceClient client(tool);
+  ServiceClient client(tool, {.observes = true});
   client.loop().onSignals({SIGINT, SIGTERM}, [&client](int) { client.loop().stop(); });
   RecordText text(options.text);
   std::uint64_t shown = 0;

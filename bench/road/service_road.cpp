@@ -91,8 +91,9 @@ int measure(double rate, double seconds) {
   DiscardingSink nowhere;
   radix::SocketSurroundings surroundings;
   surroundings.namedSocket = service.socket;
-  RadixWrapper wrapper(radix::client::makeSocketManager("probeview", RadixWrapper::queue(), surroundings),
-                       {.mainQueue = loop, .systemLog = nowhere});
+  RadixWrapper wrapper(
+      radix::client::makeSocketManager("probeview", RadixWrapper::queue(), surroundings, {.observes = true}),
+      {.mainQueue = loop, .systemLog = nowhere});
   // The manager tries to connect until the service is there.
   TimedStore store({.wrapper = &wrapper, .console = nowhere, .systemLog = nowhere}, service.most);
   loop.runUntil([&store] { return !store.latencies().empty(); }, patience);

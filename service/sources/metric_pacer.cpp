@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "service/sources/metric_pacer.h"
 
+#include <algorithm>
 #include <utility>
 
 namespace probeview {
@@ -20,6 +21,7 @@ void MetricPacer::offer(MetricRecord record) {
   const std::int64_t metricId = record.metricId;
   Entry& entry = entries_[metricId];
   entry.latest = std::move(record);
+  entry.offeredAt = clock_.monotonicTime();
   entry.waiting = true;
   passOrWait(metricId, entry);
 }
@@ -40,7 +42,7 @@ bool MetricPacer::resend(std::int64_t metricId) {
 }
 
 void MetricPacer::passOrWait(std::int64_t metricId, Entry& entry) {
-  if (plan_) {
+  if (plan_ && !plan_->observed) {
     const auto wanted = plan_->metrics.find(metricId);
     // Kept for the day on which somebody wants it: a serving cell that has not changed since is news to him.
     if (wanted == plan_->metrics.end()) return;
@@ -59,7 +61,19 @@ void MetricPacer::pass(Entry& entry) {
   entry.waiting = false;
   entry.passedAt = clock_.monotonicTime();
   entry.timer.reset();
-  sink_.emit(entry.latest);
+  MetricRecord record = entry.latest;
+  record.period = periodOf(record);
+  record.age += *entry.passedAt - entry.offeredAt;
+  sink_.emit(std::move(record));
+}
+
+std::chrono::milliseconds MetricPacer::periodOf(const MetricRecord& record) const {
+  const std::chrono::milliseconds own = record.period;
+  if (!plan_ || plan_->observed) return own;
+  const auto wanted = plan_->metrics.find(record.metricId);
+  // Nobody wants it again and again: it was asked for.
+  if (wanted == plan_->metrics.end()) return {};
+  return own.count() == 0 ? own : std::max(own, wanted->second.value_or(own));
 }
 
 }  // namespace probeview

@@ -17,7 +17,11 @@ namespace probeview {
 
 // Keeps the latest record of each metric and passes on what the plan wants: a metric that is not in the plan not at
 // all, one with a period not more often than that (what comes too early waits, and only the latest of it), one without
-// a period at once. Without a plan everything passes at once. On the scheduler's thread.
+// a period at once. Without a plan, and while somebody observes, everything passes at once. On the scheduler's thread.
+//
+// Records that pass say how long ago they were offered, and how often their metric comes as things are: what is offered
+// with the source's own period passes with that or the plan's, whichever is longer; what is offered without one, as it
+// comes on change, passes without one.
 class MetricPacer {
  public:
   // The sink, scheduler and clock must outlive the pacer.
@@ -31,12 +35,14 @@ class MetricPacer {
  private:
   struct Entry {
     MetricRecord latest;
+    std::chrono::nanoseconds offeredAt{};
     bool waiting = false;  // the latest has not been passed on, but is to be
     std::optional<std::chrono::nanoseconds> passedAt;
     ScheduledTaskHandle timer;
   };
 
   void pass(Entry& entry);
+  std::chrono::milliseconds periodOf(const MetricRecord& record) const;
   void passOrWait(std::int64_t metricId, Entry& entry);
 
   Scheduler& scheduler_;

@@ -319,7 +319,10 @@ class Reader {
   }
 
   void note(std::string text) { pendingNotes_.push_back(std::move(text)); }
-  void skip(const std::string& what) { problem(what + "; row skipped"); }
+  void skip(const std::string& what) {
+    ++log_.rowsSkipped;
+    problem(what + "; row skipped");
+  }
   void problem(const std::string& what) {
     ++log_.problemCount;
     if (log_.problems.size() < traceProblemsKept) {

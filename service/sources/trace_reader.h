@@ -55,6 +55,7 @@ struct TraceLog {
   // What was skipped or left out, each with its line; at most traceProblemsKept of them.
   std::vector<std::string> problems;
   std::size_t problemCount = 0;
+  std::size_t rowsSkipped = 0;
 };
 
 struct TraceLogResult {

@@ -5,6 +5,7 @@
 #include <set>
 #include <utility>
 
+#include "messages/metric_identifiers.h"
 #include "service/sources/metric_pacer.h"
 #include "service/sources/trace_reader.h"
 #include "service/sources/trace_translator.h"
@@ -54,6 +55,12 @@ std::string parseArguments(std::string_view text, TraceArguments& arguments) {
   return {};
 }
 
+// States and serving cells are told when they change, measurements with every row that has one.
+bool comesOnChange(std::int64_t metricId) {
+  return metricId == K_LTE_SCELL_INFO || metricId == K_LTE_RRC_STATE || metricId == K_UMTS_SCELL_INFO ||
+         metricId == K_UMTS_RRC_STATE || metricId == K_GSM_SCELL_INFO;
+}
+
 class TraceSource final : public MetricSource {
  public:
   TraceSource(const TraceArguments& arguments, TraceLog log)
@@ -75,6 +82,7 @@ class TraceSource final : public MetricSource {
     scheduler_ = &context.scheduler;
     clock_ = &context.clock;
     logLines_ = &context.log;
+    sink_ = &sink;
     pacer_.emplace(context, sink);
     for (const std::string& problem : log_.problems) say(problem);
     if (log_.problemCount > log_.problems.size()) {
@@ -105,6 +113,8 @@ class TraceSource final : public MetricSource {
 
   bool query(std::int64_t metricId) override { return pacer_->resend(metricId); }
 
+  std::optional<SourceIntake> intake() const override { return SourceIntake{log_.rows.size(), log_.rowsSkipped}; }
+
  private:
   bool ended() const { return next_ == log_.rows.size(); }
 
@@ -125,7 +135,12 @@ class TraceSource final : public MetricSource {
     const TraceRow& row = log_.rows[next_];
     translator_.translate(row, metricsOfRow_);
     for (TraceMetric& metric : metricsOfRow_) {
-      pacer_->offer({metric.metricId, std::move(metric.payload), row.time, origin_});
+      pacer_->offer({.metricId = metric.metricId,
+                     .payload = std::move(metric.payload),
+                     .time = row.time,
+                     .origin = origin_,
+                     .period = comesOnChange(metric.metricId) ? std::chrono::milliseconds(0) : rowPeriod(),
+                     .age = {}});
     }
     ++next_;
     if (!ended()) {
@@ -137,7 +152,13 @@ class TraceSource final : public MetricSource {
       wait(roundPause);
     } else {
       say("played to its end, line " + std::to_string(row.line));
+      sink_->conditionChanged({.phase = SourceCondition::Phase::Ended, .reason = {}});
     }
+  }
+
+  // A log has about one row a second.
+  std::chrono::milliseconds rowPeriod() const {
+    return std::chrono::milliseconds(std::max<std::int64_t>(1, static_cast<std::int64_t>(1000 / speed_)));
   }
 
   // Adds driven time to when the next row is due. Dates can be millennia apart; thirty years are as good as never.
@@ -158,6 +179,7 @@ class TraceSource final : public MetricSource {
   Scheduler* scheduler_ = nullptr;
   const Clock* clock_ = nullptr;
   LineSink* logLines_ = nullptr;
+  MetricSink* sink_ = nullptr;
   std::optional<MetricPacer> pacer_;
   TraceTranslator translator_;
   std::vector<TraceMetric> metricsOfRow_;

@@ -15,7 +15,8 @@ namespace probeview {
 // waited for. While nobody listens it rests, and goes on from there. At its end it stays with what was last known, or
 // begins anew after a second of the drive's time where it is to loop.
 //
-// Records carry the rows' own time. A query reports the latest known value again.
+// Records carry the rows' own time. A query reports the latest known value again, with the age that it has by then. A
+// trace that does not loop has ended with its last row.
 SourceResult makeTraceSource(std::string_view arguments);
 
 }  // namespace probeview

@@ -37,16 +37,16 @@ class PlayedService final : LinkListener, FrameHandler {
   template <typename Sentence>
   void say(const Sentence& sentence) {
     const FrameBytes frame = encode(sentence);
-    EXPECT_EQ(link_->send({&frame, 1}), 1U);
+    EXPECT_TRUE(link_->sendOne(frame));
   }
   void sayBytes(std::vector<std::uint8_t> bytes) {
     const FrameBytes frame = std::make_shared<const std::vector<std::uint8_t>>(std::move(bytes));
-    EXPECT_EQ(link_->send({&frame, 1}), 1U);
+    EXPECT_TRUE(link_->sendOne(frame));
   }
   template <typename Sentence>
   bool trySay(const Sentence& sentence) {
     const FrameBytes frame = encode(sentence);
-    return link_->send({&frame, 1}) == 1;
+    return link_->sendOne(frame);
   }
   void greet() { say(Hello{.name = "played"}); }
   void answer(std::size_t index, std::int32_t status = 0, std::string message = {}) {

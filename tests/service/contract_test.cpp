@@ -70,16 +70,18 @@ class Contract : public ::testing::TestWithParam<Factory> {
     world_.reset();
   }
 
-  Client& connect(const std::string& name = "test") {
+  Client& connect(const std::string& name = "test", radix::client::ManagerOptions options = {}) {
     clients_.push_back(std::make_unique<Client>());
     Client& client = *clients_.back();
-    client.manager = world_->manager(name);
+    client.manager = world_->manager(name, options);
     const auto take = [&client](const ObjectHandle& event, radix::client::Group) {
       client.events.push_back(radix::client::nativeDictionary(*event));
     };
     radix::client::RegisterEventHandler(client.manager, radix::kEventMetric, take);
     return client;
   }
+
+  Client& observe(const std::string& name = "test") { return connect(name, {.observes = true}); }
 
   Result perform(const Client& client, std::string_view command, const Dictionary& arguments = {}) {
     ObjectHandle reply;
@@ -142,23 +144,25 @@ INSTANTIATE_TEST_SUITE_P(, Contract, ::testing::Values(&makeInProcessService, &m
                          [](const auto& information) { return information.index == 0 ? "InProcess" : "Socket"; });
 
 TEST_P(Contract, ARecordArrivesAsAnEventWithItsKeysInOrder) {
-  Client& client = connect();
+  Client& client = observe();
   listen(client);
   world_->emit(K_LTE_RRC_STATE, rrcState(3), milliseconds(1709640000123));
   ASSERT_TRUE(until([&] { return client.events.size() == 1; }));
-  const Dictionary expected{{"kKeyMetricID", K_LTE_RRC_STATE},
-                            {"kKeyPayload", Value::bytes(rrcState(3))},
-                            {"kKeyProfileID", std::int64_t{0}},
-                            {"kKeyTime", std::int64_t{1709640000123}},
-                            {"kKeyOrigin", Value::text("scripted")}};
+  const Dictionary expected{
+      {"kKeyMetricID", K_LTE_RRC_STATE},       {"kKeyPayload", Value::bytes(rrcState(3))},
+      {"kKeyProfileID", std::int64_t{0}},      {"kKeyTime", std::int64_t{1709640000123}},
+      {"kKeyOrigin", Value::text("scripted")}, {"kKeyAge", *client.events[0].find(radix::kKeyAge)},
+      {"kKeyPeriod", std::int64_t{0}}};
   EXPECT_EQ(client.events[0], expected);
+  EXPECT_GE(client.events[0].find(radix::kKeyAge)->int64().value(), 0);
+  EXPECT_LT(client.events[0].find(radix::kKeyAge)->int64().value(), 30000);
   for (std::size_t index = 0; index < expected.size(); ++index) {
     EXPECT_EQ(client.events[0][index].key, expected[index].key);
   }
 }
 
 TEST_P(Contract, EventsArriveInTheirOrderAndEachOnce) {
-  Client& client = connect();
+  Client& client = observe();
   listen(client);
   world_->onService([&] {
     for (std::uint8_t state = 0; state < 7; ++state) world_->script().emit(K_LTE_RRC_STATE, rrcState(state));
@@ -170,7 +174,7 @@ TEST_P(Contract, EventsArriveInTheirOrderAndEachOnce) {
 }
 
 TEST_P(Contract, NothingIsDeliveredBeforeEventsOnAndAfterEventsOff) {
-  Client& client = connect();
+  Client& client = observe();
   world_->settle();
   world_->emit(K_LTE_TX_POWER, {});
   world_->settle();
@@ -185,7 +189,7 @@ TEST_P(Contract, NothingIsDeliveredBeforeEventsOnAndAfterEventsOff) {
 }
 
 TEST_P(Contract, ListeningTwiceDoesNotDeliverTwice) {
-  Client& client = connect();
+  Client& client = observe();
   listen(client);
   listen(client);
   world_->emit(K_LTE_RRC_STATE, rrcState(1));
@@ -195,7 +199,7 @@ TEST_P(Contract, ListeningTwiceDoesNotDeliverTwice) {
 }
 
 TEST_P(Contract, RegisteringAHandlerReplacesTheOneBefore) {
-  Client& client = connect();
+  Client& client = observe();
   listen(client);
   int second = 0;
   radix::client::RegisterEventHandler(client.manager, radix::kEventMetric,
@@ -205,19 +209,19 @@ TEST_P(Contract, RegisteringAHandlerReplacesTheOneBefore) {
   EXPECT_TRUE(client.events.empty());
 }
 
-TEST_P(Contract, ANewClientGetsTheLastRecordOfEachMetricInTheOrderOfTheirArrival) {
-  Client& first = connect();
+TEST_P(Contract, ANewObserverGetsTheLastRecordOfEachMetricInTheOrderOfTheirArrival) {
+  Client& first = observe();
   listen(first);
   world_->emit(K_LTE_RRC_STATE, rrcState(1));
   world_->emit(K_LTE_TX_POWER, {});
   world_->emit(K_LTE_RRC_STATE, rrcState(3));
-  Client& second = connect();
+  Client& second = observe();
   listen(second);
   EXPECT_EQ(second.metrics(), (std::vector<std::int64_t>{K_LTE_TX_POWER, K_LTE_RRC_STATE}));
   EXPECT_EQ(second.payloads()[1], rrcState(3));
 }
 
-TEST_P(Contract, TheLastRecordsComeOncePerConfigurationAndOnlyThoseItNames) {
+TEST_P(Contract, TheLastRecordsComeOnceAndOnlyThoseThatTheConfigurationNames) {
   Client& client = connect();
   world_->emit(K_LTE_RRC_STATE, rrcState(1));
   world_->emit(K_LTE_TX_POWER, {});
@@ -233,8 +237,8 @@ TEST_P(Contract, TheLastRecordsComeOncePerConfigurationAndOnlyThoseItNames) {
   EXPECT_EQ(client.metrics(), (std::vector<std::int64_t>{K_LTE_RRC_STATE, K_LTE_TX_POWER}));
 }
 
-TEST_P(Contract, AClientWithoutConfigurationGetsEveryRecordThatFlowsAndOneWithItOnlyItsOwn) {
-  Client& open = connect("open");
+TEST_P(Contract, AnObserverGetsEveryRecordThatFlowsAndOneWithAConfigurationOnlyItsOwn) {
+  Client& open = observe("open");
   Client& narrow = connect("narrow");
   ASSERT_EQ(
       push(narrow, "[metrics]\nK_LTE_TX_POWER = \"on change\"\n[triggers]\n0x7F0013 = [\"K_SIM_FILE_INFO\"]\n").status,
@@ -246,6 +250,231 @@ TEST_P(Contract, AClientWithoutConfigurationGetsEveryRecordThatFlowsAndOneWithIt
   world_->settle();
   EXPECT_EQ(open.metrics(), (std::vector<std::int64_t>{K_LTE_RRC_STATE, K_LTE_TX_POWER, K_SIM_FILE_INFO}));
   EXPECT_EQ(narrow.metrics(), (std::vector<std::int64_t>{K_LTE_TX_POWER, K_SIM_FILE_INFO}));
+}
+
+// A record that is told from all others by the number in it.
+Bytes numbered(std::uint8_t number) { return {0x08, number}; }
+
+std::vector<int> numbersOf(const std::vector<Bytes>& payloads) {
+  std::vector<int> numbers;
+  for (const Bytes& payload : payloads) numbers.push_back(payload.at(1));
+  return numbers;
+}
+
+constexpr std::string_view viewersConfiguration =
+    "[metrics]\nK_LTE_RRC_STATE = \"on change\"\nK_LTE_TX_POWER = 1000\n[triggers]\n0x7F0013 = [\"K_SIM_FILE_INFO\"]\n";
+
+TEST_P(Contract, AViewerThatStartsOnAWarmServiceGetsEachRecordOnce) {
+  for (const bool inHaste : {false, true}) {
+    SCOPED_TRACE(inHaste ? "in haste" : "with rests");
+    make({});
+    std::uint8_t number = 0;
+    world_->onService([&] {
+      world_->script().onQuery = [&](std::int64_t metric) {
+        world_->script().emit(metric, numbered(++number));
+        return true;
+      };
+    });
+    // The service is warm: somebody has watched before, and goes on watching.
+    Client& before = observe("before");
+    listen(before);
+    for (const std::int64_t metric : {K_LTE_RRC_STATE, K_LTE_TX_POWER, K_LTE_CDRX_CONFIG, K_LTE_RRC_STATE}) {
+      world_->emit(metric, numbered(++number));
+    }
+    Client& viewer = connect("probeview");
+    const auto rest = [&] {
+      if (!inHaste) world_->settle();
+    };
+    const auto start = [&] {
+      radix::client::EventsOff(viewer.manager);
+      radix::client::EventsOn(viewer.manager);
+      rest();
+    };
+    start();
+    ASSERT_EQ(perform(viewer, radix::kCommandClearConfiguration, {{radix::kKeyAppID, std::int64_t{2}}}).status, 0);
+    rest();
+    EXPECT_TRUE(viewer.events.empty()) << "it has asked for nothing so far";
+    ASSERT_EQ(push(viewer, viewersConfiguration).status, 0);
+    start();
+    ASSERT_EQ(query(viewer, 0x7F0013, 0).status, 0);
+    start();
+    world_->settle();
+    EXPECT_EQ(numbersOf(viewer.payloads()), (std::vector<int>{2, 4, 5}));
+    // What flows comes once, too, and what it has not named does not.
+    world_->emit(K_LTE_CDRX_CONFIG, numbered(++number));
+    world_->emit(K_LTE_RRC_STATE, numbered(++number));
+    world_->settle();
+    start();
+    // A later push brings what was not sent so far.
+    ASSERT_EQ(push(viewer, std::string(viewersConfiguration.substr(0, viewersConfiguration.find("[triggers]"))) +
+                               "K_LTE_CDRX_CONFIG = 500\n")
+                  .status,
+              0);
+    start();
+    world_->settle();
+    EXPECT_EQ(numbersOf(viewer.payloads()), (std::vector<int>{2, 4, 5, 7, 6}));
+
+    // The next service knows nothing of all this; what it sends comes once as well.
+    viewer.events.clear();
+    world_->kill();
+    ASSERT_TRUE(until([&] { return !radix::client::Connection(viewer.manager).connected; }));
+    world_->restart();
+    // Records that are there before the client is.
+    for (const std::int64_t metric : {K_LTE_RRC_STATE, K_SIM_FILE_INFO, K_LTE_CDRX_CONFIG}) {
+      world_->emit(metric, numbered(++number));
+    }
+    ASSERT_TRUE(until([&] { return viewer.events.size() >= 2; }));
+    start();
+    world_->emit(K_LTE_TX_POWER, numbered(++number));
+    ASSERT_TRUE(until([&] { return viewer.events.size() >= 3; }));
+    world_->settle();
+    EXPECT_EQ(numbersOf(viewer.payloads()), (std::vector<int>{8, 10, 11}));
+    clients_.clear();
+    world_->settle();
+  }
+}
+
+TEST_P(Contract, WhoeverHasPushedNothingGetsNothingAndKeepsNoSourceAwake) {
+  Client& client = connect();
+  listen(client);
+  EXPECT_FALSE(sourceIsHeard());
+  world_->emit(K_LTE_RRC_STATE, rrcState(1));
+  world_->settle();
+  EXPECT_TRUE(client.events.empty());
+  // The push is enough where delivery is on.
+  ASSERT_EQ(push(client, "[metrics]\nK_LTE_RRC_STATE = 1000\n").status, 0);
+  EXPECT_TRUE(sourceIsHeard());
+  ASSERT_TRUE(until([&] { return client.events.size() == 1; }));
+  ASSERT_EQ(perform(client, radix::kCommandClearConfiguration).status, 0);
+  EXPECT_FALSE(sourceIsHeard());
+  world_->emit(K_LTE_RRC_STATE, rrcState(2));
+  listen(client);
+  EXPECT_EQ(client.events.size(), 1U);
+  // One that is refused asks for nothing.
+  EXPECT_NE(push(client, "[metrics]\nK_LTE_RRC_STATE = = 5\n").status, 0);
+  listen(client);
+  EXPECT_EQ(client.events.size(), 1U);
+  EXPECT_FALSE(sourceIsHeard());
+}
+
+TEST_P(Contract, AnAnswerGoesOnceToEachWhoAskedAndToThoseWhoTakeTheMetricAnyway) {
+  world_->onService([&] { world_->script().onQuery = [](std::int64_t) { return true; }; });
+  Client& first = connect("first");
+  Client& second = connect("second");
+  Client& silent = connect("silent");
+  Client& watching = observe("watching");
+  for (Client* client : {&first, &second, &silent, &watching}) listen(*client);
+  ASSERT_EQ(query(first, 0, K_LTE_RRC_STATE).status, 0);
+  ASSERT_EQ(query(second, 0, K_LTE_RRC_STATE).status, 0);
+  ASSERT_EQ(query(watching, 0, K_LTE_RRC_STATE).status, 0);
+  // Another metric is no answer, and after the answer the metric flows for others.
+  world_->emit(K_LTE_TX_POWER, numbered(1));
+  world_->emit(K_LTE_RRC_STATE, numbered(2));
+  world_->emit(K_LTE_RRC_STATE, numbered(3));
+  ASSERT_TRUE(until([&] { return watching.events.size() == 3; }));
+  world_->settle();
+  EXPECT_EQ(numbersOf(first.payloads()), std::vector<int>{2});
+  EXPECT_EQ(numbersOf(second.payloads()), std::vector<int>{2});
+  EXPECT_TRUE(silent.events.empty());
+  EXPECT_EQ(numbersOf(watching.payloads()), (std::vector<int>{1, 2, 3}));
+  // Asking keeps no source awake.
+  watching.manager.reset();
+  EXPECT_TRUE(until([&] { return !sourceIsHeard(); }));
+}
+
+TEST_P(Contract, AQuestionThatIsRefusedOpensNothing) {
+  world_->onService([&] { world_->script().onQuery = [](std::int64_t) { return false; }; });
+  Client& client = connect();
+  listen(client);
+  EXPECT_NE(query(client, 0, K_LTE_RRC_STATE).status, 0);
+  world_->emit(K_LTE_RRC_STATE, numbered(1));
+  world_->settle();
+  EXPECT_TRUE(client.events.empty());
+}
+
+TEST_P(Contract, AnAnswerThatComesWhileEventsAreOffIsThereWhenTheyAreOn) {
+  world_->onService([&] { world_->script().onQuery = [](std::int64_t) { return true; }; });
+  Client& client = connect();
+  listen(client);
+  ASSERT_EQ(query(client, 0, K_LTE_RRC_STATE).status, 0);
+  radix::client::EventsOff(client.manager);
+  world_->settle();
+  world_->emit(K_LTE_RRC_STATE, numbered(1));
+  world_->settle();
+  EXPECT_TRUE(client.events.empty());
+  listen(client);
+  EXPECT_EQ(numbersOf(client.payloads()), std::vector<int>{1});
+  listen(client);
+  EXPECT_EQ(client.events.size(), 1U);
+}
+
+TEST_P(Contract, ForAnObserverSourcesRunAtTheirOwnPeriodsOrShorterWhereAConfigurationAsks) {
+  Client& narrow = connect("narrow");
+  ASSERT_EQ(push(narrow, "[metrics]\nK_LTE_RRC_STATE = 1000\n").status, 0);
+  listen(narrow);
+  EXPECT_FALSE(plan()->observed);
+  Client& client = observe();
+  world_->settle();
+  EXPECT_FALSE(plan()->observed) << "it does not listen yet";
+  listen(client);
+  ASSERT_TRUE(plan());
+  EXPECT_TRUE(plan()->observed);
+  EXPECT_EQ(plan()->metrics.at(K_LTE_RRC_STATE), milliseconds(1000));
+  narrow.manager.reset();
+  EXPECT_TRUE(until([&] { return !plan(); })) << "alone it needs no plan";
+}
+
+TEST_P(Contract, TheClientIsToldWhatFeedsTheServiceAndWhenThatChanges) {
+  Client& client = connect();
+  const auto sources = [&] { return radix::client::Connection(client.manager).sources; };
+  using State = radix::client::SourceState;
+  ASSERT_TRUE(until([&] { return sources().has_value(); }));
+  ASSERT_EQ(sources()->size(), 1U);
+  EXPECT_EQ((*sources())[0].origin, "scripted");
+  EXPECT_EQ((*sources())[0].phase, State::Phase::Running);
+  EXPECT_EQ((*sources())[0].metrics, world_->script().metrics);
+  world_->onService([&] { world_->script().sink->conditionChanged({.phase = State::Phase::Ended, .reason = {}}); });
+  EXPECT_TRUE(until([&] { return (*sources())[0].phase == State::Phase::Ended; }));
+  // It has more to say after all.
+  world_->onService([&] { world_->script().sink->conditionChanged({}); });
+  EXPECT_TRUE(until([&] { return (*sources())[0].phase == State::Phase::Running; }));
+  world_->onService(
+      [&] { world_->script().onQuery = [](std::int64_t) -> bool { throw std::runtime_error("out of order"); }; });
+  query(client, 0, K_LTE_TX_POWER);
+  ASSERT_TRUE(until([&] { return (*sources())[0].phase == State::Phase::Failed; }));
+  EXPECT_EQ((*sources())[0].reason, "failed answering a query: out of order");
+  // Nobody knows what feeds a service that is not there.
+  world_->kill();
+  EXPECT_TRUE(until([&] { return !sources(); }));
+}
+
+TEST_P(Contract, TheOutcomeOfTheConfigurationIsKnown) {
+  Client& client = connect();
+  using Outcome = radix::client::ConfigurationOutcome;
+  const auto outcome = [&] { return radix::client::Connection(client.manager).configuration; };
+  EXPECT_EQ(outcome(), Outcome::NotPushed);
+  push(client, "[metrics]\n");
+  EXPECT_EQ(outcome(), Outcome::Accepted);
+  const Result refused = push(client, "[metrics\n");
+  EXPECT_EQ(outcome(), Outcome::Refused);
+  EXPECT_EQ(radix::client::Connection(client.manager).configurationTrouble, refused.message);
+  perform(client, radix::kCommandClearConfiguration);
+  EXPECT_EQ(outcome(), Outcome::NotPushed);
+  EXPECT_EQ(radix::client::Connection(client.manager).configurationTrouble, "");
+  const Result tooLarge = push(client, std::string(200000, '#'));
+  EXPECT_TRUE(until([&] { return outcome() == Outcome::Refused; }));
+  EXPECT_EQ(radix::client::Connection(client.manager).configurationTrouble, tooLarge.message);
+  world_->kill();
+  ASSERT_TRUE(until([&] { return !radix::client::Connection(client.manager).connected; }));
+  push(client, "[metrics]\n");
+  EXPECT_EQ(outcome(), Outcome::Unsent);
+  world_->restart();
+  EXPECT_TRUE(until([&] { return outcome() == Outcome::Accepted; }));
+  world_->kill();
+  ASSERT_TRUE(until([&] { return !radix::client::Connection(client.manager).connected; }));
+  push(client, "[metrics\n");
+  world_->restart();
+  EXPECT_TRUE(until([&] { return outcome() == Outcome::Refused; }));
 }
 
 TEST_P(Contract, SourcesAreToldTheUnionOfAllConfigurationsAtTheShortestPeriod) {
@@ -407,7 +636,7 @@ TEST_P(Contract, AnIdentifierThatIsNoMetricsIsTakenForThatOfATrigger) {
 }
 
 TEST_P(Contract, ASourceIsToldWhetherAnybodyListens) {
-  Client& client = connect();
+  Client& client = observe();
   world_->settle();
   EXPECT_FALSE(sourceIsHeard());
   listen(client);
@@ -421,7 +650,7 @@ TEST_P(Contract, ASourceIsToldWhetherAnybodyListens) {
 }
 
 TEST_P(Contract, APayloadThatDoesNotDecodeIsCountedLoggedAndWithheld) {
-  Client& client = connect();
+  Client& client = observe();
   listen(client);
   world_->emit(K_LTE_RRC_STATE, {0x08});
   world_->emit(K_LTE_RRC_STATE, rrcState(2));
@@ -436,7 +665,7 @@ TEST_P(Contract, APayloadThatDoesNotDecodeIsCountedLoggedAndWithheld) {
 }
 
 TEST_P(Contract, TheStatusTellsSourcesClientsAndCounts) {
-  Client& client = connect("somebody");
+  Client& client = observe("somebody");
   listen(client);
   world_->emit(K_LTE_RRC_STATE, rrcState(2), milliseconds(5000));
   ASSERT_TRUE(until([&] { return client.events.size() == 1; }));
@@ -492,7 +721,7 @@ TEST_P(Contract, WithoutAServiceEachCommandAnswersWithANonZeroStatusThatSaysSo) 
 
 TEST_P(Contract, AClientStartedBeforeTheServiceConnectsWhenItComes) {
   world_->kill();
-  Client& client = connect();
+  Client& client = observe();
   EXPECT_EQ(perform(client, radix::kCommandShowStatus).status, static_cast<int>(Status::NoService));
   EXPECT_FALSE(radix::client::Connection(client.manager).everConnected);
   radix::client::EventsOn(client.manager);

@@ -33,7 +33,8 @@ class Faults : public ::testing::Test, protected radix::Connector {
   Faults() : service_(loop_, ServiceLog(log_, LogLevel::Info), {}) {
     script_->metrics = {K_LTE_RRC_STATE};
     service_.addSource(std::make_unique<ScriptedSource>(script_));
-    manager_ = radix::client::makeConnectionManager(loop_, std::make_unique<Forward>(*this), {.clientName = "client"},
+    manager_ = radix::client::makeConnectionManager(loop_, std::make_unique<Forward>(*this),
+                                                    {.clientName = "client", .observes = true},
                                                     {std::shared_ptr<void>(), &loop_});
     radix::client::RegisterEventHandler(manager_, radix::kEventMetric,
                                         [this](const auto&, radix::client::Group) { ++events_; });
@@ -54,9 +55,9 @@ class Faults : public ::testing::Test, protected radix::Connector {
   std::unique_ptr<RawClient> connectRaw() { return std::make_unique<RawClient>(connect().link); }
 
   // A raw client that has greeted and been greeted.
-  std::unique_ptr<RawClient> greeted(const std::string& name = "raw") {
+  std::unique_ptr<RawClient> greeted(const std::string& name = "raw", bool observes = true) {
     auto client = connectRaw();
-    client->say(radix::Hello{.name = name});
+    client->say(radix::Hello{.name = name, .observes = observes});
     loop_.run();
     EXPECT_TRUE(client->hello.has_value());
     return client;
@@ -341,7 +342,7 @@ class StuckLink final : public radix::Link {
   };
   explicit StuckLink(Shared& shared) : shared_(shared) {}
   void start(radix::LinkListener& listener) override { shared_.listener = &listener; }
-  std::size_t send(std::span<const radix::FrameBytes> frames) override {
+  std::size_t send(std::span<const radix::OutgoingFrame> frames) override {
     const std::size_t taken = std::min(frames.size(), shared_.room);
     shared_.room -= taken;
     shared_.sent += taken;
@@ -388,7 +389,7 @@ TEST(HangingSource, HoldsUpTheServiceForAsLongAsItHangsAndEverybodyIsToldAfterTw
   world->kill();
   world->restart();
   const auto asker = world->manager("asker");
-  const auto other = world->manager("other");
+  const auto other = world->manager("other", {.observes = true});
   int events = 0;
   radix::client::RegisterEventHandler(other, radix::kEventMetric,
                                       [&events](const auto&, radix::client::Group) { ++events; });

@@ -29,7 +29,7 @@ class HostileClients : public ::testing::TestWithParam<Factory> {
     settings.greetingTime = std::chrono::milliseconds(1500);
     settings.leavingTime = std::chrono::milliseconds(100);
     world_ = GetParam()(settings);
-    good_ = world_->manager("good");
+    good_ = world_->manager("good", {.observes = true});
     radix::client::RegisterEventHandler(good_, radix::kEventMetric,
                                         [this](const auto&, radix::client::Group) { ++goodEvents_; });
     radix::client::EventsOn(good_);
@@ -46,7 +46,7 @@ class HostileClients : public ::testing::TestWithParam<Factory> {
   // A raw client that has greeted and been greeted.
   std::unique_ptr<RawClient> greeted() {
     auto client = connect();
-    client->say(radix::Hello{.name = "raw"});
+    client->say(radix::Hello{.name = "raw", .observes = true});
     EXPECT_TRUE(world_->until([&] { return client->hello.has_value(); }));
     return client;
   }

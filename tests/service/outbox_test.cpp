@@ -29,11 +29,11 @@ class Losses final : public radix::FrameHandler {
 
 // Takes up to so many frames; records as their marks, words as they are told.
 std::string take(Outbox& outbox, std::size_t most, Losses* losses = nullptr) {
-  std::array<radix::FrameBytes, 64> frames;
-  const std::size_t count = outbox.next({frames.data(), std::min<std::size_t>(most, frames.size())});
+  std::array<radix::OutgoingFrame, 64> frames;
+  const std::size_t count = outbox.next({frames.data(), std::min<std::size_t>(most, frames.size())}, {});
   std::string taken;
   for (std::size_t index = 0; index < count; ++index) {
-    const Bytes& bytes = *frames[index];
+    const Bytes& bytes = *frames[index].frame;
     Losses heard;
     if (bytes.size() == 1) {
       taken += static_cast<char>(bytes[0]);
@@ -51,10 +51,10 @@ std::string take(Outbox& outbox, std::size_t most, Losses* losses = nullptr) {
 TEST(Outbox, RecordsLeaveInTheirOrderAndWordsGoFirst) {
   Outbox outbox({});
   EXPECT_TRUE(outbox.empty());
-  outbox.addRecord(1, frame('a'));
-  outbox.addRecord(2, frame('b'));
+  outbox.addRecord({1, frame('a')});
+  outbox.addRecord({2, frame('b')});
   outbox.addWord(frame('W'));
-  outbox.addRecord(1, frame('c'));
+  outbox.addRecord({1, frame('c')});
   EXPECT_EQ(take(outbox, 2), "Wa");
   EXPECT_EQ(take(outbox, 64), "bc");
   EXPECT_TRUE(outbox.empty());
@@ -64,22 +64,22 @@ TEST(Outbox, RecordsLeaveInTheirOrderAndWordsGoFirst) {
 
 TEST(Outbox, WhatWasNotSentIsOfferedAgain) {
   Outbox outbox({});
-  outbox.addRecord(1, frame('a'));
-  outbox.addRecord(1, frame('b'));
-  std::array<radix::FrameBytes, 2> frames;
-  EXPECT_EQ(outbox.next(frames), 2U);
+  outbox.addRecord({1, frame('a')});
+  outbox.addRecord({1, frame('b')});
+  std::array<radix::OutgoingFrame, 2> frames;
+  EXPECT_EQ(outbox.next(frames, {}), 2U);
   outbox.sent(1);
   EXPECT_EQ(take(outbox, 64), "b");
 }
 
 TEST(Outbox, AtTheLimitNothingIsLostAndOneRecordPastItTheOldestOfTheSameMetricIs) {
   Outbox outbox({.records = 4, .bytes = 1000});
-  outbox.addRecord(1, frame('a'));
-  outbox.addRecord(2, frame('b'));
-  outbox.addRecord(1, frame('c'));
-  outbox.addRecord(2, frame('d'));
+  outbox.addRecord({1, frame('a')});
+  outbox.addRecord({2, frame('b')});
+  outbox.addRecord({1, frame('c')});
+  outbox.addRecord({2, frame('d')});
   EXPECT_EQ(outbox.lostRecords(), 0U);
-  outbox.addRecord(2, frame('e'));
+  outbox.addRecord({2, frame('e')});
   EXPECT_EQ(outbox.lostRecords(), 1U);
   EXPECT_EQ(outbox.records(), 4U);
   Losses losses;
@@ -89,20 +89,20 @@ TEST(Outbox, AtTheLimitNothingIsLostAndOneRecordPastItTheOldestOfTheSameMetricIs
 
 TEST(Outbox, AMetricOfWhichNothingWaitsTakesThePlaceOfTheOldestOfTheMostFrequentOne) {
   Outbox outbox({.records = 4, .bytes = 1000});
-  outbox.addRecord(1, frame('a'));
-  outbox.addRecord(2, frame('b'));
-  outbox.addRecord(2, frame('c'));
-  outbox.addRecord(3, frame('d'));
-  outbox.addRecord(4, frame('e'));
+  outbox.addRecord({1, frame('a')});
+  outbox.addRecord({2, frame('b')});
+  outbox.addRecord({2, frame('c')});
+  outbox.addRecord({3, frame('d')});
+  outbox.addRecord({4, frame('e')});
   EXPECT_EQ(take(outbox, 64), "!acde");
 }
 
 TEST(Outbox, TheBytesAreLimitedToo) {
   Outbox outbox({.records = 100, .bytes = 10});
-  outbox.addRecord(1, frame('a', 5));
-  outbox.addRecord(2, frame('b', 5));
+  outbox.addRecord({1, frame('a', 5)});
+  outbox.addRecord({2, frame('b', 5)});
   EXPECT_EQ(outbox.lostRecords(), 0U);
-  outbox.addRecord(2, frame('c', 6));
+  outbox.addRecord({2, frame('c', 6)});
   // The oldest of the same metric goes first, and then as much more as is needed.
   EXPECT_EQ(outbox.lostRecords(), 2U);
   EXPECT_EQ(take(outbox, 64), "!c");
@@ -110,18 +110,18 @@ TEST(Outbox, TheBytesAreLimitedToo) {
 
 TEST(Outbox, ARecordLargerThanAllRoomIsTheOnlyOneThatWaits) {
   Outbox outbox({.records = 100, .bytes = 10});
-  outbox.addRecord(1, frame('a'));
-  outbox.addRecord(1, frame('b', 50));
+  outbox.addRecord({1, frame('a')});
+  outbox.addRecord({1, frame('b', 50)});
   EXPECT_EQ(take(outbox, 64), "!b");
 }
 
 TEST(Outbox, LossesAreToldOnceAndExactly) {
   Outbox outbox({.records = 2, .bytes = 1000});
   Losses losses;
-  for (int number = 0; number < 5; ++number) outbox.addRecord(1, frame('x'));
+  for (int number = 0; number < 5; ++number) outbox.addRecord({1, frame('x')});
   EXPECT_EQ(take(outbox, 1, &losses), "!");
   EXPECT_EQ(losses.count, 3U);
-  outbox.addRecord(1, frame('y'));
+  outbox.addRecord({1, frame('y')});
   EXPECT_EQ(take(outbox, 64, &losses), "!xy");
   EXPECT_EQ(losses.count, 4U);
   EXPECT_EQ(take(outbox, 64, &losses), "");
@@ -130,8 +130,8 @@ TEST(Outbox, LossesAreToldOnceAndExactly) {
 
 TEST(Outbox, AMetricThatFloodsBehindOneThatWaitsDoesNotMakeItGrow) {
   Outbox outbox({.records = 8, .bytes = 1000});
-  outbox.addRecord(1, frame('a'));
-  for (int number = 0; number < 10000; ++number) outbox.addRecord(2, frame('f'));
+  outbox.addRecord({1, frame('a')});
+  for (int number = 0; number < 10000; ++number) outbox.addRecord({2, frame('f')});
   EXPECT_EQ(outbox.records(), 8U);
   EXPECT_EQ(outbox.lostRecords(), 10001U - 8U);
   EXPECT_EQ(take(outbox, 64), "!afffffff");
@@ -162,7 +162,7 @@ TEST(Outbox, ManyRandomStepsAgreeWithAPlainModel) {
           ++lost;
         }
         model.emplace_back(metric, mark);
-        outbox.addRecord(metric, frame(static_cast<std::uint8_t>(mark)));
+        outbox.addRecord({metric, frame(static_cast<std::uint8_t>(mark))});
       } else {
         const std::size_t most = 1 + random() % 4;
         std::string taken = take(outbox, most, &told);
@@ -183,19 +183,19 @@ TEST(Outbox, ManyRandomStepsAgreeWithAPlainModel) {
 
 TEST(Outbox, HoldsFourThousandAndNinetySixRecordsAndNotOneMore) {
   Outbox outbox({});
-  for (int number = 0; number < 4096; ++number) outbox.addRecord(number % 30, frame('r'));
+  for (int number = 0; number < 4096; ++number) outbox.addRecord({number % 30, frame('r')});
   EXPECT_EQ(outbox.records(), 4096U);
   EXPECT_EQ(outbox.lostRecords(), 0U);
-  outbox.addRecord(7, frame('r'));
+  outbox.addRecord({7, frame('r')});
   EXPECT_EQ(outbox.records(), 4096U);
   EXPECT_EQ(outbox.lostRecords(), 1U);
 }
 
 TEST(Outbox, HoldsEightMebibytesAndNotOneByteMore) {
   Outbox outbox({});
-  for (int number = 0; number < 64; ++number) outbox.addRecord(number % 3, frame('r', 128 * 1024));
+  for (int number = 0; number < 64; ++number) outbox.addRecord({number % 3, frame('r', 128 * 1024)});
   EXPECT_EQ(outbox.lostRecords(), 0U);
-  outbox.addRecord(2, frame('r'));
+  outbox.addRecord({2, frame('r')});
   EXPECT_EQ(outbox.records(), 64U);
   EXPECT_EQ(outbox.lostRecords(), 1U);
 }

@@ -20,23 +20,30 @@ using std::chrono::milliseconds;
 using std::chrono::nanoseconds;
 using std::chrono::seconds;
 
-TEST(Plans, WithoutAnyThereIsNone) { EXPECT_EQ(unite({}), std::nullopt); }
+TEST(Plans, WithoutAnyThereIsNone) { EXPECT_EQ(unite({}, false), std::nullopt); }
 
 TEST(Plans, TheUnionHasEachMetricAtTheShortestPeriodWithOnChangeAboveAll) {
   const MetricPlan first{{{1, milliseconds(500)}, {2, std::nullopt}, {3, milliseconds(7)}}};
   const MetricPlan second{{{1, milliseconds(200)}, {2, milliseconds(1)}, {4, std::nullopt}}};
   const std::vector<const MetricPlan*> plans{&first, &second};
-  const auto all = unite(plans);
+  const auto all = unite(plans, false);
   ASSERT_TRUE(all);
   const decltype(MetricPlan::metrics) expected{
       {1, milliseconds(200)}, {2, std::nullopt}, {3, milliseconds(7)}, {4, std::nullopt}};
   EXPECT_EQ(all->metrics, expected);
 }
 
+TEST(Plans, SomebodyWhoObservesWantsEverythingBesideThemAndAloneNeedsNone) {
+  const MetricPlan plan{{{1, milliseconds(500)}}};
+  const std::vector<const MetricPlan*> plans{&plan};
+  EXPECT_EQ(unite(plans, true), (MetricPlan{.metrics = plan.metrics, .observed = true}));
+  EXPECT_EQ(unite({}, true), std::nullopt);
+}
+
 TEST(Plans, AnEmptyPlanIsAPlan) {
   const MetricPlan nothing;
   const std::vector<const MetricPlan*> plans{&nothing};
-  const auto all = unite(plans);
+  const auto all = unite(plans, false);
   ASSERT_TRUE(all);
   EXPECT_TRUE(all->metrics.empty());
 }
@@ -51,9 +58,9 @@ TEST(LastRecords, KeepTheLastOfEachMetricInTheOrderOfArrival) {
   LastRecords records;
   const auto old = std::make_shared<const std::vector<std::uint8_t>>(1);
   const auto fresh = std::make_shared<const std::vector<std::uint8_t>>(2);
-  records.keep(5, old);
-  records.keep(3, old);
-  records.keep(5, fresh);
+  EXPECT_EQ(records.keep({5, old}), 1U);
+  EXPECT_EQ(records.keep({3, old}), 2U);
+  EXPECT_EQ(records.keep({5, fresh}), 3U);
   EXPECT_EQ(metricsOf(records), (std::vector<std::int64_t>{3, 5}));
   EXPECT_EQ(records.records().rbegin()->second.frame, fresh);
 }
@@ -62,12 +69,12 @@ TEST(LastRecords, KeepAsManyMetricsAsTheLimitSaysAndNotOneMore) {
   LastRecords records;
   const auto frame = std::make_shared<const std::vector<std::uint8_t>>(1);
   for (std::size_t metric = 0; metric < LastRecords::mostMetrics; ++metric) {
-    records.keep(static_cast<std::int64_t>(metric), frame);
+    records.keep({static_cast<std::int64_t>(metric), frame});
   }
   EXPECT_EQ(records.records().size(), LastRecords::mostMetrics);
-  records.keep(-1, frame);
+  EXPECT_EQ(records.keep({-1, frame}), 0U);
   EXPECT_EQ(records.records().size(), LastRecords::mostMetrics);
-  records.keep(0, frame);
+  records.keep({0, frame});
   EXPECT_EQ(metricsOf(records).back(), 0);
 }
 

@@ -118,6 +118,25 @@ TEST_F(ServiceCommands, QueryPrintsTheAnswerAndNotTheRecordFromBefore) {
   EXPECT_EQ(probectl({"query", "0x3C4E04", "--json"}).status, 0);
 }
 
+TEST_F(ServiceCommands, AQueryDoesNotKeepSourcesAwakeAndAWatchDoes) {
+  int listened = 0;
+  world_->onService([&] {
+    world_->script().onListening = [&](bool listening) {
+      if (!listening) return;
+      ++listened;
+      world_->script().emit(K_LTE_RRC_STATE, {0x10, 1});
+    };
+    world_->script().onQuery = [this](std::int64_t metric) {
+      world_->script().emit(metric, {0x10, 3});
+      return true;
+    };
+  });
+  EXPECT_EQ(probectl({"query", "K_LTE_RRC_STATE"}).status, 0);
+  world_->onService([&] { EXPECT_EQ(listened, 0); });
+  EXPECT_EQ(probectl({"watch", "--count", "1"}).status, 0);
+  world_->onService([&] { EXPECT_EQ(listened, 1); });
+}
+
 TEST_F(ServiceCommands, AQueryThatNoSourceCanFillEndsWithStatusOneAndTheReason) {
   const Outcome outcome = probectl({"query", "K_LTE_TX_POWER"});
   EXPECT_EQ(outcome.status, 1);
@@ -179,11 +198,36 @@ TEST_F(ServiceCommands, StatusShowsSourcesAndClients) {
   const Outcome outcome = probectl({"status"});
   EXPECT_EQ(outcome.status, 0);
   EXPECT_THAT(outcome.output, StartsWith("radixd " PROBEVIEW_VERSION ", up for "));
-  EXPECT_THAT(outcome.output, HasSubstr("  scripted: 1 records, "));
+  EXPECT_THAT(outcome.output, HasSubstr("  scripted: running, 1 records, "));
   EXPECT_THAT(outcome.output, HasSubstr("'probectl'"));
   const auto json = nlohmann::json::parse(probectl({"status", "--json"}).output);
   EXPECT_EQ(json.at("sources").at(0).at("records"), 1);
+  EXPECT_EQ(json.at("sources").at(0).at("state"), "running");
+  EXPECT_GE(json.at("sources").at(0).at("last_record_age_ms"), 0);
   EXPECT_EQ(json.at("clients").at(0).at("name"), "probectl");
+}
+
+TEST_F(ServiceCommands, StatusTellsASourceThatHasEndedFromOneThatHasFailedAndWhy) {
+  world_->script().intake = SourceIntake{.rowsRead = 300, .rowsSkipped = 2};
+  world_->kill();
+  world_->restart();
+  using Phase = SourceCondition::Phase;
+  world_->onService([&] { world_->script().sink->conditionChanged({.phase = Phase::Ended, .reason = {}}); });
+  EXPECT_THAT(probectl({"status"}).output,
+              HasSubstr("  scripted: ended, 300 rows read, 2 skipped, 0 records, 0.0/s, "));
+  auto source = nlohmann::json::parse(probectl({"status", "--json"}).output).at("sources").at(0);
+  EXPECT_EQ(source.at("state"), "ended");
+  EXPECT_EQ(source.at("rows_read"), 300);
+  EXPECT_EQ(source.at("rows_skipped"), 2);
+  EXPECT_FALSE(source.contains("last_record_age_ms"));
+  EXPECT_FALSE(source.contains("failure"));
+  world_->onService(
+      [&] { world_->script().sink->conditionChanged({.phase = Phase::Failed, .reason = "the card is gone"}); });
+  EXPECT_THAT(probectl({"status"}).output, HasSubstr("  scripted: failed, "));
+  EXPECT_THAT(probectl({"status"}).output, HasSubstr("; the card is gone\n"));
+  source = nlohmann::json::parse(probectl({"status", "--json"}).output).at("sources").at(0);
+  EXPECT_EQ(source.at("state"), "failed");
+  EXPECT_EQ(source.at("failure"), "the card is gone");
 }
 
 TEST_F(ServiceCommands, WithoutAServiceEachSaysSoAndEndsWithStatusOne) {

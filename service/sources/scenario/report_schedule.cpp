@@ -28,9 +28,15 @@ void ReportSchedule::setPlan(const std::optional<MetricPlan>& plan) {
       setPeriod(entry, report.ownPeriod);
     } else {
       const auto wish = plan->metrics.find(report.metricId);
-      entry.wanted = wish != plan->metrics.end();
-      std::optional<Milliseconds> period;
-      if (entry.wanted && wish->second) period = wish->second->count();
+      const bool isListed = wish != plan->metrics.end();
+      entry.wanted = isListed || plan->observed;
+      std::optional<Milliseconds> period = plan->observed ? report.ownPeriod : std::nullopt;
+      if (isListed) {
+        std::optional<Milliseconds> wished;
+        if (wish->second) wished = wish->second->count();
+        // On change is more than any period: without one sorts before all that have one.
+        period = plan->observed ? std::min(period, wished) : wished;
+      }
       setPeriod(entry, period);
     }
     if (entry.wanted && !wasWanted) entry.pending = true;
@@ -47,6 +53,11 @@ void ReportSchedule::renew() {
 
 bool ReportSchedule::wantsAnything() const {
   return std::ranges::any_of(entries_, [](const Entry& entry) { return entry.wanted; });
+}
+
+Milliseconds ReportSchedule::reportingPeriod(const Report& report) const {
+  const Entry& entry = entries_[static_cast<std::size_t>(report.fact)];
+  return entry.wanted ? entry.realPeriod.value_or(0) : 0;
 }
 
 std::optional<Milliseconds> ReportSchedule::shortestPeriod() const {

@@ -24,6 +24,8 @@ class ReportSchedule {
   void renew();
   // Whether anything of it is wanted at all.
   bool wantsAnything() const;
+  // How often the fact is reported as things are, in ms of real time; 0: on change, or only when it is asked for.
+  Milliseconds reportingPeriod(const Report& report) const;
   // The shortest period that anybody wants, in ms of real time; none if everything is wanted on change only.
   std::optional<Milliseconds> shortestPeriod() const;
 

@@ -146,6 +146,9 @@ class ScenarioSource final : public MetricSource {
     record.time = anchorWall_ + milliseconds(simulated - anchorSimulated_);
     record.payload = story_->tell(report.fact, static_cast<std::uint64_t>(record.time.count()));
     record.origin = origin_;
+    record.period = milliseconds(schedule_.reportingPeriod(report));
+    record.age = std::chrono::duration_cast<nanoseconds>(
+        std::chrono::duration<double, std::milli>(static_cast<double>(story_->now() - simulated) / speed_));
     sink_->emit(std::move(record));
   }
 

@@ -24,9 +24,9 @@ class InProcessService final : public TestService {
     loop_.run();
   }
 
-  radix::client::ManagerHandle manager(const std::string& clientName) override {
+  radix::client::ManagerHandle manager(const std::string& clientName, radix::client::ManagerOptions options) override {
     return radix::client::makeConnectionManager(loop_, std::make_unique<InProcessConnector>(*this),
-                                                {.clientName = clientName}, queue());
+                                                {.clientName = clientName, .observes = options.observes}, queue());
   }
 
   std::shared_ptr<TaskQueue> queue() override { return {std::shared_ptr<void>(), &loop_}; }

@@ -21,7 +21,7 @@ class RawClient final : radix::LinkListener, radix::FrameHandler {
   }
 
   // Whether the link took it at once.
-  bool say(const radix::FrameBytes& frame) { return link_->send({&frame, 1}) == 1; }
+  bool say(const radix::FrameBytes& frame) { return link_->sendOne(frame); }
   bool sayBytes(std::vector<std::uint8_t> bytes) {
     return say(std::make_shared<const std::vector<std::uint8_t>>(std::move(bytes)));
   }
@@ -36,6 +36,7 @@ class RawClient final : radix::LinkListener, radix::FrameHandler {
   std::vector<radix::Reply> replies;
   std::vector<radix::Event> events;
   std::vector<radix::Ping> pings;
+  std::vector<radix::Sources> told;  // what feeds the service, as often as it was said
   std::uint64_t dropped = 0;
   int droppedFrames = 0;
   bool closed = false;
@@ -54,6 +55,7 @@ class RawClient final : radix::LinkListener, radix::FrameHandler {
     ++droppedFrames;
   }
   void onPing(radix::Ping ping) override { pings.push_back(ping); }
+  void onSources(radix::Sources sources) override { told.push_back(std::move(sources)); }
 
   std::unique_ptr<radix::Link> link_;
 };

@@ -25,6 +25,7 @@ class ScriptedSource final : public MetricSource {
     std::function<bool(std::int64_t metricId)> onQuery;
     std::function<void()> onStart;
     std::function<void(bool)> onListening;
+    std::optional<SourceIntake> intake;
 
     MetricSink* sink = nullptr;  // null before the start and after the end
     std::optional<SourceContext> context;
@@ -61,6 +62,7 @@ class ScriptedSource final : public MetricSource {
     script_->listening = listening;
     if (script_->onListening) script_->onListening(listening);
   }
+  std::optional<SourceIntake> intake() const override { return script_->intake; }
   bool query(std::int64_t metricId) override { return script_->onQuery && script_->onQuery(metricId); }
 
  private:

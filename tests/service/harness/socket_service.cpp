@@ -26,8 +26,8 @@ class SocketService final : public TestService {
   }
   ~SocketService() override { kill(); }
 
-  radix::client::ManagerHandle manager(const std::string& clientName) override {
-    auto made = radix::client::makeSocketManager(clientName, queue(), surroundings());
+  radix::client::ManagerHandle manager(const std::string& clientName, radix::client::ManagerOptions options) override {
+    auto made = radix::client::makeSocketManager(clientName, queue(), surroundings(), options);
     managers_.push_back(made);
     return made;
   }

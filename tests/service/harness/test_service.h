@@ -20,7 +20,8 @@ class TestService {
   virtual ~TestService() = default;
 
   // A new client of the service, whose handlers run on queue().
-  virtual radix::client::ManagerHandle manager(const std::string& clientName) = 0;
+  virtual radix::client::ManagerHandle manager(const std::string& clientName,
+                                               radix::client::ManagerOptions options = {}) = 0;
   virtual std::shared_ptr<TaskQueue> queue() = 0;
   // Lets everybody work until the condition holds; whether it came to that.
   virtual bool until(const std::function<bool()>& condition) = 0;
