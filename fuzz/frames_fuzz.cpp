@@ -47,9 +47,15 @@ class Echo final : public radix::FrameHandler {
     encoded = *radix::encode(reply);
   }
   void onDelivery(radix::Delivery delivery) override { encoded = *radix::encode(delivery); }
-  void onEvent(radix::Event event) override { encoded = *radix::encode(event); }
+  void onEvent(radix::Event event) override {
+    encoded = *radix::encode(event);
+    if (!event.age) return;
+    const radix::Trailer trailer = radix::ageTrailer(*event.age);
+    encoded->insert(encoded->end(), trailer.bytes.begin(), trailer.bytes.begin() + trailer.size);
+  }
   void onDropped(radix::Dropped dropped) override { encoded = *radix::encode(dropped); }
   void onPing(radix::Ping ping) override { encoded = *radix::encode(ping); }
+  void onSources(radix::Sources sources) override { encoded = *radix::encode(sources); }
 
   std::optional<Bytes> encoded;
 };
@@ -86,7 +92,7 @@ class Client final : radix::LinkListener, radix::FrameHandler {
   explicit Client(std::unique_ptr<radix::Link> link) : link_(std::move(link)) { link_->start(*this); }
   void say(Bytes bytes) {
     const radix::FrameBytes frame = std::make_shared<const Bytes>(std::move(bytes));
-    if (!closed_) link_->send({&frame, 1});
+    if (!closed_) link_->sendOne(frame);
   }
   std::size_t events() const { return events_; }
 
@@ -126,7 +132,7 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
   service.accept(std::move(goodEnds.second), {});
   service.accept(std::move(badEnds.second), {});
   Client good(std::move(goodEnds.first));
-  good.say(*radix::encode(radix::Hello{.name = "good"}));
+  good.say(*radix::encode(radix::Hello{.name = "good", .observes = true}));
   good.say(*radix::encode(radix::Delivery{true}));
   loop.run();
   Client bad(std::move(badEnds.first));

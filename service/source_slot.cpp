@@ -5,6 +5,7 @@
 #include <exception>
 #include <utility>
 
+#include "radix/frames.h"
 #include "radix/link.h"
 #include "service/payload_check.h"
 #include "values/plain_text.h"
@@ -129,6 +130,7 @@ void SourceSlot::emit(MetricRecord record) {
 
 void SourceSlot::conditionChanged(SourceCondition condition) {
   if (!failure_.empty()) return;
+  condition.reason.resize(beginningOf(condition.reason, radix::Sources::longestReason).size());
   if (condition.phase == SourceCondition::Phase::Failed) {
     log_.write(LogLevel::Error, origin_ + " has failed: " + condition.reason);
   }

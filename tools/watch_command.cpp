@@ -89,7 +89,8 @@ void addWatchCommand(CLI::App& program, Tool& tool) {
       ->type_name("N")
       ->check(CLI::PositiveNumber);
   command->footer(
-      "Begins with the last record of each metric. Waits for the service while there is none. Ends on Ctrl-C.\n"
+      "Begins with the last record of each metric; then every metric comes, at its source's own period or shorter\n"
+      "where a configuration asks. Waits for the service while there is none. Ends on Ctrl-C.\n"
       "\n"
       "With --json: {\"time\":milliseconds since "
       "1970,\"origin\":…,\"metric\":\"K_LTE_RRC_STATE\",\"id\":…,\"dict\":{…}}\n"

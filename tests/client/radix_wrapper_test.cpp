@@ -283,6 +283,51 @@ TEST_F(RadixWrapperTest, TheServiceStatusTellsTheConnectionAndTheLastRecord) {
   EXPECT_EQ(main_.monotonicTime() - status.lastRecord->receivedMonotonicTime, std::chrono::milliseconds(400));
 }
 
+TEST_F(RadixWrapperTest, TheServiceStatusKeepsTheLastRecordOfEachMetricWithAgeAndPeriod) {
+  const auto delegate = std::make_shared<NotedDelegate>();
+  wrapper_.setDelegate(delegate);
+  wrapper_.listen();
+  const auto send = [&](std::int64_t metric, const char* origin, std::int64_t age, std::int64_t period) {
+    manager_->send(
+        radix::kEventMetric,
+        {{"kKeyMetricID", metric}, {"kKeyOrigin", Value::text(origin)}, {"kKeyAge", age}, {"kKeyPeriod", period}});
+    main_.run();
+  };
+  send(1, "trace:a.csv", 180'000, 1000);
+  send(2, "modem", 0, 0);
+  send(1, "trace:b.csv", 5, 2000);
+  const ServiceStatus& status = wrapper_.serviceStatus();
+  ASSERT_EQ(status.lastRecords.size(), 2u);
+  EXPECT_EQ(status.lastRecords.at(1).origin, "trace:b.csv");
+  EXPECT_EQ(status.lastRecords.at(1).age, std::chrono::milliseconds(5));
+  EXPECT_EQ(status.lastRecords.at(1).period, std::chrono::milliseconds(2000));
+  EXPECT_EQ(status.lastRecords.at(2).metricId, 2);
+  EXPECT_EQ(status.lastRecords.at(2).period, std::chrono::milliseconds(0));
+  EXPECT_EQ(status.lastRecord->metricId, 1);
+  // An older service says neither; one that says what cannot be is cut.
+  manager_->send(radix::kEventMetric, {{"kKeyMetricID", std::int64_t{2}}});
+  main_.run();
+  EXPECT_EQ(wrapper_.serviceStatus().lastRecords.at(2).age, std::nullopt);
+  EXPECT_EQ(wrapper_.serviceStatus().lastRecords.at(2).period, std::nullopt);
+  send(2, "modem", INT64_MAX, INT64_MIN);
+  EXPECT_EQ(wrapper_.serviceStatus().lastRecords.at(2).age, radix::longestSpan);
+  EXPECT_EQ(wrapper_.serviceStatus().lastRecords.at(2).period, std::chrono::milliseconds(0));
+  // One that invents metrics does not fill the memory.
+  for (std::int64_t metric = 0; metric < 1000; ++metric) send(metric, "modem", 0, 0);
+  EXPECT_EQ(wrapper_.serviceStatus().lastRecords.size(), ServiceStatus::mostMetrics);
+  EXPECT_EQ(wrapper_.serviceStatus().lastRecord->metricId, 999);
+}
+
+TEST_F(RadixWrapperTest, WhatTheSourcesCanFillIsKnownWithoutACommand) {
+  using State = radix::client::SourceState;
+  EXPECT_EQ(wrapper_.fillableMetrics(), std::nullopt) << "the service does not say";
+  manager_->state.sources = {{.origin = "a", .phase = State::Phase::Running, .reason = "", .metrics = {1, 2}},
+                             {.origin = "b", .phase = State::Phase::Ended, .reason = "", .metrics = {2, 3}},
+                             {.origin = "c", .phase = State::Phase::Failed, .reason = "gone", .metrics = {9}}};
+  EXPECT_EQ(wrapper_.fillableMetrics(), (std::set<std::int64_t>{1, 2, 3}));
+  EXPECT_TRUE(manager_->calls.empty());
+}
+
 TEST_F(RadixWrapperTest, ATriggerIsNoRecordAndARecordNeedNotNameTimeOrOrigin) {
   const auto delegate = std::make_shared<NotedDelegate>();
   wrapper_.setDelegate(delegate);

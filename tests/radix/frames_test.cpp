@@ -7,12 +7,16 @@
 #include <string>
 #include <vector>
 
+#include "messages/runtime/data_writer.h"
+#include "radix/frame_tables.h"
+
 namespace radix {
 namespace {
 
 using probeview::Dictionary;
 using probeview::List;
 using probeview::Value;
+using std::chrono::milliseconds;
 using Bytes = std::vector<std::uint8_t>;
 
 // Writes down what it is told.
@@ -38,9 +42,15 @@ class Recorder final : public FrameHandler {
   void onDropped(Dropped dropped) override { said = "dropped " + std::to_string(dropped.count); }
   void onPing(Ping ping) override { said = "ping " + std::to_string(ping.number) + (ping.isAnswer ? " answer" : ""); }
 
+  void onSources(Sources all) override {
+    said = "sources " + std::to_string(all.states.size());
+    sources = std::move(all);
+  }
+
   std::string said;
   Bytes bytes;
   Event event;
+  Sources sources;
 };
 
 template <typename Frame>
@@ -91,6 +101,75 @@ TEST(Frames, AnEventKeepsEveryNumberIncludingNegativeOnes) {
   EXPECT_EQ(got.triggerId, 0x7F0013);
   EXPECT_EQ(got.triggerRef, 9999);
   EXPECT_EQ(got.triggerType, -7);
+}
+
+TEST(Frames, AnEventTellsItsPeriodAndBehindItsBytesItsAge) {
+  EXPECT_EQ(roundTrip(Event{}).event.period, std::nullopt);
+  EXPECT_EQ(roundTrip(Event{}).event.age, std::nullopt);
+  EXPECT_EQ(roundTrip(Event{.period = milliseconds(0)}).event.period, milliseconds(0));
+  EXPECT_EQ(roundTrip(Event{.period = milliseconds(1500)}).event.period, milliseconds(1500));
+  const auto aged = [](std::chrono::nanoseconds age) {
+    Bytes bytes = *encode(Event{.metricId = 5});
+    const Trailer trailer = ageTrailer(age);
+    bytes.insert(bytes.end(), trailer.bytes.begin(), trailer.bytes.begin() + trailer.size);
+    Recorder recorder;
+    EXPECT_TRUE(decodeFrame(bytes, recorder));
+    EXPECT_EQ(recorder.event.metricId, 5);
+    return recorder.event.age;
+  };
+  EXPECT_EQ(aged(std::chrono::nanoseconds(0)), milliseconds(0));
+  EXPECT_EQ(aged(std::chrono::nanoseconds(-5)), milliseconds(0));
+  EXPECT_EQ(aged(std::chrono::nanoseconds(999'999)), milliseconds(0));
+  EXPECT_EQ(aged(milliseconds(127)), milliseconds(127));
+  EXPECT_EQ(aged(milliseconds(128)), milliseconds(128));
+  EXPECT_EQ(aged(std::chrono::minutes(3)), milliseconds(180'000));
+  EXPECT_EQ(aged(std::chrono::nanoseconds(INT64_MAX)), longestSpan);
+}
+
+TEST(Frames, SourcesKeepWhatIsSaidOfThem) {
+  using State = client::SourceState;
+  const std::vector<State> sent{
+      {.origin = "scenario:city", .phase = State::Phase::Running, .reason = "", .metrics = {0x3C4E04, -1}},
+      {.origin = "trace:x.csv", .phase = State::Phase::Ended, .reason = "", .metrics = {}},
+      {.origin = "modem", .phase = State::Phase::Failed, .reason = "gone; plug it in", .metrics = {7}}};
+  EXPECT_EQ(roundTrip(Sources{sent}).sources.states, sent);
+  Recorder none = roundTrip(Sources{});
+  EXPECT_EQ(none.said, "sources 0");
+}
+
+TEST(Frames, HoweverMuchIsSaidOfTheSourcesItFitsIntoAFrame) {
+  client::SourceState state{.origin = std::string(100'000, 'o'),
+                            .phase = client::SourceState::Phase::Failed,
+                            .reason = std::string(100'000, 'r'),
+                            .metrics = std::vector<std::int64_t>(100'000, -1)};
+  const Sources many{std::vector<client::SourceState>(40, state)};
+  EXPECT_LE(encode(many)->size(), longestFrame);
+  const auto got = roundTrip(many).sources.states;
+  ASSERT_FALSE(got.empty());
+  EXPECT_LE(got.size(), Sources::most);
+  EXPECT_EQ(got[0].origin, std::string(Sources::longestOrigin, 'o'));
+  EXPECT_EQ(got[0].reason, std::string(Sources::longestReason, 'r'));
+  EXPECT_EQ(got[0].metrics.size(), Sources::mostMetrics);
+  // A peer that keeps to nothing of this is cut by whoever hears it.
+  auto content = probeview::Shared<wire::SourcesFrame>::make();
+  for (std::size_t count = 0; count < 100; ++count) {
+    wire::SourceFrame& source = content->addSource();
+    source.setOrigin(std::string(1200, 'o'));
+    source.setPhase(77);
+    if (count == 0) {
+      for (int metric = 0; metric < 1000; ++metric) source.addMetric().setIdentifier(5);
+    }
+  }
+  wire::Frame frame;
+  frame.setSources(std::move(content));
+  probeview::PBDataWriter writer;
+  frame.writeTo(writer);
+  Recorder recorder;
+  ASSERT_TRUE(decodeFrame(writer.takeBytes(), recorder));
+  ASSERT_EQ(recorder.sources.states.size(), Sources::most);
+  EXPECT_EQ(recorder.sources.states[0].origin.size(), Sources::longestOrigin);
+  EXPECT_EQ(recorder.sources.states[0].metrics.size(), Sources::mostMetrics);
+  EXPECT_EQ(recorder.sources.states[0].phase, client::SourceState::Phase::Running) << "of a later version";
 }
 
 TEST(Frames, AnEmptyPayloadIsAPayload) { EXPECT_TRUE(roundTrip(Event{}).event.payload.empty()); }

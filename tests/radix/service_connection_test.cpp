@@ -412,19 +412,61 @@ TEST_F(ServiceConnectionTest, ATriggerEventReachesItsHandlerWithItsKeysAndGroup)
   EXPECT_EQ(group, 6);
 }
 
-TEST_F(ServiceConnectionTest, EventsThatAreStillOnTheirWayAfterEventsOffAreNotHandedOver) {
-  int events = 0;
-  RegisterEventHandler(manager_, kEventMetric, [&](const ObjectHandle&, Group) { ++events; });
+TEST_F(ServiceConnectionTest, EventsThatAreStillOnTheirWayAfterEventsOffWaitForTheNextEventsOn) {
+  std::vector<std::int64_t> metrics;
+  RegisterEventHandler(manager_, kEventMetric, [&](const ObjectHandle& event, Group) {
+    metrics.push_back(nativeDictionary(*event).find(kKeyMetricID)->int64().value());
+  });
   EventsOn(manager_);
   loop_.run();
   current().say(Event{.metricId = 1});
   EventsOff(manager_);
   loop_.run();
-  EXPECT_EQ(events, 0);
+  EXPECT_THAT(metrics, IsEmpty());
+  // The service sends each record once: what is thrown away here never comes again.
   EventsOn(manager_);
+  current().say(Event{.metricId = 2});
+  loop_.run();
+  EXPECT_THAT(metrics, ElementsAre(1, 2));
+}
+
+TEST_F(ServiceConnectionTest, AHandlerMaySwitchEventsOffAndOnInTheMiddleOfABatchAndLosesNothing) {
+  std::vector<std::int64_t> metrics;
+  RegisterEventHandler(manager_, kEventMetric, [&](const ObjectHandle& event, Group) {
+    metrics.push_back(nativeDictionary(*event).find(kKeyMetricID)->int64().value());
+    if (metrics.size() == 2) EventsOff(manager_);
+  });
+  EventsOn(manager_);
+  loop_.run();
+  for (std::int64_t metric = 1; metric <= 4; ++metric) current().say(Event{.metricId = metric});
+  loop_.run();
+  EXPECT_THAT(metrics, ElementsAre(1, 2));
+  EventsOn(manager_);
+  loop_.run();
+  EXPECT_THAT(metrics, ElementsAre(1, 2, 3, 4));
+}
+
+TEST_F(ServiceConnectionTest, AnOlderServiceTellsNeitherAgesNorPeriodsNorSources) {
+  restart({.clientName = "client", .observes = true});
+  Dictionary got;
+  RegisterEventHandler(manager_, kEventMetric,
+                       [&](const ObjectHandle& event, Group) { got = nativeDictionary(*event); });
+  EventsOn(manager_);
+  loop_.run();
+  EXPECT_TRUE(current().hellos.at(0).observes);
   current().say(Event{.metricId = 1});
   loop_.run();
-  EXPECT_EQ(events, 1);
+  EXPECT_TRUE(got.contains(kKeyMetricID));
+  EXPECT_FALSE(got.contains(kKeyAge));
+  EXPECT_FALSE(got.contains(kKeyPeriod));
+  EXPECT_FALSE(Connection(manager_).sources.has_value());
+  // A later one does, and what it says beyond all measure is cut.
+  std::vector<std::uint8_t> bytes = *encode(Event{.metricId = 1, .period = milliseconds(INT64_MAX)});
+  bytes.insert(bytes.end(), {0x48, 0xFF, 0xFF, 0xFF, 0xFF, 0xFF, 0xFF, 0xFF, 0xFF, 0xFF, 0x01});
+  current().sayBytes(bytes);
+  loop_.run();
+  EXPECT_EQ(got.find(kKeyAge)->int64(), longestSpan.count());
+  EXPECT_EQ(got.find(kKeyPeriod)->int64(), longestSpan.count());
 }
 
 TEST_F(ServiceConnectionTest, AHandlerMayRegisterAnotherInItsOwnPlace) {

@@ -338,6 +338,7 @@ class StuckLink final : public radix::Link {
     radix::LinkListener* listener = nullptr;
     std::size_t room = 0;
     std::size_t sent = 0;
+    std::vector<std::vector<std::uint8_t>> frames{};
     bool reading = true;
   };
   explicit StuckLink(Shared& shared) : shared_(shared) {}
@@ -346,6 +347,10 @@ class StuckLink final : public radix::Link {
     const std::size_t taken = std::min(frames.size(), shared_.room);
     shared_.room -= taken;
     shared_.sent += taken;
+    for (const radix::OutgoingFrame& one : frames.first(taken)) {
+      auto& bytes = shared_.frames.emplace_back(*one.frame);
+      bytes.insert(bytes.end(), one.trailer.bytes.begin(), one.trailer.bytes.begin() + one.trailer.size);
+    }
     return taken;
   }
   void setReading(bool reading) override { shared_.reading = reading; }
@@ -356,11 +361,12 @@ class StuckLink final : public radix::Link {
 
 TEST_F(Faults, SixtyFourRepliesMayBeLeftUnreadAndAfterOneMoreTheClientIsNotListenedToUntilItReads) {
   StuckLink::Shared link;
-  link.room = 1;
+  // The greeting, and what feeds the service.
+  link.room = 2;
   service_.accept(std::make_unique<StuckLink>(link), {});
   link.listener->onFrame(*radix::encode(radix::Hello{.name = "stuck"}));
   loop_.run();
-  EXPECT_EQ(link.sent, 1U);
+  EXPECT_EQ(link.sent, 2U);
   for (std::uint64_t number = 0; number < 64; ++number) {
     link.listener->onFrame(*radix::encode(radix::Ping{.number = number}));
   }
@@ -375,7 +381,141 @@ TEST_F(Faults, SixtyFourRepliesMayBeLeftUnreadAndAfterOneMoreTheClientIsNotListe
   link.room = 1;
   link.listener->onWritable();
   EXPECT_TRUE(link.reading);
-  EXPECT_EQ(link.sent, 66U);
+  EXPECT_EQ(link.sent, 67U);
+}
+
+// What a frame says, to be looked at.
+class Heard final : public radix::FrameHandler {
+ public:
+  explicit Heard(const std::vector<std::vector<std::uint8_t>>& frames) {
+    for (const auto& frame : frames) EXPECT_TRUE(radix::decodeFrame(frame, *this));
+  }
+  void onEvent(radix::Event event) override { events.push_back(std::move(event)); }
+  void onReply(radix::Reply reply) override { replies.push_back(std::move(reply)); }
+  void onSources(radix::Sources sources) override { told.push_back(std::move(sources)); }
+  void onDropped(radix::Dropped one) override { dropped += one.count; }
+  std::vector<radix::Event> events;
+  std::vector<radix::Reply> replies;
+  std::vector<radix::Sources> told;
+  std::uint64_t dropped = 0;
+};
+
+TEST_F(Faults, WhatWaitsForAClientThatClearsItsConfigurationIsTakenBackAndALaterPushBringsIt) {
+  script_->metrics = {K_LTE_RRC_STATE, K_LTE_TX_POWER};
+  script_->onQuery = [this](std::int64_t metric) {
+    script_->emit(metric, {}, milliseconds(3));
+    return true;
+  };
+  StuckLink::Shared link;
+  link.room = 2;
+  service_.accept(std::make_unique<StuckLink>(link), {});
+  const auto say = [&](const auto& sentence) { link.listener->onFrame(*radix::encode(sentence)); };
+  say(radix::Hello{.name = "stuck"});
+  say(radix::Delivery{true});
+  say(push("[metrics]\nK_LTE_RRC_STATE = 1000\n"));
+  loop_.advance(milliseconds(1));
+  script_->emit(K_LTE_RRC_STATE, {0x10, 1}, milliseconds(1));
+  script_->emit(K_LTE_RRC_STATE, {0x10, 1}, milliseconds(2));
+  say(radix::Command{.sequence = 2,
+                     .name = radix::kCommandQueryMetric,
+                     .arguments = radix::encodeDictionary({{radix::kKeyMetricID, K_LTE_RRC_STATE}})});
+  say(radix::Command{.sequence = 3, .name = radix::kCommandClearConfiguration, .arguments = {}});
+  link.room = 100;
+  link.listener->onWritable();
+  loop_.advance(milliseconds(1));
+  Heard heard(link.frames);
+  ASSERT_EQ(heard.replies.size(), 3U);
+  ASSERT_EQ(heard.events.size(), 1U) << "the answer to its question is its own";
+  EXPECT_EQ(heard.events[0].time, 3);
+  EXPECT_EQ(heard.dropped, 0U) << "nobody was too slow";
+  // Of the other metric nothing has left.
+  link.room = 0;
+  say(push("[metrics]\nK_LTE_TX_POWER = 1000\n"));
+  script_->emit(K_LTE_TX_POWER, {}, milliseconds(4));
+  loop_.advance(milliseconds(1));
+  say(radix::Command{.sequence = 5, .name = radix::kCommandClearConfiguration, .arguments = {}});
+  say(push("[metrics]\nK_LTE_TX_POWER = 1000\nK_LTE_RRC_STATE = 1000\n"));
+  link.room = 100;
+  link.listener->onWritable();
+  loop_.advance(milliseconds(1));
+  heard = Heard(link.frames);
+  ASSERT_EQ(heard.events.size(), 2U);
+  EXPECT_EQ(heard.events[1].time, 4);
+}
+
+TEST_F(Faults, ARecordTellsHowOldItWasWhenItLeftWhateverTheTimeOfDay) {
+  script_->sink->emit({.metricId = K_LTE_RRC_STATE,
+                       .payload = {0x10, 1},
+                       .time = loop_.wallTime(),
+                       .origin = {},
+                       .period = seconds(1),
+                       .age = seconds(5)});
+  loop_.advance(minutes(3));
+  loop_.setWallTime(loop_.wallTime() - hours(1000));
+  const auto client = greeted();
+  client->say(radix::Delivery{true});
+  loop_.advance(milliseconds(1));
+  ASSERT_EQ(client->events.size(), 1U);
+  EXPECT_EQ(client->events[0].age, milliseconds(185'000));
+  EXPECT_EQ(client->events[0].period, seconds(1));
+  emit();
+  loop_.advance(milliseconds(1));
+  ASSERT_EQ(client->events.size(), 2U);
+  EXPECT_EQ(client->events[1].age, milliseconds(0));
+  EXPECT_EQ(client->events[1].period, milliseconds(0)) << "on change";
+}
+
+TEST_F(Faults, ARecordThatWaitsForASlowClientGrowsOlderUntilItLeaves) {
+  StuckLink::Shared link;
+  link.room = 2;
+  service_.accept(std::make_unique<StuckLink>(link), {});
+  link.listener->onFrame(*radix::encode(radix::Hello{.name = "slow", .observes = true}));
+  link.listener->onFrame(*radix::encode(radix::Delivery{true}));
+  loop_.advance(milliseconds(1));
+  emit();
+  loop_.advance(seconds(7));
+  link.room = 1;
+  link.listener->onWritable();
+  const Heard heard(link.frames);
+  ASSERT_EQ(heard.events.size(), 1U);
+  EXPECT_EQ(heard.events[0].age, milliseconds(7000));
+}
+
+TEST_F(Faults, OfAllChangesOfTheSourcesASlowClientIsToldTheLastAlone) {
+  StuckLink::Shared link;
+  link.room = 2;
+  service_.accept(std::make_unique<StuckLink>(link), {});
+  link.listener->onFrame(*radix::encode(radix::Hello{.name = "slow"}));
+  loop_.advance(milliseconds(1));
+  using Phase = SourceCondition::Phase;
+  for (int turn = 0; turn < 500; ++turn) {
+    script_->sink->conditionChanged({.phase = turn % 2 == 0 ? Phase::Ended : Phase::Running, .reason = {}});
+    script_->sink->conditionChanged({.phase = Phase::Failed, .reason = std::string(100'000, 'x')});
+    loop_.run();
+  }
+  link.room = 100;
+  link.listener->onWritable();
+  const Heard heard(link.frames);
+  EXPECT_LE(heard.told.size(), 3U);
+  ASSERT_FALSE(heard.told.empty());
+  EXPECT_EQ(heard.told.back().states.at(0).phase, Phase::Failed);
+  EXPECT_EQ(heard.told.back().states.at(0).reason, std::string(512, 'x'));
+}
+
+TEST_F(Faults, AnAnswerThatComesAfterHalfAMinuteIsNone) {
+  script_->onQuery = [](std::int64_t) { return true; };
+  for (const auto late : {milliseconds(0), milliseconds(1)}) {
+    const auto client = greeted("asks", false);
+    client->say(radix::Delivery{true});
+    client->say(radix::Command{.sequence = 1,
+                               .name = radix::kCommandQueryMetric,
+                               .arguments = radix::encodeDictionary({{radix::kKeyMetricID, K_LTE_RRC_STATE}})});
+    loop_.run();
+    loop_.advance(seconds(30) + late);
+    emit();
+    loop_.advance(milliseconds(1));
+    EXPECT_EQ(client->events.size(), late.count() == 0 ? 1U : 0U);
+  }
 }
 
 TEST(HangingSource, HoldsUpTheServiceForAsLongAsItHangsAndEverybodyIsToldAfterTwoSeconds) {

@@ -144,6 +144,28 @@ TEST_P(HostileClients, FramesAndFieldsOfALaterVersionAreIgnored) {
   expectOthersServed();
 }
 
+// A greeting as clients send that know nothing of observing: 0A (hello) 09, 08 01 (version) 10 01 (oldest version)
+// 1A 03 (name) "old".
+const std::vector<std::uint8_t> greetingOfAnOlderClient{0x0A, 9, 0x08, 1, 0x10, 1, 0x1A, 3, 'o', 'l', 'd'};
+
+TEST_P(HostileClients, AnOlderClientThatCannotSayThatItObservesGetsNothingBeforeItPushes) {
+  world_->emit(K_LTE_TX_POWER, {});
+  const auto client = connect();
+  client->sayBytes(greetingOfAnOlderClient);
+  client->say(radix::Delivery{true});
+  client->say(radix::Ping{.number = 1});
+  ASSERT_TRUE(world_->until([&] { return client->pings.size() == 1; }));
+  world_->settle();
+  EXPECT_TRUE(client->events.empty());
+  const std::string text = "[metrics]\nK_LTE_TX_POWER = 1000\n";
+  client->say(radix::Command{
+      .sequence = 1,
+      .name = radix::kCommandAddConfiguration,
+      .arguments = radix::encodeDictionary(
+          {{radix::kKeyPayload, Value::bytes({reinterpret_cast<const std::uint8_t*>(text.data()), text.size()})}})});
+  EXPECT_TRUE(world_->until([&] { return client->events.size() == 1; }));
+}
+
 TEST_P(HostileClients, APingIsAnsweredWithItsNumber) {
   const auto client = greeted();
   client->say(radix::Ping{.number = 77});
@@ -237,7 +259,7 @@ TEST_P(HostileClients, FiftyClientsThatConnectAtOnceAreAllServed) {
   std::vector<std::unique_ptr<RawClient>> crowd;
   for (int number = 0; number < 50; ++number) crowd.push_back(connect());
   for (const auto& client : crowd) {
-    client->say(radix::Hello{.name = "crowd"});
+    client->say(radix::Hello{.name = "crowd", .observes = true});
     client->say(radix::Delivery{true});
     client->say(radix::Ping{.number = 1});
   }

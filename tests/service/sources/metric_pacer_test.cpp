@@ -19,8 +19,12 @@ constexpr std::int64_t otherMetric = 0x3C40C2;
 // Keeps the first byte of each payload, which the tests use as the value.
 class Sink final : public MetricSink {
  public:
-  void emit(MetricRecord record) override { values.push_back(record.payload.at(0)); }
+  void emit(MetricRecord record) override {
+    values.push_back(record.payload.at(0));
+    last = std::move(record);
+  }
   std::vector<int> values;
+  MetricRecord last;
 };
 
 class MetricPacerTest : public ::testing::Test {
@@ -76,6 +80,61 @@ TEST_F(MetricPacerTest, APeriodPassesTheFirstAtOnceAndThenTheLatestOfEachPeriod)
   EXPECT_THAT(sink.values, ElementsAre(1, 4)) << "nothing new, nothing to pass";
   offer(5);
   EXPECT_THAT(sink.values, ElementsAre(1, 4, 5));
+}
+
+TEST_F(MetricPacerTest, WhileSomebodyObservesEverythingPassesAtOnceAlsoWhatThePlanDoesNotName) {
+  MetricPlan plan{.metrics = {{metric, milliseconds(1000)}}, .observed = true};
+  pacer.setPlan(plan);
+  offer(1);
+  offer(2);
+  offer(3, otherMetric);
+  EXPECT_THAT(sink.values, ElementsAre(1, 2, 3));
+  plan.observed = false;
+  pacer.setPlan(plan);
+  offer(4);
+  offer(5, otherMetric);
+  EXPECT_THAT(sink.values, ElementsAre(1, 2, 3));
+}
+
+TEST_F(MetricPacerTest, ARecordTellsThePeriodAsPlannedAndNoneWhereItComesOnChangeOrWasAskedFor) {
+  const auto offerEvery = [&](milliseconds own, std::int64_t id = metric) {
+    pacer.offer({.metricId = id, .payload = {1}, .time = {}, .origin = "test", .period = own});
+  };
+  const auto passed = [&] { return sink.last.period; };
+  offerEvery(milliseconds(1000));
+  EXPECT_EQ(passed(), milliseconds(1000));
+  planPeriod(milliseconds(3000));
+  loop.advance(milliseconds(3000));
+  offerEvery(milliseconds(1000));
+  EXPECT_EQ(passed(), milliseconds(3000));
+  planPeriod(milliseconds(10));
+  loop.advance(milliseconds(10));
+  offerEvery(milliseconds(1000));
+  EXPECT_EQ(passed(), milliseconds(1000)) << "it comes no oftener than the source has it";
+  planPeriod(std::nullopt);
+  offerEvery(milliseconds(1000));
+  EXPECT_EQ(passed(), milliseconds(1000));
+  planPeriod(milliseconds(5000));
+  loop.advance(milliseconds(5000));
+  offerEvery(milliseconds(0));
+  EXPECT_EQ(passed(), milliseconds(0)) << "it comes on change";
+  offerEvery(milliseconds(1000), otherMetric);
+  EXPECT_TRUE(pacer.resend(otherMetric));
+  EXPECT_EQ(passed(), milliseconds(0)) << "nobody wants it again and again";
+}
+
+TEST_F(MetricPacerTest, WhatWaitedOrIsPassedAgainIsAsOldAsItIs) {
+  planPeriod(milliseconds(1000));
+  offer(1);
+  EXPECT_EQ(sink.last.age, milliseconds(0));
+  loop.advance(milliseconds(400));
+  offer(2);
+  loop.advance(milliseconds(601));
+  ASSERT_THAT(sink.values, ElementsAre(1, 2));
+  EXPECT_EQ(sink.last.age, milliseconds(601));
+  loop.advance(std::chrono::minutes(3));
+  EXPECT_TRUE(pacer.resend(metric));
+  EXPECT_EQ(sink.last.age, milliseconds(180'601));
 }
 
 TEST_F(MetricPacerTest, AShorterPeriodHoldsAtOnce) {

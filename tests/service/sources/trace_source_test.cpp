@@ -25,7 +25,9 @@ using ::testing::SizeIs;
 class Sink final : public MetricSink {
  public:
   void emit(MetricRecord record) override { records.push_back(std::move(record)); }
+  void conditionChanged(SourceCondition condition) override { phases.push_back(condition.phase); }
   std::vector<MetricRecord> records;
+  std::vector<SourceCondition::Phase> phases;
 };
 
 class Lines final : public LineSink {
@@ -174,6 +176,44 @@ TEST_F(TraceSourceTest, ItsEndIsToldOnceAndWhatWasLastKnownCanStillBeAskedFor) {
   ASSERT_THAT(sink.records, SizeIs(3));
   EXPECT_EQ(sink.records[2].payload, sink.records[1].payload);
   EXPECT_EQ(sink.records[2].time, sink.records[1].time);
+}
+
+TEST_F(TraceSourceTest, ATraceThatWasPlayedHasEndedAndOneThatLoopsNever) {
+  const std::string rows = measurement("12.00.00", -90) + measurement("12.00.01", -91);
+  start(rows);
+  listen();
+  EXPECT_THAT(sink.phases, IsEmpty());
+  loop.advance(seconds(1));
+  EXPECT_THAT(sink.phases, ElementsAre(SourceCondition::Phase::Ended));
+  EXPECT_THAT(sink.records, SizeIs(2));
+  loop.advance(std::chrono::minutes(2));
+  EXPECT_TRUE(source->query(K_LTE_RSRP_RSRQ_SINR));
+  EXPECT_EQ(sink.records.back().age, std::chrono::minutes(2)) << "what was last known does not grow young";
+  sink.phases.clear();
+  start(rows, ",loop");
+  listen();
+  loop.advance(std::chrono::minutes(2));
+  EXPECT_THAT(sink.phases, IsEmpty());
+}
+
+TEST_F(TraceSourceTest, MeasurementsComeAtTheRowsPaceAndStatesAndCellsOnChange) {
+  const std::vector<std::pair<std::string, int>> paces{{"", 1000}, {",speed=0.1", 10'000}, {",speed=100000", 1}};
+  for (const auto& [options, period] : paces) {
+    sink.records.clear();
+    start(TraceLine{.level = "-90", .state = "D", .area = "1A2B", .cell = "25601"}.text(), options);
+    listen();
+    for (const MetricRecord& record : sink.records) {
+      EXPECT_EQ(record.period.count(), record.metricId == K_LTE_RSRP_RSRQ_SINR ? period : 0) << record.metricId;
+    }
+    EXPECT_THAT(sink.records, SizeIs(3));
+  }
+}
+
+TEST_F(TraceSourceTest, TellsHowManyRowsItHasReadAndSkipped) {
+  start(measurement("12.00.00", -90) + "x\n" + measurement("12.00.01", -91) + "y\n" + "z\n");
+  ASSERT_TRUE(source->intake());
+  EXPECT_EQ(source->intake()->rowsRead, 2U);
+  EXPECT_EQ(source->intake()->rowsSkipped, 3U);
 }
 
 TEST_F(TraceSourceTest, AQueryForWhatIsNotKnownIsRefused) {
