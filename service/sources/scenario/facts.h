@@ -56,7 +56,9 @@ class Facts {
   struct Entry {
     Milliseconds learnt = -1;    // -1: never yet
     std::uint32_t revision = 0;  // moves on each time that the fact is learnt anew
-    bool holds = false;          // whether it is still so; false once the phone has left the technology
+    bool holds = false;          // whether it is still so
+    bool left = false;           // it is not, because the phone has left the technology
+    bool lastWord = false;       // it was learnt as the technology was left, and is to be told all the same
   };
 
   void learn(Fact fact, Milliseconds now) {
@@ -64,8 +66,21 @@ class Facts {
     entry.learnt = now;
     ++entry.revision;
     entry.holds = true;
+    entry.left = entry.lastWord = false;
   }
   void end(Fact fact) { entries_[static_cast<std::size_t>(fact)].holds = false; }
+  // The phone has left the technology. A state that has changed with that is told, a measurement that waits is not.
+  void leave(Fact fact) {
+    Entry& entry = entries_[static_cast<std::size_t>(fact)];
+    entry.holds = false;
+    entry.left = true;
+  }
+  // ... but this measurement is told: it says that the phone has left.
+  void leaveWithLastWord(Fact fact, Milliseconds now) {
+    learn(fact, now);
+    leave(fact);
+    entries_[static_cast<std::size_t>(fact)].lastWord = true;
+  }
   const Entry& operator[](Fact fact) const { return entries_[static_cast<std::size_t>(fact)]; }
 
  private:

@@ -21,6 +21,7 @@ void GsmModem::change(GsmConnection to, const Circumstances& c) {
     state_.transmitPowers.clear();
     powerStep_ = 0;
     measure(c);
+    c.facts.end(Fact::kGsmIdleMeasurement);
   } else {
     c.facts.end(Fact::kGsmDedicatedMeasurement);
   }
@@ -46,10 +47,10 @@ void GsmModem::enter(CellIndex cell, Manner manner, const Circumstances& c) {
 }
 
 void GsmModem::leave(const Circumstances& c) {
-  state_.connection = GsmConnection::kInactive;
+  change(GsmConnection::kInactive, c);
   for (const Fact fact : {Fact::kGsmServingCell, Fact::kGsmIdleConfiguration, Fact::kGsmIdleMeasurement,
                           Fact::kGsmDedicatedMeasurement, Fact::kGsmNeighbours, Fact::kGsmPacketConfiguration}) {
-    c.facts.end(fact);
+    c.facts.leave(fact);
   }
 }
 

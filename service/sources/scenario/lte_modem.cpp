@@ -26,6 +26,7 @@ void LteModem::change(LteConnection to, LteCause cause, const Circumstances& c) 
   state_.since = c.now;
   state_.cause = cause;
   c.facts.learn(Fact::kLteConnection, c.now);
+  c.facts.learn(Fact::kLteDrx, c.now);  // it names the state
 }
 
 void LteModem::serve(CellIndex cell, const Circumstances& c) {
@@ -37,6 +38,13 @@ void LteModem::serve(CellIndex cell, const Circumstances& c) {
   reselection_.clear();
   handover_.clear();
   outbound_.clear();
+  // What was a secondary carrier is the primary one now.
+  const CarrierIndex carrier = network_.cells[cell].carrier;
+  if (std::erase_if(state_.secondaries, [&](const SecondaryCarrier& secondary) {
+        return network_.cells[secondary.cell].carrier == carrier;
+      }) > 0) {
+    c.facts.learn(Fact::kLteAggregation, c.now);
+  }
   c.facts.end(Fact::kLteSamples);  // those of the cell before
   c.facts.learn(Fact::kLteServingCell, c.now);
   c.facts.learn(Fact::kLteSelection, c.now);
@@ -46,7 +54,7 @@ void LteModem::serve(CellIndex cell, const Circumstances& c) {
 
 void LteModem::enter(CellIndex cell, Manner manner, const Circumstances& c) {
   state_.samples.clear();
-  state_.secondaries.clear();
+  forgetDeconfigured(c);
   if (manner == Manner::kHandover) {
     change(LteConnection::kAttemptingInboundMobility, LteCause::kNotApplicable, c);
     deadline_ = c.now + 120;
@@ -66,7 +74,7 @@ void LteModem::leave(LteCause cause, const Circumstances& c) {
   for (const Fact fact : {Fact::kLteServingCell, Fact::kLteSamples, Fact::kLteConnection, Fact::kLteDrx,
                           Fact::kLteTransmitPower, Fact::kLteComponentCarriers, Fact::kLteSelection,
                           Fact::kLteNeighbours, Fact::kLteInterRatNeighbours, Fact::kLteAggregation}) {
-    c.facts.end(fact);
+    c.facts.leave(fact);
   }
 }
 
@@ -79,6 +87,7 @@ void LteModem::measure(const Circumstances& c) {
   c.facts.learn(Fact::kLteNeighbours, c.now);
   c.facts.learn(Fact::kLteInterRatNeighbours, c.now);
   for (SecondaryCarrier& carrier : state_.secondaries) {
+    if (carrier.state == SecondaryState::kDeconfigured) continue;
     carrier.rsrp = c.surroundings.strength(carrier.cell);
     carrier.rsrq = c.surroundings.quality(carrier.cell);
     carrier.sinr = c.surroundings.interferenceRatio(carrier.cell);
@@ -171,8 +180,7 @@ void LteModem::becomeConnected(LteCause cause, const Circumstances& c) {
   t310Ends_ = -1;
   reestablishing_ = false;
   state_.transmissionMode = state_.sinr > 8 ? 4 : state_.sinr > 0 ? 3 : 2;  // 3GPP TS 36.213, 7.1
-  state_.drxConfigured = true;
-  c.facts.learn(Fact::kLteDrx, c.now);
+  forgetDeconfigured(c);
   c.facts.learn(Fact::kLteAggregation, c.now);
   control(c);
 }
@@ -286,7 +294,6 @@ std::optional<Departure> LteModem::advanceConnected(const Circumstances& c) {
       beginReestablishment(LteCause::kReestablishHandoverFailure, c);
       return std::nullopt;
     }
-    endAggregation(c);
     serve(target, c);
     c.facts.learn(Fact::kLteDrx, c.now);  // the new cell configures it anew
     return std::nullopt;
@@ -298,8 +305,6 @@ std::optional<Departure> LteModem::advanceConnected(const Circumstances& c) {
     if (reestablishing_) return std::nullopt;
     if (!c.demand.signalling && c.now - lastActivity_ >= kInactivity) {
       endAggregation(c);
-      state_.drxConfigured = false;
-      c.facts.learn(Fact::kLteDrx, c.now);
       c.facts.end(Fact::kLteTransmitPower);
       change(LteConnection::kEnding, c.random.chance(0.04) ? LteCause::kReleaseLoadBalancing : LteCause::kReleaseOther,
              c);
@@ -317,6 +322,7 @@ std::optional<Departure> LteModem::advanceConnected(const Circumstances& c) {
       }
     }
     if (const auto target = handoverCandidate(c); handover_.holds(target, c.now, LteMobility::kTimeToTrigger)) {
+      endAggregation(c);  // by the very command, while the primary cell is still the old one
       executing_ = target;
       executesAt_ = c.now + kHandoverPreparation;
       return std::nullopt;
@@ -327,7 +333,10 @@ std::optional<Departure> LteModem::advanceConnected(const Circumstances& c) {
       const bool handover = c.demand.voice;
       leaving_ = Departure{*target, handover ? Manner::kHandover : Manner::kRedirection};
       executesAt_ = c.now + (handover ? 160 : kHandoverPreparation);
-      if (handover) change(LteConnection::kAttemptingOutboundMobility, LteCause::kNotApplicable, c);
+      if (handover) {
+        endAggregation(c);
+        change(LteConnection::kAttemptingOutboundMobility, LteCause::kNotApplicable, c);
+      }
       return std::nullopt;
     }
     aggregate(c);
@@ -375,63 +384,9 @@ void LteModem::advanceReestablishment(const Circumstances& c) {
   }
   if (c.now < deadline_) return;
   reestablishing_ = false;
-  state_.drxConfigured = false;
   change(LteConnection::kIdle, LteCause::kReleaseT311Expired, c);
   // The search has been made already; the next look decides where to go.
   cellFailingSince_ = c.now - 1200;
-}
-
-// A download gets the co-located cells of the other carriers as secondary ones, which are put to sleep when it ends.
-void LteModem::aggregate(const Circumstances& c) {
-  constexpr std::size_t kMostSecondaries = 2;
-  const Cell& primary = network_.cells[*state_.serving];
-  auto& secondaries = state_.secondaries;
-  bool changed = false;
-  if (c.demand.download) {
-    if (downloadSince_ < 0) downloadSince_ = c.now;
-    const bool configured = !secondaries.empty() && secondaries.front().state != SecondaryState::kDeconfigured;
-    if (!configured) {
-      secondaries.clear();
-      for (const CellIndex cell : c.surroundings.heard(Technology::kLte)) {
-        const Cell& other = network_.cells[cell];
-        if (other.site != primary.site || other.carrier == primary.carrier || dot(other.facing, primary.facing) < 0.9 ||
-            c.surroundings.strength(cell) < -112) {
-          continue;
-        }
-        if (secondaries.size() == kMostSecondaries) break;
-        secondaries.push_back({cell, SecondaryState::kDeactivated, c.surroundings.strength(cell),
-                               c.surroundings.quality(cell), c.surroundings.interferenceRatio(cell),
-                               std::min(c.surroundings.carrierPower(cell), 0.0)});
-        changed = true;
-      }
-      if (changed) c.facts.learn(Fact::kLteComponentCarriers, c.now);
-    } else if (c.now - downloadSince_ >= kMeasurementPeriod) {
-      for (SecondaryCarrier& carrier : secondaries) {
-        changed |= carrier.state != SecondaryState::kActivated;
-        carrier.state = SecondaryState::kActivated;
-      }
-    }
-  } else {
-    downloadSince_ = -1;
-    for (SecondaryCarrier& carrier : secondaries) {
-      if (carrier.state != SecondaryState::kActivated) continue;
-      carrier.state = SecondaryState::kDeactivated;
-      changed = true;
-    }
-  }
-  if (changed) c.facts.learn(Fact::kLteAggregation, c.now);
-}
-
-void LteModem::endAggregation(const Circumstances& c) {
-  bool changed = false;
-  for (SecondaryCarrier& carrier : state_.secondaries) {
-    changed |= carrier.state != SecondaryState::kDeconfigured;
-    carrier.state = SecondaryState::kDeconfigured;
-  }
-  downloadSince_ = -1;
-  if (!changed) return;
-  c.facts.learn(Fact::kLteAggregation, c.now);
-  c.facts.learn(Fact::kLteComponentCarriers, c.now);
 }
 
 }  // namespace probeview::scenario

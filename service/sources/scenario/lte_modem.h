@@ -75,9 +75,11 @@ struct LteState {
   std::vector<LteSample> samples;  // the last ten at most, the oldest first
   std::vector<TransmitPower> transmitPowers;
   std::vector<SecondaryCarrier> secondaries;
-  bool drxConfigured = false;
   unsigned transmissionMode = 3;
 
+  // C-DRX is configured with the connection and ends with it, also when the phone leaves, looks for a cell in which to
+  // go on or is on its way to another technology (3GPP TS 36.331, 5.3.7.2, 5.3.12 and 5.4.3).
+  bool drxConfigured() const { return connected(); }
   bool connected() const { return connection == LteConnection::kConnected; }
   bool camped() const { return connection != LteConnection::kNull; }
 };
@@ -114,6 +116,7 @@ class LteModem {
   void advanceReestablishment(const Circumstances& c);
   void aggregate(const Circumstances& c);
   void endAggregation(const Circumstances& c);
+  void forgetDeconfigured(const Circumstances& c);
   void becomeConnected(LteCause cause, const Circumstances& c);
   std::optional<CellIndex> selectionCandidate(const Circumstances& c) const;
 

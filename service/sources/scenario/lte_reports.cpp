@@ -43,8 +43,8 @@ void report(const Phone& phone, KCellularLteRrcState& message) {
 void report(const Phone& phone, KCellularLteCdrxConfig& message) {
   const LteState& lte = phone.lte();
   message.setRrcState(static_cast<std::int32_t>(lte.connection));
-  message.setCdrxConfigStatus(lte.drxConfigured ? 1 : 0);
-  if (!lte.drxConfigured) return;
+  message.setCdrxConfigStatus(lte.drxConfigured() ? 1 : 0);
+  if (!lte.drxConfigured()) return;
   message.setOnDurationMs(LteDrx::kOnDuration);
   message.setDrxInactivityMs(LteDrx::kInactivity);
   message.setDrxRetxTimerMs(LteDrx::kRetransmission);
@@ -175,7 +175,8 @@ void report(const Phone& phone, KCellularLteCarrierAggregationStatus& message) {
     listed.setDlEarfcn(carrier.channel);
     listed.setDlRfBand(carrier.band);
     listed.setDlBandwidth(bandwidthIndex(carrier));
-    listed.setHasUplink(false);  // the phone sends on its primary carrier only
+    listed.setHasUplink(false);                                  // the phone sends on its primary carrier only
+    if (entry.state == SecondaryState::kDeconfigured) continue;  // and is not measured any more
     listed.setRsrp(units::lteCarrierRsrp.toSigned(entry.rsrp));
     listed.setRsrq(units::lteCarrierRsrq.toSigned(entry.rsrq));
     listed.setSnr(wholeDecibels(entry.sinr));

@@ -21,8 +21,11 @@ bool contains(const std::vector<std::uint32_t>& list, std::uint32_t value) {
 
 Registration::Registration(const Network& network, std::uint64_t seed) : network_(network), random_(seed, 3) {}
 
-// Temporary identities are never all ones, which means none (3GPP TS 23.003, 2.4).
-std::uint32_t Registration::newIdentity() { return static_cast<std::uint32_t>(random_.next() >> 33) | 0xC0000000U; }
+// 3GPP TS 23.003, 2.4: the two top bits tell who has given a temporary identity. A visitor location register never sets
+// both, so that its TMSI is not taken for a P-TMSI, in which both are always set.
+std::uint32_t Registration::newTmsi() { return static_cast<std::uint32_t>(random_.next() >> 33); }
+// For an M-TMSI too, which becomes a P-TMSI when the phone goes to UMTS. Never all ones, which means none.
+std::uint32_t Registration::newPacketTmsi() { return (newTmsi() & ~1U) | 0xC0000000U; }
 
 bool Registration::knownForbidden(CellIndex cell) const {
   const std::uint32_t area = network_.cells[cell].areaCode;
@@ -229,7 +232,7 @@ void Registration::accept(Milliseconds now, Facts& facts) {
     mobility_.failure = ProcedureFailure::kNone;
     mobility_.reject = Reject::kNone;
     mobility_.combined = combined;
-    if (!mobility_.temporaryIdentity || random_.chance(0.5)) mobility_.temporaryIdentity = newIdentity();
+    if (!mobility_.temporaryIdentity || random_.chance(0.5)) mobility_.temporaryIdentity = newTmsi();
     facts.learn(Fact::kMobilityContext, now);
   };
   switch (done) {
@@ -249,7 +252,7 @@ void Registration::accept(Milliseconds now, Facts& facts) {
       gprs_.failure = ProcedureFailure::kNone;
       gprs_.reject = Reject::kNone;
       gprs_.procedure = GprsProcedure::kNone;
-      if (!gprs_.temporaryIdentity || random_.chance(0.5)) gprs_.temporaryIdentity = newIdentity();
+      if (!gprs_.temporaryIdentity || random_.chance(0.5)) gprs_.temporaryIdentity = newPacketTmsi();
       break;
     case Procedure::kEpsAttach:
     case Procedure::kTrackingAreaUpdate:
@@ -267,7 +270,7 @@ void Registration::accept(Milliseconds now, Facts& facts) {
       eps_.trackingAreas = {areaCodeOf(area / 2 * 2), areaCodeOf(area / 2 * 2 + 1)};
       eps_.groupIdentity = kGroupIdentity;
       eps_.groupCode = 1 + area / 2;
-      if (!eps_.temporaryIdentity || random_.chance(0.4)) eps_.temporaryIdentity = newIdentity();
+      if (!eps_.temporaryIdentity || random_.chance(0.4)) eps_.temporaryIdentity = newPacketTmsi();
       eps_.voiceOverIms = network_.hasVoiceOverIms(*cell_);
       if (done != Procedure::kPeriodicAreaUpdate) updateLocation(true);
       break;

@@ -130,7 +130,8 @@ class Registration final : public ForbiddenAreas {
   void accept(Milliseconds now, Facts& facts);
   void refuse(Reject cause, Milliseconds now, Facts& facts);
   void touch(Procedure procedure, Milliseconds now, Facts& facts) const;
-  std::uint32_t newIdentity();
+  std::uint32_t newTmsi();
+  std::uint32_t newPacketTmsi();
 
   const Network& network_;
   Random random_;

@@ -25,6 +25,7 @@ void ReportSchedule::setPlan(const std::optional<MetricPlan>& plan) {
     const std::optional<Milliseconds> before = entry.realPeriod;
     if (!plan) {
       entry.wanted = true;
+      entry.periodIsAsked = forcedPeriod_.has_value();
       setPeriod(entry, report.ownPeriod);
     } else {
       const auto wish = plan->metrics.find(report.metricId);
@@ -37,6 +38,7 @@ void ReportSchedule::setPlan(const std::optional<MetricPlan>& plan) {
         // On change is more than any period: without one sorts before all that have one.
         period = plan->observed ? std::min(period, wished) : wished;
       }
+      entry.periodIsAsked = forcedPeriod_.has_value() || (period && isListed && wish->second);
       setPeriod(entry, period);
     }
     if (entry.wanted && !wasWanted) entry.pending = true;
@@ -74,9 +76,11 @@ std::optional<Milliseconds> ReportSchedule::due(const Report& report, const Fact
   const Facts::Entry& fact = facts[report.fact];
   if (!entry.wanted || fact.learnt < 0) return std::nullopt;
   // A measurement that was made too early to be sent, and has been overtaken by a change of the cell, is news no more.
-  const bool news = fact.revision != entry.reported && (fact.holds || report.nature == Nature::kState);
+  const bool news = fact.revision != entry.reported && (fact.holds || fact.lastWord || report.nature == Nature::kState);
   if (entry.period || report.nature == Nature::kMeasurement) {
-    if (now < entry.next) return std::nullopt;
+    // A last word waits for nothing but what was asked for: the next technology is about to be told of.
+    const bool waits = !news || !fact.lastWord || entry.periodIsAsked;
+    if (waits && now < entry.next) return std::nullopt;
   }
   Milliseconds measuredAt = fact.learnt;
   if (forcedPeriod_) {

@@ -38,6 +38,7 @@ class ReportSchedule {
     bool wanted = true;
     std::optional<Milliseconds> period;  // simulated ms
     std::optional<Milliseconds> realPeriod;
+    bool periodIsAsked = false;  // by a client or by the scenario; otherwise it is the report's own
     std::uint32_t reported = 0;  // revision
     bool pending = true;         // not reported since somebody began to want it
     Milliseconds next = 0;       // not before, in simulated ms

@@ -133,10 +133,18 @@ class ScenarioSource final : public MetricSource {
     const Milliseconds until = anchorSimulated_ + static_cast<Milliseconds>(elapsed * speed_);
     while (story_->now() + kStep <= until) {
       story_->advance();
-      for (const Report& report : reports()) {
-        const auto time = schedule_.due(report, story_->facts(), story_->now());
-        if (time) emit(report, *time);
-      }
+      // That a technology has been left is told before what serves instead.
+      tell(true);
+      tell(false);
+    }
+  }
+
+  // What is due of the technologies that have been left, or of everything else.
+  void tell(bool ofTheLeft) {
+    for (const Report& report : reports()) {
+      if (story_->facts()[report.fact].left != ofTheLeft) continue;
+      const auto time = schedule_.due(report, story_->facts(), story_->now());
+      if (time) emit(report, *time);
     }
   }
 

@@ -14,13 +14,14 @@
 
 namespace probeview::scenario {
 
-// Ranges of what is reported: RSRP and RSRQ of 3GPP TS 36.133, 9.1.4 and 9.1.7; CPICH RSCP and Ec/No of 25.133, 9.1.1
-// and 9.1.2; RxLev of 45.008, 8.1.4.
+// Ranges of what is reported: RSRP and RSRQ of 3GPP TS 36.133, 9.1.4 and 9.1.7; CPICH RSCP and Ec/No and the power of a
+// UTRA carrier of 25.133, 9.1.1 to 9.1.3; RxLev of 45.008, 8.1.4.
 constexpr double kWeakestRsrp = -140, kStrongestRsrp = -44;
 constexpr double kWorstRsrq = -19.5, kBestRsrq = -3;
 constexpr double kWorstSinr = -20, kBestSinr = 30;
 constexpr double kWeakestRscp = -120, kStrongestRscp = -25;
 constexpr double kWorstEcNo = -24, kBestEcNo = 0;
+constexpr double kWeakestUtraCarrier = -100, kStrongestUtraCarrier = -25;
 constexpr double kWeakestRxLev = -110, kStrongestRxLev = -48;
 
 class Surroundings {

@@ -20,7 +20,9 @@ void UmtsModem::change(UmtsConnection to, const Circumstances& c) {
   state_.connection = to;
   since_ = c.now;
   c.facts.learn(Fact::kUmtsConnection, c.now);
-  if (state_.camped()) configure(c);
+  configure(c);
+  // What was measured at this very moment is told together with the new state.
+  if (c.facts[Fact::kUmtsServingMeasurement].learnt == c.now) state_.measuredConnected = state_.connectedMode();
   if (!state_.connected()) c.facts.end(Fact::kUmtsTransmitPower);
 }
 
@@ -62,13 +64,15 @@ void UmtsModem::enter(CellIndex cell, Manner manner, const Circumstances& c) {
 }
 
 void UmtsModem::leave(const Circumstances& c) {
-  if (state_.connected()) state_.release = UmtsRelease::kCellChanged;
+  if (state_.connectedMode()) state_.release = UmtsRelease::kCellChanged;
   change(UmtsConnection::kInactive, c);
-  for (const Fact fact :
-       {Fact::kUmtsServingCell, Fact::kUmtsServingMeasurement, Fact::kUmtsTransmitPower, Fact::kUmtsSelection,
-        Fact::kUmtsNeighbours, Fact::kUmtsConnection, Fact::kUmtsConfiguration}) {
-    c.facts.end(fact);
+  for (const Fact fact : {Fact::kUmtsServingCell, Fact::kUmtsTransmitPower, Fact::kUmtsSelection, Fact::kUmtsNeighbours,
+                          Fact::kUmtsConnection, Fact::kUmtsConfiguration}) {
+    c.facts.leave(fact);
   }
+  // The last measurement may have been told as one of connected mode, and must not stand as if that went on.
+  state_.measuredConnected = false;
+  c.facts.leaveWithLastWord(Fact::kUmtsServingMeasurement, c.now);
 }
 
 void UmtsModem::measure(const Circumstances& c) {
@@ -77,7 +81,10 @@ void UmtsModem::measure(const Circumstances& c) {
   state_.ecNo = c.surroundings.quality(serving);
   state_.pilotRatio = c.surroundings.interferenceRatio(serving);
   state_.carrierPower = c.surroundings.carrierPower(serving);
-  state_.antennaPower = {state_.carrierPower, state_.carrierPower - c.random.between(1, 3)};
+  const double secondAntenna = state_.carrierPower - c.random.between(1, 3);
+  state_.antennaPower = {std::clamp(state_.carrierPower, kWeakestUtraCarrier, kStrongestUtraCarrier),
+                         std::clamp(secondAntenna, kWeakestUtraCarrier, kStrongestUtraCarrier)};
+  state_.measuredConnected = state_.connectedMode();
   listAllHeard(c, serving, state_.neighbours);
   c.facts.learn(Fact::kUmtsServingMeasurement, c.now);
   c.facts.learn(Fact::kUmtsNeighbours, c.now);

@@ -50,6 +50,7 @@ struct UmtsState {
   std::optional<CellIndex> serving;                // the cell that serves, or the last one that did
   double rscp = 0, ecNo = 0, pilotRatio = 0, carrierPower = 0;
   std::array<double, 2> antennaPower{};  // the carrier's power at each antenna, dBm
+  bool measuredConnected = false;        // whether that was measured in connected mode
   NeighbourLists neighbours;
   std::vector<TransmitPower> transmitPowers;
   std::optional<unsigned> drxCycle;  // ms; none while the phone listens all the time
@@ -58,6 +59,11 @@ struct UmtsState {
   bool camped() const { return connection != UmtsConnection::kInactive; }
   // With a dedicated or shared channel of its own.
   bool connected() const { return connection == UmtsConnection::kCellFach || connection == UmtsConnection::kCellDch; }
+  // UTRA RRC connected mode (3GPP TS 25.331, 7): from the establishment of a connection until it has been released,
+  // also while the phone only listens for pages.
+  bool connectedMode() const {
+    return camped() && connection != UmtsConnection::kIdle && connection != UmtsConnection::kEstablishing;
+  }
 };
 
 // The phone in UTRA: idle mode, the connected states, change of the best cell, radio link failure.

@@ -52,7 +52,7 @@ void report(const Phone& phone, KCellularWcdmaCellInfo& message) {
 
 void report(const Phone& phone, KCellularWcdmaScellMeasurement& message) {
   const UmtsState& umts = phone.umts();
-  message.setConnectedMode(umts.connected());
+  message.setConnectedMode(umts.measuredConnected);
   for (const double power : umts.antennaPower) {
     // RSRP and RSRQ are of E-UTRA; what UTRA has in their place has no field here.
     RxInfo& info = message.addRxInfo();

@@ -181,10 +181,11 @@ TEST(Story, LteLevelsLieWithinTheirReportingRanges) {
       EXPECT_LE(message.sccListsCount(), 2U);
       for (const SecondaryComponentCarrier& carrier : message.sccLists()) {
         EXPECT_LE(carrier.dlBandwidth(), 5U);
+        EXPECT_FALSE(carrier.hasUlEarfcn());  // there is no uplink, so there is nothing to know about it
+        if (carrier.state() == SecondaryComponentCarrier::State::SCC_STATE_DECONFIGURED) continue;
         EXPECT_TRUE(carrier.rsrp() >= -14000 && carrier.rsrp() <= -4400);
         EXPECT_TRUE(carrier.rsrq() >= -1950 && carrier.rsrq() <= -300);
         EXPECT_TRUE(carrier.rssi() > carrier.rsrp() && carrier.rssi() <= 0);
-        EXPECT_FALSE(carrier.hasUlEarfcn());  // there is no uplink, so there is nothing to know about it
       }
     });
   }
@@ -638,7 +639,7 @@ TEST(Story, TheFirstMinutesOfTheCityAreTheSameBytesEverywhere) {
   for (const MetricRecord& record : drive.records) {
     for (const std::uint8_t byte : record.payload) digest = (digest ^ byte) * 1099511628211U;
   }
-  EXPECT_EQ(digest, 10247008050093169159U);
+  EXPECT_EQ(digest, 2198250076880166979U);
 }
 
 TEST(Story, TheHighwayHandsOverOftenAndLosesItsCoverage) {
