@@ -136,7 +136,7 @@ class KCellularGsmGrrEventMeasCr final : public PBCodable {
   PB_LIST (4, "lte_ncell_meas",  lteNcellMeas,  LteNcellMeas, lteNcellMeas, LteNcellMeas, repeated<message<LteNcellMeas>>);
 };
 
-// What the serving cell broadcasts about GPRS, 3GPP TS 44.060, 12.24.
+// What the serving cell broadcasts about GPRS, 3GPP TS 44.018, 10.5.2.37b, and 44.060, 11.2.20 and 12.24.
 class KCellularGsmGprsConfig final : public PBCodable {
   PB_MESSAGE(KCellularGsmGprsConfig)
   PB_FIELD( 1, "timestamp",             timestamp,          Timestamp,          uint64);

@@ -65,7 +65,7 @@ constexpr FieldFacts fieldFacts[] = {
     FieldFacts{"KCellularLteSelReselCellInfo", "Thresh_serving_lowP", "threshServingLowP, 0 to 31, dB are twice that", ""},
     FieldFacts{"KCellularLteSelReselCellInfo", "Thresh_serving_lowQ", "threshServingLowQ, dB, 0 to 31", "never there: the field number is that of a metric and decoding drops it"},
     FieldFacts{"KCellularLteSelReselCellInfo", "priority_operating_freq", "Reselection priority of the serving frequency, 0 (lowest) to 7", ""},
-    FieldFacts{"KCellularLteSelReselCellInfo", "nbr_eutra", "One entry per E-UTRA neighbour frequency", "each entry gets the timestamp of its message"},
+    FieldFacts{"KCellularLteSelReselCellInfo", "nbr_eutra", "One entry per E-UTRA neighbour frequency", "on the page each entry has the timestamp of its message"},
     // NbrEutra
     FieldFacts{"NbrEutra", "earfcn", "EARFCN, 0 to 262143 (3GPP TS 36.101, 5.7.3)", ""},
     FieldFacts{"NbrEutra", "Q_rxlev_min", "q-RxLevMin, -70 to -22, dBm are twice that", ""},
@@ -81,7 +81,7 @@ constexpr FieldFacts fieldFacts[] = {
     FieldFacts{"NbrEutra", "frame_type", "Duplex mode", ""},
     FieldFacts{"NbrEutra", "band", "Number of the operating band", ""},
     // KCellularLteServingCellMeasurement
-    FieldFacts{"KCellularLteServingCellMeasurement", "timestamp", "Time of the values, ms since 1970-01-01 UTC", "shown as text in the time zone of the device"},
+    FieldFacts{"KCellularLteServingCellMeasurement", "timestamp", "Time of the values, ms since 1970-01-01 UTC", ""},
     FieldFacts{"KCellularLteServingCellMeasurement", "is_connected_mode", "Whether the measurement was made in connected mode", ""},
     FieldFacts{"KCellularLteServingCellMeasurement", "rx_info", "One entry per receive antenna", ""},
     // RxInfo
@@ -93,8 +93,8 @@ constexpr FieldFacts fieldFacts[] = {
     FieldFacts{"KCellularLteTxPower", "timestamp", "Time of the values, ms since 1970-01-01 UTC", "shown as text in the time zone of the device"},
     FieldFacts{"KCellularLteTxPower", "tx_power_info", "One entry per subframe", "each entry gets the timestamp of its message"},
     // TxPowerInfo
-    FieldFacts{"TxPowerInfo", "pucch_tx_power", "PUCCH power, dBm, -112 to 23 (3GPP TS 36.213, 5.1.2)", ""},
-    FieldFacts{"TxPowerInfo", "pusch_tx_power", "PUSCH power, dBm, -112 to 23 (3GPP TS 36.213, 5.1.1)", ""},
+    FieldFacts{"TxPowerInfo", "pucch_tx_power", "PUCCH power, dBm, -40 to 23 (3GPP TS 36.213, 5.1.2, within 36.101, 6.2.2 and 6.3.2)", ""},
+    FieldFacts{"TxPowerInfo", "pusch_tx_power", "PUSCH power, dBm, -40 to 23 (3GPP TS 36.213, 5.1.1, within 36.101, 6.2.2 and 6.3.2)", ""},
     FieldFacts{"TxPowerInfo", "subframe_index", "Subframe, 0 to 9", ""},
     // KCellularLteRsrpRsrqSinr
     FieldFacts{"KCellularLteRsrpRsrqSinr", "timestamp", "Time of the values, ms since 1970-01-01 UTC", "shown as text in the time zone of the device"},
@@ -155,7 +155,7 @@ constexpr FieldFacts fieldFacts[] = {
     FieldFacts{"KCellularLteNbrInterRatCellMeas", "meas_nbr_geran", "One entry per GSM neighbour", "each entry gets the timestamp of its message"},
     // EgwErrcNbrUtraMeas
     FieldFacts{"EgwErrcNbrUtraMeas", "uarfcn", "UARFCN, 0 to 16383 (3GPP TS 25.101, 5.4.3)", ""},
-    FieldFacts{"EgwErrcNbrUtraMeas", "psc", "Primary scrambling code, 0 to 511 (3GPP TS 25.213, 5.2.3)", ""},
+    FieldFacts{"EgwErrcNbrUtraMeas", "psc", "Primary scrambling code, 0 to 511 (3GPP TS 25.213, 5.2.2)", ""},
     FieldFacts{"EgwErrcNbrUtraMeas", "rscp", "Reported RSCP, -5 to 91, -121 to -25 dBm (3GPP TS 25.133, 9.1.1)", "minus 116, dBm"},
     FieldFacts{"EgwErrcNbrUtraMeas", "ecno", "Reported Ec/No, 0 to 49, -24.5 to 0 dB in steps of 0.5 dB (3GPP TS 25.133, 9.1.2)", "times 0.5, minus 24.5, dB"},
     // EgwErrcNbrGeranMeas
@@ -180,16 +180,16 @@ constexpr FieldFacts fieldFacts[] = {
     FieldFacts{"KCellularWcdmaCellInfo", "cell_id", "UTRAN cell identity, 28 bits (3GPP TS 25.331, 10.3.2.2)", ""},
     FieldFacts{"KCellularWcdmaCellInfo", "wcdma_band", "Band", ""},
     FieldFacts{"KCellularWcdmaCellInfo", "dl_uarfcn", "Downlink UARFCN, 0 to 16383 (3GPP TS 25.101, 5.4.3)", ""},
-    FieldFacts{"KCellularWcdmaCellInfo", "psc", "Primary scrambling code, 0 to 511 (3GPP TS 25.213, 5.2.3)", ""},
+    FieldFacts{"KCellularWcdmaCellInfo", "psc", "Primary scrambling code, 0 to 511 (3GPP TS 25.213, 5.2.2)", ""},
     FieldFacts{"KCellularWcdmaCellInfo", "num_mnc_digits", "Digits of the mobile network code, 2 or 3", ""},
     FieldFacts{"KCellularWcdmaCellInfo", "hspa", "HSPA support of the cell", ""},
     // KCellularWcdmaScellMeasurement
     FieldFacts{"KCellularWcdmaScellMeasurement", "timestamp", "Time of the values, ms since 1970-01-01 UTC", "shown as text in the time zone of the device"},
     FieldFacts{"KCellularWcdmaScellMeasurement", "connected_mode", "Whether the measurement was made in connected mode", ""},
-    FieldFacts{"KCellularWcdmaScellMeasurement", "rx_info", "One entry per receive antenna", "each entry gets the timestamp and connected_mode of its message"},
+    FieldFacts{"KCellularWcdmaScellMeasurement", "rx_info", "One entry per receive antenna", "on the page each entry has the timestamp and connected_mode of its message, but every row reads \"Come back later\""},
     // KCellularWcdmaTxPower
     FieldFacts{"KCellularWcdmaTxPower", "timestamp", "Time of the values, ms since 1970-01-01 UTC", "shown as text in the time zone of the device"},
-    FieldFacts{"KCellularWcdmaTxPower", "tx_power_info", "One entry per subframe", "each entry gets the timestamp of its message"},
+    FieldFacts{"KCellularWcdmaTxPower", "tx_power_info", "One entry per subframe", "on the page each entry has the timestamp of its message"},
     // KCellularWcdmaSelReselCellInfo
     FieldFacts{"KCellularWcdmaSelReselCellInfo", "timestamp", "Time of the values, ms since 1970-01-01 UTC", "shown as text in the time zone of the device"},
     FieldFacts{"KCellularWcdmaSelReselCellInfo", "hsdpa_capable", "Whether the cell supports HSDPA, 0 or 1", ""},
@@ -205,9 +205,9 @@ constexpr FieldFacts fieldFacts[] = {
     FieldFacts{"KCellularWcdmaSelReselCellInfo", "s_intersearch", "Sintersearch, dB, -32 to 20", ""},
     FieldFacts{"KCellularWcdmaSelReselCellInfo", "s_search_rat", "SsearchRAT, dB, -32 to 20", ""},
     FieldFacts{"KCellularWcdmaSelReselCellInfo", "s_cell_prio", "Reselection priority of the serving cell, 0 (lowest) to 7", ""},
-    FieldFacts{"KCellularWcdmaSelReselCellInfo", "eutra_prio_info", "One entry per LTE frequency", "each entry gets the timestamp of its message"},
-    FieldFacts{"KCellularWcdmaSelReselCellInfo", "utra_prio_info", "One entry per UMTS frequency", "each entry gets the timestamp of its message"},
-    FieldFacts{"KCellularWcdmaSelReselCellInfo", "gsm_prio_info", "One entry per GSM frequency", "each entry gets the timestamp of its message"},
+    FieldFacts{"KCellularWcdmaSelReselCellInfo", "eutra_prio_info", "One entry per LTE frequency", "on the page each entry has the timestamp of its message"},
+    FieldFacts{"KCellularWcdmaSelReselCellInfo", "utra_prio_info", "One entry per UMTS frequency", "on the page each entry has the timestamp of its message"},
+    FieldFacts{"KCellularWcdmaSelReselCellInfo", "gsm_prio_info", "One entry per GSM frequency", "on the page each entry has the timestamp of its message"},
     // EutraFreqInfo
     FieldFacts{"EutraFreqInfo", "earfcn", "EARFCN, 0 to 262143 (3GPP TS 36.101, 5.7.3)", ""},
     FieldFacts{"EutraFreqInfo", "prio", "Reselection priority, 0 (lowest) to 7", ""},
@@ -225,7 +225,7 @@ constexpr FieldFacts fieldFacts[] = {
     // UtraCellMeasResult
     FieldFacts{"UtraCellMeasResult", "uarfcn", "UARFCN, 0 to 16383 (3GPP TS 25.101, 5.4.3)", ""},
     FieldFacts{"UtraCellMeasResult", "band", "Number of the operating band", ""},
-    FieldFacts{"UtraCellMeasResult", "psc", "Primary scrambling code, 0 to 511 (3GPP TS 25.213, 5.2.3)", ""},
+    FieldFacts{"UtraCellMeasResult", "psc", "Primary scrambling code, 0 to 511 (3GPP TS 25.213, 5.2.2)", ""},
     FieldFacts{"UtraCellMeasResult", "ecno", "Reported Ec/No, 0 to 49, -24.5 to 0 dB in steps of 0.5 dB (3GPP TS 25.133, 9.1.2)", "on the page times 0.5, minus 24.5, dB"},
     FieldFacts{"UtraCellMeasResult", "rscp", "Reported RSCP, -5 to 91, -121 to -25 dBm (3GPP TS 25.133, 9.1.1)", "on the page minus 116, dBm"},
     // GsmCellMeasResult
@@ -270,7 +270,7 @@ constexpr FieldFacts fieldFacts[] = {
     FieldFacts{"KCellularGsmIdleConfig", "c2_valid", "Whether C2 parameters are broadcast, 0 or 1", ""},
     FieldFacts{"KCellularGsmIdleConfig", "cr_offset", "CELL_RESELECT_OFFSET, 0 to 63, dB are twice that", "never there: the field number is that of a metric and decoding drops it"},
     FieldFacts{"KCellularGsmIdleConfig", "tmp_offset", "TEMPORARY_OFFSET, 0 to 7, dB are ten times that, 7 is infinity", ""},
-    FieldFacts{"KCellularGsmIdleConfig", "penalty_t", "PENALTY_TIME, 0 to 31, s are 20 times one more than that", ""},
+    FieldFacts{"KCellularGsmIdleConfig", "penalty_t", "PENALTY_TIME, 0 to 30, s are 20 times one more than that; 31: no time, CELL_RESELECT_OFFSET is taken away (3GPP TS 45.008, 6.4)", ""},
     FieldFacts{"KCellularGsmIdleConfig", "t3212", "T3212, tenths of an hour, 0 to 255", ""},
     FieldFacts{"KCellularGsmIdleConfig", "acc", "Access control classes, 16 bits", ""},
     FieldFacts{"KCellularGsmIdleConfig", "bs_pa_mfrms", "BS_PA_MFRMS, multiframes between pages, 2 to 9", ""},
@@ -314,7 +314,7 @@ constexpr FieldFacts fieldFacts[] = {
     FieldFacts{"GsmNcellMeas", "rxlev", "Received level, 0 to 63, -110 to -47 dBm in steps of 1 dB (3GPP TS 45.008, 8.1.4)", "on the page minus 110, dBm"},
     // UmtsNcellMeas
     FieldFacts{"UmtsNcellMeas", "cell_type", "Type of the cell, a number of the modem", ""},
-    FieldFacts{"UmtsNcellMeas", "cpich_sc", "Primary scrambling code, 0 to 511 (3GPP TS 25.213, 5.2.3)", ""},
+    FieldFacts{"UmtsNcellMeas", "cpich_sc", "Primary scrambling code, 0 to 511 (3GPP TS 25.213, 5.2.2)", ""},
     FieldFacts{"UmtsNcellMeas", "dl_uarfcn", "Downlink UARFCN, 0 to 16383 (3GPP TS 25.101, 5.4.3)", ""},
     FieldFacts{"UmtsNcellMeas", "cpich_rscp", "Reported RSCP, 0 to 91, -116 to -25 dBm (3GPP TS 25.133, 9.1.1)", "on the page minus 116, dBm"},
     FieldFacts{"UmtsNcellMeas", "cpich_ecn0", "Reported Ec/No, 0 to 49, -24.5 to 0 dB in steps of 0.5 dB (3GPP TS 25.133, 9.1.2)", "shown as it is: the viewer looks for cpich_ecno"},
@@ -329,13 +329,13 @@ constexpr FieldFacts fieldFacts[] = {
     FieldFacts{"KCellularGsmGprsConfig", "gprs_sup", "Whether the cell supports GPRS", ""},
     FieldFacts{"KCellularGsmGprsConfig", "rac", "Routing area code, 0 to 255 (3GPP TS 23.003, 4.2)", ""},
     FieldFacts{"KCellularGsmGprsConfig", "sp_pg_cy", "SPLIT_PG_CYCLE_CODE, whether split paging is supported", ""},
-    FieldFacts{"KCellularGsmGprsConfig", "nco", "NETWORK_CONTROL_ORDER, 0 to 2 (3GPP TS 44.060, 12.24)", ""},
+    FieldFacts{"KCellularGsmGprsConfig", "nco", "NETWORK_CONTROL_ORDER, 0 to 2 (3GPP TS 44.018, 10.5.2.37b)", ""},
     FieldFacts{"KCellularGsmGprsConfig", "nom", "Network mode of operation, 1 to 3 (3GPP TS 23.060, 6.3.3)", ""},
     FieldFacts{"KCellularGsmGprsConfig", "cr_hyst", "CELL_RESELECT_HYSTERESIS, index 0 to 7 for 0 to 14 dB", ""},
     FieldFacts{"KCellularGsmGprsConfig", "acc_thr", "GPRS access threshold", ""},
     FieldFacts{"KCellularGsmGprsConfig", "ext_upl_tbf_supported", "Whether extended uplink TBF mode is supported", ""},
     FieldFacts{"KCellularGsmGprsConfig", "priority_class", "Priority class for reselection", ""},
-    FieldFacts{"KCellularGsmGprsConfig", "cell_bar_access_2", "CELL_BAR_ACCESS_2, 0 or 1 (3GPP TS 44.060, 12.24)", ""},
+    FieldFacts{"KCellularGsmGprsConfig", "cell_bar_access_2", "CELL_BAR_ACCESS_2, 0 or 1 (3GPP TS 44.060, 11.2.20)", ""},
     // KCellularMmCommonInfo
     FieldFacts{"KCellularMmCommonInfo", "timestamp", "Time of the values, ms since 1970-01-01 UTC", "shown as text in the time zone of the device"},
     FieldFacts{"KCellularMmCommonInfo", "imsi", "IMSI as on the SIM, personal data", ""},
@@ -456,7 +456,7 @@ constexpr std::array messageFacts = {
     MessageFacts{"GsmNcellMeas", "One GSM neighbour; the level in dBm is rxlev - 110 (3GPP TS 45.008, 8.1.4).", "", ""},
     MessageFacts{"UmtsNcellMeas", "One UMTS neighbour; RSCP in dBm is cpich_rscp - 116, Ec/No in dB is cpich_ecn0 / 2 - 24.5 (3GPP TS 25.133, 9.1).", "", ""},
     MessageFacts{"LteNcellMeas", "One LTE neighbour; RSRP in dBm is rsrp - 140, RSRQ in dB is rsrq / 2 - 19.5 (3GPP TS 36.133, 9.1).", "", ""},
-    MessageFacts{"KCellularGsmGprsConfig", "What the serving cell broadcasts about GPRS, 3GPP TS 44.060, 12.24.", "myGSMGPRSConfigDict", "none that the lists lead to: \"GSM GSM GPRS Config\" reads \"Come back later\", \"GSM GPRS Config\" shows the first field"},
+    MessageFacts{"KCellularGsmGprsConfig", "What the serving cell broadcasts about GPRS, 3GPP TS 44.018, 10.5.2.37b, and 44.060, 11.2.20 and 12.24.", "myGSMGPRSConfigDict", "none that the lists lead to: \"GSM GSM GPRS Config\" reads \"Come back later\", \"GSM GPRS Config\" shows the first field"},
     MessageFacts{"KCellularMmCommonInfo", "What all mobility management shares: the IMSI, equivalent PLMNs, forbidden location and tracking areas.", "myCellularMMCommonInfoDict", "none"},
     MessageFacts{"Plmn", "A PLMN in three bytes, 3GPP TS 24.008, 10.5.1.3.", "", ""},
     MessageFacts{"KCellularLocationAreaId", "A location area: PLMN in three bytes and LAC, 3GPP TS 24.008, 10.5.1.3.", "", ""},

@@ -119,7 +119,8 @@ void report(const Phone& phone, KCellularGsmGrrEventMeasCr& message) {
   }
 }
 
-// What system information 13 says (3GPP TS 44.018, 10.5.2.37b; 44.060, 12.24).
+// What system information 13 says (3GPP TS 44.018, 10.5.2.37b; 44.060, 12.24), and that the cell is not barred
+// (44.060, 11.2.20).
 void report(const Phone& phone, KCellularGsmGprsConfig& message) {
   const Cell& cell = phone.network().cells[*phone.gsm().serving];
   message.setGprsSup(true);
