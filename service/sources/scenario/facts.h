@@ -59,6 +59,7 @@ class Facts {
     bool holds = false;          // whether it is still so
     bool left = false;           // it is not, because the phone has left the technology
     bool lastWord = false;       // it was learnt as the technology was left, and is to be told all the same
+    bool outdated = false;       // what was learnt is of no use any more, and it is about to be learnt anew
   };
 
   void learn(Fact fact, Milliseconds now) {
@@ -66,6 +67,12 @@ class Facts {
     entry.learnt = now;
     ++entry.revision;
     entry.holds = true;
+    entry.left = entry.lastWord = entry.outdated = false;
+  }
+  // What was measured is of another cell; the measurement of this one goes on.
+  void beginAnew(Fact fact) {
+    Entry& entry = entries_[static_cast<std::size_t>(fact)];
+    entry.holds = entry.outdated = true;
     entry.left = entry.lastWord = false;
   }
   void end(Fact fact) { entries_[static_cast<std::size_t>(fact)].holds = false; }

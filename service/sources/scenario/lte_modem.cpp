@@ -45,7 +45,7 @@ void LteModem::serve(CellIndex cell, const Circumstances& c) {
       }) > 0) {
     c.facts.learn(Fact::kLteAggregation, c.now);
   }
-  c.facts.end(Fact::kLteSamples);  // those of the cell before
+  c.facts.beginAnew(Fact::kLteSamples);
   c.facts.learn(Fact::kLteServingCell, c.now);
   c.facts.learn(Fact::kLteSelection, c.now);
   c.facts.learn(Fact::kLteComponentCarriers, c.now);

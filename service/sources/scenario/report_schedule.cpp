@@ -76,7 +76,8 @@ std::optional<Milliseconds> ReportSchedule::due(const Report& report, const Fact
   const Facts::Entry& fact = facts[report.fact];
   if (!entry.wanted || fact.learnt < 0) return std::nullopt;
   // A measurement that was made too early to be sent, and has been overtaken by a change of the cell, is news no more.
-  const bool news = fact.revision != entry.reported && (fact.holds || fact.lastWord || report.nature == Nature::kState);
+  const bool news = fact.revision != entry.reported && !fact.outdated &&
+                    (fact.holds || fact.lastWord || report.nature == Nature::kState);
   if (entry.period || report.nature == Nature::kMeasurement) {
     // A last word waits for nothing but what was asked for: the next technology is about to be told of.
     const bool waits = !news || !fact.lastWord || entry.periodIsAsked;
@@ -104,7 +105,9 @@ std::optional<Milliseconds> ReportSchedule::due(const Report& report, const Fact
   } else if (report.nature == Nature::kMeasurement) {
     entry.next = now + static_cast<Milliseconds>(static_cast<double>(kMeasurementPeriod) * speed_);
   }
-  return measuredAt;
+  // What held when it was told last is not told as if it had ended before.
+  entry.toldUntil = std::max(entry.toldUntil, measuredAt);
+  return entry.toldUntil;
 }
 
 }  // namespace probeview::scenario

@@ -42,6 +42,7 @@ class ReportSchedule {
     std::uint32_t reported = 0;  // revision
     bool pending = true;         // not reported since somebody began to want it
     Milliseconds next = 0;       // not before, in simulated ms
+    Milliseconds toldUntil = 0;  // the latest moment of which it has been told
   };
 
   void setPeriod(Entry& entry, std::optional<Milliseconds> period) const;
