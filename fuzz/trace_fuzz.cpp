@@ -28,7 +28,7 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
   require(result.log.has_value() == result.error.empty());
   if (!result.log) return 0;
   require(!result.log->rows.empty());
-  require(result.log->problems.size() <= traceProblemsKept);
+  require(result.log->problems.size() <= 2 * traceProblemsKept);
   TraceTranslator translator;
   std::vector<TraceMetric> metrics;
   for (const TraceRow& row : result.log->rows) {

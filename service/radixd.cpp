@@ -61,6 +61,9 @@ void describe(CLI::App& program, Options& options) {
   program.footer(
       "The service runs in the foreground, logs to standard error and ends cleanly on SIGTERM.\n"
       "\n"
+      "The rows of a trace do not tell the connected states of UMTS apart: data and voice are shown as\n"
+      "CELL_DCH, which is a guess.\n"
+      "\n"
       "Examples:\n"
       "  radixd\n"
       "  radixd --socket /tmp/test/radixd.sock --source scenario:city,seed=7\n"

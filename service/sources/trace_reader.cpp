@@ -1,15 +1,11 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "service/sources/trace_reader.h"
 
-#include <fcntl.h>
-#include <sys/stat.h>
-#include <unistd.h>
-
 #include <array>
-#include <cerrno>
 #include <cmath>
 
-#include "platform/file_descriptor.h"
+#include "service/sources/trace_cell.h"
+#include "service/sources/trace_field.h"
 #include "service/sources/wire_units.h"
 #include "values/plain_text.h"
 #include "values/printer.h"
@@ -29,14 +25,22 @@ enum Column : std::size_t {
   CellIdentity,
   NeighbourLevel,
   NeighbourQuality,
+  // What a file may lack.
+  NodePart,
+  CellPart,
 };
-constexpr std::array<std::string_view, 10> columnNames = {
-    "Timestamp", "NetworkMode", "RSRP", "RSRQ", "SNR", "State", "LACHEX", "RAWCELLID", "NRxRSRP", "NRxRSRQ"};
+constexpr std::size_t neededColumns = NodePart;
+constexpr std::array<std::string_view, 12> columnNames = {"Timestamp", "NetworkMode", "RSRP",    "RSRQ",
+                                                          "SNR",       "State",       "LACHEX",  "RAWCELLID",
+                                                          "NRxRSRP",   "NRxRSRQ",     "NODEHEX", "CELLHEX"};
 using Fields = std::array<std::string_view, columnNames.size()>;
 
-// The levels that the logger wrote when it knew nothing.
+// What the logger writes when it knows nothing of a cell, and when it knows nothing of the serving one at all.
 constexpr double unknownLevel = -51;
 constexpr double unknownQuality = -24;
+constexpr double floorLevel = -200;
+constexpr double floorQuality = -20;
+constexpr double floorSignalToNoise = -30;
 
 struct TechnologyName {
   std::string_view name;
@@ -49,33 +53,22 @@ constexpr TechnologyName technologyNames[] = {
     {"EDGE", TraceTechnology::Gsm},
 };
 
-// Which quantities a technology's columns hold, and how wide its cell identity is.
+// Which quantities a technology's columns hold.
 struct TechnologyColumns {
   const units::Quantity& level;
   const units::Quantity& quality;
-  std::uint32_t highestCellIdentity;
 };
 TechnologyColumns columnsOf(TraceTechnology technology) {
   switch (technology) {
     case TraceTechnology::Lte:
       break;
     case TraceTechnology::Umts:
-      return {units::utraRscp, units::utraEcNo, 0xFFFFFFF};
+      return {units::utraRscp, units::utraEcNo};
     case TraceTechnology::Gsm:
-      return {units::gsmRxLev, units::gsmRxQual, 0xFFFF};
+      return {units::gsmRxLev, units::gsmRxQual};
   }
-  return {units::lteRsrp, units::lteRsrq, 0xFFFFFFF};
+  return {units::lteRsrp, units::lteRsrq};
 }
-
-// A piece of the file fit for a line of a log: short, and without what a terminal would act upon.
-std::string shown(std::string_view field) {
-  constexpr std::size_t longest = 40;
-  const bool cut = field.size() > longest;
-  std::string text = printed(Value::text(field.substr(0, longest)));
-  return cut ? text + "…" : text;
-}
-
-bool isNoValue(std::string_view field) { return field.empty() || field == "-"; }
 
 std::optional<std::chrono::milliseconds> parsedTime(std::string_view field) {
   // yyyy.MM.dd_HH.mm.ss
@@ -133,6 +126,7 @@ class Reader {
       }
       readRow(line);
     }
+    endDoubt();
     if (log_.rows.empty()) {
       return {std::nullopt, log_.problems.empty() ? "it has a line of column names, but no rows"
                                                   : "no row is usable; " + log_.problems[0]};
@@ -163,14 +157,24 @@ class Reader {
       if (comma == std::string_view::npos) break;
       line.remove_prefix(comma + 1);
     }
+    if (const std::string missing = missingColumns(0, neededColumns, ", "); !missing.empty()) {
+      return "line 1 must name the columns of a drive-test log; missing: " + missing;
+    }
+    if (const std::string missing = missingColumns(neededColumns, columnNames.size(), " and "); !missing.empty()) {
+      log_.remark =
+          "there is no column " + missing + ", so cell identities cannot be checked; they are taken as they stand";
+    }
+    return {};
+  }
+
+  std::string missingColumns(std::size_t begin, std::size_t end, std::string_view between) const {
     std::string missing;
-    for (std::size_t column = 0; column < columnNames.size(); ++column) {
+    for (std::size_t column = begin; column < end; ++column) {
       if (positions_[column] != absentColumn) continue;
-      if (!missing.empty()) missing += ", ";
+      if (!missing.empty()) missing += between;
       missing += columnNames[column];
     }
-    if (missing.empty()) return {};
-    return "line 1 must name the columns of a drive-test log; missing: " + missing;
+    return missing;
   }
 
   void readRow(std::string_view line) {
@@ -184,17 +188,19 @@ class Reader {
     TraceRow row;
     row.line = lines_.number();
     const std::optional<std::chrono::milliseconds> time = parsedTime(fields[Timestamp]);
-    if (!time) return skip("Timestamp is " + shown(fields[Timestamp]) + ", not yyyy.MM.dd_HH.mm.ss");
+    if (!time) return skip("Timestamp is " + shownField(fields[Timestamp]) + ", not yyyy.MM.dd_HH.mm.ss");
     row.time = *time;
     if (!readTechnology(fields[NetworkMode], row)) {
-      return skip("NetworkMode is " + shown(fields[NetworkMode]) + ", which is no technology that is known");
+      return skip("NetworkMode is " + shownField(fields[NetworkMode]) + ", which is no technology that is known");
     }
     if (!readActivity(fields[State], row)) {
-      return skip("State is " + shown(fields[State]) + ", not I, D, V or VD");
+      return skip("State is " + shownField(fields[State]) + ", not I, D, V or VD");
     }
     pendingNotes_.clear();
+    pendingDoubt_.clear();
     if (row.technology && !readValues(fields, row)) return;
-    for (const std::string& note : pendingNotes_) problem(note);
+    for (const std::string& note : pendingNotes_) problem(note, keptProblems_);
+    tellDoubt();
     log_.rows.push_back(row);
   }
 
@@ -238,28 +244,43 @@ class Reader {
   // False: the row has been skipped.
   bool readValues(const Fields& fields, TraceRow& row) {
     const TechnologyColumns columns = columnsOf(*row.technology);
-    const bool gsm = *row.technology == TraceTechnology::Gsm;
-    if (!readPair(fields, Level, Quality, columns, gsm, row.level, row.quality)) return false;
-    if (!readPair(fields, NeighbourLevel, NeighbourQuality, columns, gsm, row.neighbourLevel, row.neighbourQuality)) {
-      return false;
-    }
-    if (*row.technology == TraceTechnology::Lte) {
-      if (!readNumber(fields, SignalToNoise, row.signalToNoise)) return false;
-      dropUnlessMeasurable(SignalToNoise, units::lteSampleSinr, row.signalToNoise);
-    }
-    return readCell(fields, columns.highestCellIdentity, row);
+    return readServing(fields, columns, row) && readNeighbour(fields, columns, row) && readCell(fields, row);
   }
 
-  bool readPair(const Fields& fields, Column levelColumn, Column qualityColumn, const TechnologyColumns& columns,
-                bool gsm, std::optional<double>& level, std::optional<double>& quality) {
-    if (!readNumber(fields, levelColumn, level) || !readNumber(fields, qualityColumn, quality)) return false;
-    if (level == unknownLevel && (gsm || quality == unknownQuality)) {
-      // On GSM the level alone says so; the quality beside it is of no cell either, unless it is a serving RXQUAL.
-      level.reset();
-      if (!gsm || levelColumn == NeighbourLevel) quality.reset();
+  bool readServing(const Fields& fields, const TechnologyColumns& columns, TraceRow& row) {
+    if (isAtFloor(fields)) return true;
+    if (!readNumber(fields, Level, row.level) || !readNumber(fields, Quality, row.quality)) return false;
+    if (row.level == unknownLevel) {
+      // On GSM the level alone says so, and RXQUAL beside it is one.
+      const bool gsm = *row.technology == TraceTechnology::Gsm;
+      const bool both = row.quality == unknownQuality;
+      if (both || gsm) row.level.reset();
+      if (both) row.quality.reset();
     }
-    dropUnlessMeasurable(levelColumn, columns.level, level);
-    dropUnlessMeasurable(qualityColumn, columns.quality, quality);
+    dropUnlessMeasurable(fields, Level, columns.level, row.level);
+    dropUnlessMeasurable(fields, Quality, columns.quality, row.quality);
+    if (*row.technology != TraceTechnology::Lte) return true;
+    if (!readNumber(fields, SignalToNoise, row.signalToNoise)) return false;
+    dropUnlessMeasurable(fields, SignalToNoise, units::lteSampleSinr, row.signalToNoise);
+    return true;
+  }
+
+  static bool isAtFloor(const Fields& fields) {
+    return parseNumber<double>(fields[Level]) == floorLevel && parseNumber<double>(fields[Quality]) == floorQuality &&
+           parseNumber<double>(fields[SignalToNoise]) == floorSignalToNoise;
+  }
+
+  bool readNeighbour(const Fields& fields, const TechnologyColumns& columns, TraceRow& row) {
+    if (!readNumber(fields, NeighbourLevel, row.neighbourLevel) ||
+        !readNumber(fields, NeighbourQuality, row.neighbourQuality)) {
+      return false;
+    }
+    if (row.neighbourLevel == unknownLevel && row.neighbourQuality.value_or(unknownQuality) == unknownQuality) {
+      row.neighbourLevel.reset();
+      row.neighbourQuality.reset();
+    }
+    dropUnlessMeasurable(fields, NeighbourLevel, columns.level, row.neighbourLevel);
+    dropUnlessMeasurable(fields, NeighbourQuality, columns.quality, row.neighbourQuality);
     return true;
   }
 
@@ -268,43 +289,45 @@ class Reader {
     if (isNoValue(field)) return true;
     number = parseNumber<double>(field);
     if (number && std::isfinite(*number)) return true;
-    skip(std::string(columnNames[column]) + " is " + shown(field) + ", not a number");
+    skip(std::string(columnNames[column]) + " is " + shownField(field) + ", not a number");
     return false;
   }
 
-  bool readCell(const Fields& fields, std::uint32_t highestCellIdentity, TraceRow& row) {
-    std::optional<std::uint64_t> cell;
+  bool readCell(const Fields& fields, TraceRow& row) {
+    std::optional<std::uint64_t> identity;
     std::optional<std::uint32_t> area;
     if (!isNoValue(fields[CellIdentity])) {
-      cell = parseNumber<std::uint64_t>(fields[CellIdentity]);
-      if (!cell) return skip("RAWCELLID is " + shown(fields[CellIdentity]) + ", not a number"), false;
+      identity = parseNumber<std::uint64_t>(fields[CellIdentity]);
+      if (!identity) return skip("RAWCELLID is " + shownField(fields[CellIdentity]) + ", not a number"), false;
     }
     if (!isNoValue(fields[AreaCode])) {
       area = parseNumber<std::uint32_t>(fields[AreaCode], 16);
       if (!area || *area > 0xFFFF) {
-        return skip("LACHEX is " + shown(fields[AreaCode]) + ", not an area code of 16 bits in hexadecimal"), false;
+        return skip("LACHEX is " + shownField(fields[AreaCode]) + ", not an area code of 16 bits in hexadecimal"),
+               false;
       }
     }
+    const bool checked = positions_[NodePart] != absentColumn && positions_[CellPart] != absentColumn;
+    TraceCell cell =
+        traceCell(*row.technology, identity.value_or(0),
+                  checked ? std::optional<TraceCellParts>({fields[NodePart], fields[CellPart]}) : std::nullopt);
+    pendingDoubt_ = std::move(cell.doubt);
+    // An area is that of the cell; whose is it, when the cell is not known?
+    if (!cell.identity && (checked || !pendingDoubt_.empty())) return true;
     // 0 and FFFE stand for "no area" (3GPP TS 23.003, 4.1 and 19.4.2.3): the phone is between two cells, and the
     // identity in such a row often is still, or already, that of a cell of the other technology.
     if (area == 0u || area == 0xFFFEu) return true;
     row.areaCode = area;
-    // The logger writes 0 when it has no cell.
-    if (!cell || *cell == 0) return true;
-    if (*cell > highestCellIdentity) {
-      note("RAWCELLID " + std::to_string(*cell) + " is above " + std::to_string(highestCellIdentity) +
-           " and thus no cell of this technology, left out");
-      return true;
-    }
-    row.cellIdentity = static_cast<std::uint32_t>(*cell);
+    row.cellIdentity = cell.identity;
     return true;
   }
 
-  void dropUnlessMeasurable(Column column, const units::Quantity& quantity, std::optional<double>& number) {
+  void dropUnlessMeasurable(const Fields& fields, Column column, const units::Quantity& quantity,
+                            std::optional<double>& number) {
     if (!number || quantity.contains(*number)) return;
     std::string text(columnNames[column]);
     text += ' ';
-    printNumber(*number, text);
+    text += shownNumber(fields[column]);
     text += " is no ";
     text += quantity.name;
     text += " (";
@@ -318,59 +341,56 @@ class Reader {
     number.reset();
   }
 
+  // Rows in a row whose cell is not known are one problem: told with the first of them, counted with the last.
+  void tellDoubt() {
+    if (pendingDoubt_.empty()) return endDoubt();
+    if (doubtedRows_ == 0) {
+      doubtIsKept_ = keptDoubts_ < traceProblemsKept;
+      doubtPosition_ = log_.problems.size();
+      problem(pendingDoubt_ + ", cell and area left out", keptDoubts_);
+    }
+    ++doubtedRows_;
+    lastDoubtedLine_ = lines_.number();
+  }
+  void endDoubt() {
+    if (doubtedRows_ > 1 && doubtIsKept_) {
+      log_.problems[doubtPosition_] +=
+          "; so in " + std::to_string(doubtedRows_) + " rows, to line " + std::to_string(lastDoubtedLine_);
+    }
+    doubtedRows_ = 0;
+  }
+
   void note(std::string text) { pendingNotes_.push_back(std::move(text)); }
   void skip(const std::string& what) {
     ++log_.rowsSkipped;
-    problem(what + "; row skipped");
+    problem(what + "; row skipped", keptProblems_);
   }
-  void problem(const std::string& what) {
+  void problem(const std::string& what, std::size_t& kept) {
     ++log_.problemCount;
-    if (log_.problems.size() < traceProblemsKept) {
-      log_.problems.push_back("line " + std::to_string(lines_.number()) + ": " + what);
-    }
+    if (kept == traceProblemsKept) return;
+    ++kept;
+    log_.problems.push_back("line " + std::to_string(lines_.number()) + ": " + what);
   }
 
   Lines lines_;
   std::array<std::size_t, columnNames.size()> positions_{};
   std::size_t columnCount_ = 0;
+  // Of the row that is being read.
   std::vector<std::string> pendingNotes_;
+  std::string pendingDoubt_;
+  // Of the run of rows whose cell is not known, up to here.
+  std::size_t doubtedRows_ = 0;
+  std::uint32_t lastDoubtedLine_ = 0;
+  std::size_t doubtPosition_ = 0;  // among the problems, where it is kept
+  bool doubtIsKept_ = false;
   TraceLog log_;
+  // How many of its problems are of this kind.
+  std::size_t keptProblems_ = 0;
+  std::size_t keptDoubts_ = 0;
 };
-
-std::string systemError(int number) { return std::generic_category().message(number); }
 
 }  // namespace
 
 TraceLogResult readTraceLog(std::string_view text) { return Reader(text).read(); }
-
-TraceTextResult readTraceFile(const std::string& path) {
-  // Without blocking, in case somebody names a pipe that nobody writes to.
-  const FileDescriptor file(::open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK));
-  if (!file) return {std::nullopt, systemError(errno)};
-  struct stat status {};
-  std::string error;
-  std::string text;
-  if (::fstat(file.number(), &status) != 0) {
-    error = systemError(errno);
-  } else if (!S_ISREG(status.st_mode)) {
-    error = "it is no regular file";
-  } else if (static_cast<std::uint64_t>(status.st_size) > traceFileSizeLimit) {
-    error = "it has " + std::to_string(status.st_size) + " bytes, more than the " + std::to_string(traceFileSizeLimit) +
-            " that a trace may have; split it";
-  } else {
-    text.resize(static_cast<std::size_t>(status.st_size));
-    std::size_t length = 0;
-    while (length < text.size()) {
-      const ssize_t count = ::read(file.number(), text.data() + length, text.size() - length);
-      if (count < 0 && errno == EINTR) continue;
-      if (count < 0) error = systemError(errno);
-      if (count <= 0) break;
-      length += static_cast<std::size_t>(count);
-    }
-    text.resize(length);
-  }
-  if (!error.empty()) return {std::nullopt, std::move(error)};
-  return {std::move(text), {}};
-}
 
 }  // namespace probeview

@@ -7,6 +7,7 @@
 
 #include "messages/metric_identifiers.h"
 #include "service/sources/metric_pacer.h"
+#include "service/sources/trace_file.h"
 #include "service/sources/trace_reader.h"
 #include "service/sources/trace_translator.h"
 #include "values/plain_text.h"
@@ -84,6 +85,7 @@ class TraceSource final : public MetricSource {
     logLines_ = &context.log;
     sink_ = &sink;
     pacer_.emplace(context, sink);
+    if (!log_.remark.empty()) say(log_.remark);
     for (const std::string& problem : log_.problems) say(problem);
     if (log_.problemCount > log_.problems.size()) {
       say("and " + std::to_string(log_.problemCount - log_.problems.size()) + " more problems like these");

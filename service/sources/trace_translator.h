@@ -5,11 +5,10 @@
 //
 //   LTE    serving cell (identity, tracking area), RRC state with the state before and how long it lasted,
 //          RSRP/RSRQ/SINR sample, strongest E-UTRA neighbour
-//   UMTS   serving cell (identity, location area), RRC state, strongest UTRA neighbour (CPICH RSCP, Ec/No). No metric
-//   has
-//          a field for the RSCP and Ec/No of the serving cell, so these are not reported.
-//   GSM    serving cell (identity, location area, dedicated or not), level in idle and in dedicated mode, RXQUAL in
-//          dedicated mode, strongest GSM neighbour
+//   UMTS   serving cell (identity, location area), RRC state, strongest UTRA neighbour (CPICH RSCP, Ec/No).
+//          No metric has a field for the RSCP and Ec/No of the serving cell, so these are not reported.
+//   GSM    serving cell (identity, location area, dedicated or not), level in idle and in dedicated mode,
+//          RXQUAL in dedicated mode, strongest GSM neighbour
 #pragma once
 
 #include <chrono>

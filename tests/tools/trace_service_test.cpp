@@ -4,8 +4,12 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
+#include <algorithm>
+#include <chrono>
+
 #include "tests/service/harness/radixd_process.h"
 #include "tests/service/harness/temporary_folder.h"
+#include "tests/support/golden.h"
 #include "tests/support/output_of.h"
 
 namespace probeview {
@@ -19,6 +23,16 @@ class TraceServiceTest : public ::testing::Test {
   const std::string socket = folder.path() + "/radixd.sock";
   std::string probectl(const std::string& words) {
     return outputOf("timeout 60 " PROBECTL " --socket " + socket + " " + words + " 2>&1");
+  }
+  // Asks until the answer has come as far as that text, for a minute: a drive goes on only while somebody listens, and
+  // how far it has come when a client goes is a matter of luck.
+  std::string outputWith(const std::string& words, const std::string& text) {
+    const auto deadline = std::chrono::steady_clock::now() + std::chrono::minutes(1);
+    std::string output;
+    do {
+      output = probectl(words);
+    } while (output.find(text) == std::string::npos && std::chrono::steady_clock::now() < deadline);
+    return output;
   }
 };
 
@@ -43,10 +57,11 @@ TEST_F(TraceServiceTest, RowsArriveAsRecordsInTheOrderOfTheDrive) {
 TEST_F(TraceServiceTest, APageShowsWhereTheDriveHasCome) {
   RadixdProcess service({"--socket", socket, "--source", "trace:tests/pages/traces/drive_a.csv,speed=1000"});
   ASSERT_TRUE(service.waitForLog("listening at")) << service.log();
-  EXPECT_THAT(probectl("pages LTE RRC State"), HasSubstr("  timestamp          2024-03-05 12:00:01 UTC\n"
-                                                         "  state              KLTE_RRC_STATE_IDLE\n"
-                                                         "  prev_state         KLTE_RRC_STATE_CONNECTED\n"
-                                                         "  prev_state_dur_ms  1000\n"));
+  EXPECT_THAT(outputWith("pages LTE RRC State", "2024-03-05 12:00:01 UTC"),
+              HasSubstr("  timestamp          2024-03-05 12:00:01 UTC\n"
+                        "  state              KLTE_RRC_STATE_IDLE\n"
+                        "  prev_state         KLTE_RRC_STATE_CONNECTED\n"
+                        "  prev_state_dur_ms  1000\n"));
 }
 
 TEST_F(TraceServiceTest, WhatIsWrongWithAFileEndsTheStartAndIsTold) {
@@ -56,6 +71,27 @@ TEST_F(TraceServiceTest, WhatIsWrongWithAFileEndsTheStartAndIsTold) {
   RadixdProcess other({"--socket", socket, "--source", "trace:LICENSE"});
   EXPECT_EQ(other.waitForEnd(), 1);
   EXPECT_THAT(other.log(), HasSubstr("trace file LICENSE is no drive-test log: line 1 must name the columns"));
+}
+
+TEST_F(TraceServiceTest, HelpManualAndDocumentationSayWhichStateIsAGuess) {
+  // As it is read: line ends are blanks.
+  const auto said = [](std::string text) {
+    std::replace(text.begin(), text.end(), '\n', ' ');
+    return text;
+  };
+  EXPECT_THAT(said(outputOf(RADIXD_PROGRAM " --help")), HasSubstr("CELL_DCH, which is a guess"));
+  EXPECT_THAT(said(contentOf("packaging/man/radixd.8")), HasSubstr("CELL_DCH, which is a guess"));
+  EXPECT_THAT(said(contentOf("docs/traces.md")), HasSubstr("**CELL_DCH is a guess.**"));
+}
+
+TEST_F(TraceServiceTest, EveryColumnThatIsReadIsDocumented) {
+  const std::string manual = contentOf("packaging/man/radixd.8");
+  const std::string documentation = contentOf("docs/traces.md");
+  for (const char* column : {"Timestamp", "NetworkMode", "RSRP", "RSRQ", "SNR", "State", "LACHEX", "RAWCELLID",
+                             "NODEHEX", "CELLHEX", "NRxRSRP", "NRxRSRQ"}) {
+    EXPECT_THAT(manual, HasSubstr(column));
+    EXPECT_THAT(documentation, HasSubstr("`" + std::string(column) + "`"));
+  }
 }
 
 TEST_F(TraceServiceTest, ADamagedRowIsInTheLogWithItsLine) {

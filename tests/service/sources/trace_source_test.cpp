@@ -293,6 +293,22 @@ TEST_F(TraceSourceTest, BadRowsAreToldWithTheirLinesWhenTheSourceStarts) {
   EXPECT_THAT(log.lines, ElementsAre("line 2: has 1 fields, not 26; row skipped"));
 }
 
+TEST_F(TraceSourceTest, ThatCellsCannotBeCheckedIsSaidOnceHoweverOftenTheFileIsPlayed) {
+  SourceResult result =
+      makeTraceSource(write("Timestamp,NetworkMode,RSRP,RSRQ,SNR,State,LACHEX,RAWCELLID,NRxRSRP,NRxRSRQ\n"
+                            "2024.03.05_12.00.00,LTE,-,-,-,-,1A,25601,-,-\n") +
+                      ",loop");
+  ASSERT_EQ(result.error, "");
+  source = std::move(result.source);
+  source->start(SourceContext{loop, loop, log}, sink);
+  listen();
+  loop.advance(seconds(60));
+  EXPECT_THAT(sink.records, SizeIs(61));
+  EXPECT_THAT(log.lines,
+              ElementsAre("there is no column NODEHEX and CELLHEX, so cell identities cannot be checked; they "
+                          "are taken as they stand"));
+}
+
 TEST_F(TraceSourceTest, ManyBadRowsAreToldInFewLines) {
   std::string rows = measurement("12.00.00", -90);
   for (int count = 0; count < 100; ++count) rows += "bad\n";
