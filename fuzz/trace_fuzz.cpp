@@ -31,15 +31,19 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
   require(result.log->problems.size() <= 2 * traceProblemsKept);
   TraceTranslator translator;
   std::vector<TraceMetric> metrics;
-  for (const TraceRow& row : result.log->rows) {
-    translator.translate(row, metrics);
-    for (const TraceMetric& metric : metrics) {
-      const MetricIdentifier* const identifier = metricWithId(metric.metricId);
-      require(identifier != nullptr && identifier->isHandled);
-      const std::unique_ptr<PBCodable> message = identifier->message->make();
-      PBDataReader reader(metric.payload);
-      require(message->readFrom(reader));
+  // Twice, as with "loop".
+  for (int round = 0; round < 2; ++round) {
+    for (const TraceRow& row : result.log->rows) {
+      translator.translate(row, metrics);
+      for (const TraceMetric& metric : metrics) {
+        const MetricIdentifier* const identifier = metricWithId(metric.metricId);
+        require(identifier != nullptr && identifier->isHandled);
+        const std::unique_ptr<PBCodable> message = identifier->message->make();
+        PBDataReader reader(metric.payload);
+        require(message->readFrom(reader));
+      }
     }
+    translator.startOver();
   }
   return 0;
 }

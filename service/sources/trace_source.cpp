@@ -150,7 +150,7 @@ class TraceSource final : public MetricSource {
       wait(std::max(log_.rows[next_].time - row.time, std::chrono::milliseconds(0)));
     } else if (loop_) {
       next_ = 0;
-      translator_ = TraceTranslator();
+      translator_.startOver();
       wait(roundPause);
     } else {
       say("played to its end, line " + std::to_string(row.line));

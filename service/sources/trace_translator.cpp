@@ -22,8 +22,9 @@ LteState::Value lteState(const TraceActivity& activity) {
   return activity.idle() ? LteState::KLTE_RRC_STATE_IDLE : LteState::KLTE_RRC_STATE_CONNECTED;
 }
 
-// The log does not tell the connected states apart. A call needs a dedicated channel, and the log's "D" is data on the
-// move, which HSPA carries on one as well.
+// A guess: the log does not tell the connected states apart. A call needs a dedicated channel, and the log's "D" is
+// data on the move, which HSPA carries on one as well, but little data goes in CELL_FACH, and a pause in CELL_PCH or
+// URA_PCH (3GPP TS 25.331, 7). docs/traces.md and radixd --help say so.
 UmtsState::Value umtsState(const TraceActivity& activity) {
   return activity.idle() ? UmtsState::KWCDMA_RRC_CONN_STATE_IDLE : UmtsState::KWCDMA_RRC_CONN_STATE_CELL_DCH;
 }
@@ -41,8 +42,12 @@ Message messageAt(const TraceRow& row) {
 void TraceTranslator::translate(const TraceRow& row, std::vector<TraceMetric>& metrics) {
   metrics.clear();
   metrics_ = &metrics;
-  if (row.technology != technology_) enter(row.technology);
-  if (!row.technology) return;
+  // A log whose clock went back does not tell how long anything lasted meanwhile.
+  if (time_ && row.time < *time_) lteStateSince_.reset();
+  time_ = row.time;
+  if (!row.technology) return loseSight();
+  if (technology_ && *technology_ != *row.technology) leave(row);
+  technology_ = row.technology;
   switch (*row.technology) {
     case TraceTechnology::Lte:
       return translateLte(row);
@@ -53,43 +58,88 @@ void TraceTranslator::translate(const TraceRow& row, std::vector<TraceMetric>& m
   }
 }
 
-// What the phone did on a technology before it left it says nothing of what it finds when it comes back.
-void TraceTranslator::enter(std::optional<TraceTechnology> technology) {
-  technology_ = technology;
-  cell_.reset();
-  state_.reset();
+void TraceTranslator::startOver() {
+  time_.reset();
+  cell_ = {};
+  lteState_.reset();
+  lteStateSince_.reset();
+  umtsState_.reset();
 }
 
-bool TraceTranslator::cellChanged(const Cell& cell) {
-  if (cell == Cell{} || cell == cell_) return false;
+// What the phone does while no technology is known, nobody knows; one that had been left before stays left.
+void TraceTranslator::loseSight() {
+  cell_ = {};
+  if (technology_ == TraceTechnology::Lte) lteState_.reset();
+  if (technology_ == TraceTechnology::Umts) umtsState_.reset();
+}
+
+// The row is the first of another technology.
+void TraceTranslator::leave(const TraceRow& row) {
+  cell_ = {};
+  switch (*technology_) {
+    case TraceTechnology::Lte:
+      if (told_.lte) tellLteState(row, LteState::KLTE_RRC_STATE_NULL);
+      return;
+    case TraceTechnology::Umts:
+      if (told_.umts) tellUmtsState(row, UmtsState::KWCDMA_RRC_CONN_STATE_INACTIVE);
+      return;
+    case TraceTechnology::Gsm:
+      if (!told_.gsm) return;
+      auto message = messageAt<KCellularGsmScellInfo>(row);
+      message.setState(GsmState::NON_DEDICATED_STATE);
+      add(K_GSM_SCELL_INFO, message);
+  }
+}
+
+// A row that does not say which cell serves, or whether a channel is dedicated, says nothing against what was told.
+bool TraceTranslator::isNews(const Cell& cell) {
+  const auto differs = [](const auto& now, const auto& told) { return now && now != told; };
+  if (!differs(cell.identity, cell_.identity) && !differs(cell.area, cell_.area) &&
+      !differs(cell.dedicated, cell_.dedicated)) {
+    return false;
+  }
   cell_ = cell;
   return true;
 }
 
+void TraceTranslator::tellLteState(const TraceRow& row, std::int32_t state) {
+  auto message = messageAt<KCellularLteRrcState>(row);
+  message.setState(state);
+  if (lteState_) {
+    message.setPrevState(*lteState_);
+    if (lteStateSince_) {
+      const std::chrono::milliseconds::rep duration = (row.time - *lteStateSince_).count();
+      if (duration <= std::numeric_limits<std::uint32_t>::max()) {
+        message.setPrevStateDurMs(static_cast<std::uint32_t>(duration));
+      }
+    }
+  }
+  lteState_ = state;
+  lteStateSince_ = row.time;
+  told_.lte = true;
+  add(K_LTE_RRC_STATE, message);
+}
+
+void TraceTranslator::tellUmtsState(const TraceRow& row, std::int32_t state) {
+  auto message = messageAt<KCellularWcdmaRrcConnectionState>(row);
+  message.setState(state);
+  umtsState_ = state;
+  told_.umts = true;
+  add(K_UMTS_RRC_STATE, message);
+}
+
 void TraceTranslator::translateLte(const TraceRow& row) {
   const Cell cell{.identity = row.cellIdentity, .area = row.areaCode, .dedicated = {}};
-  if (cellChanged(cell)) {
+  if (isNews(cell)) {
     auto message = messageAt<KCellularLteScellInfo>(row);
     if (cell.identity) message.setCellId(*cell.identity);
     if (cell.area) message.setTrackingAreaCode(*cell.area);
     add(K_LTE_SCELL_INFO, message);
   }
   if (!row.activity) {
-    state_.reset();
-  } else if (const std::int32_t state = lteState(*row.activity); state != state_) {
-    auto message = messageAt<KCellularLteRrcState>(row);
-    message.setState(state);
-    if (state_) {
-      message.setPrevState(*state_);
-      // A log whose clock went back does not tell how long.
-      const std::chrono::milliseconds::rep duration = (row.time - stateSince_).count();
-      if (duration >= 0 && duration <= std::numeric_limits<std::uint32_t>::max()) {
-        message.setPrevStateDurMs(static_cast<std::uint32_t>(duration));
-      }
-    }
-    state_ = state;
-    stateSince_ = row.time;
-    add(K_LTE_RRC_STATE, message);
+    lteState_.reset();
+  } else if (const std::int32_t state = lteState(*row.activity); state != lteState_) {
+    tellLteState(row, state);
   }
   if (row.level || row.quality || row.signalToNoise) {
     auto message = messageAt<KCellularLteRsrpRsrqSinr>(row);
@@ -110,19 +160,16 @@ void TraceTranslator::translateLte(const TraceRow& row) {
 
 void TraceTranslator::translateUmts(const TraceRow& row) {
   const Cell cell{.identity = row.cellIdentity, .area = row.areaCode, .dedicated = {}};
-  if (cellChanged(cell)) {
+  if (isNews(cell)) {
     auto message = messageAt<KCellularWcdmaCellInfo>(row);
     if (cell.area) message.setLac(*cell.area);
     if (cell.identity) message.setCellId(*cell.identity);
     add(K_UMTS_SCELL_INFO, message);
   }
   if (!row.activity) {
-    state_.reset();
-  } else if (const std::int32_t state = umtsState(*row.activity); state != state_) {
-    state_ = state;
-    auto message = messageAt<KCellularWcdmaRrcConnectionState>(row);
-    message.setState(state);
-    add(K_UMTS_RRC_STATE, message);
+    umtsState_.reset();
+  } else if (const std::int32_t state = umtsState(*row.activity); state != umtsState_) {
+    tellUmtsState(row, state);
   }
   if (row.neighbourLevel || row.neighbourQuality) {
     auto message = messageAt<KCellularWcdmaNbrCellMeas>(row);
@@ -138,11 +185,12 @@ void TraceTranslator::translateGsm(const TraceRow& row) {
   std::optional<bool> dedicated;
   if (row.activity) dedicated = row.activity->voice;
   const Cell cell{.identity = row.cellIdentity, .area = row.areaCode, .dedicated = dedicated};
-  if (cellChanged(cell)) {
+  if (isNews(cell)) {
     auto message = messageAt<KCellularGsmScellInfo>(row);
     if (cell.area) message.setLac(*cell.area);
     if (cell.identity) message.setCellId(*cell.identity);
     if (dedicated) message.setState(*dedicated ? GsmState::DEDICATED_STATE : GsmState::NON_DEDICATED_STATE);
+    if (dedicated) told_.gsm = true;
     add(K_GSM_SCELL_INFO, message);
   }
   if (dedicated.value_or(false)) {

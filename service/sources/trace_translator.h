@@ -9,6 +9,9 @@
 //          No metric has a field for the RSCP and Ec/No of the serving cell, so these are not reported.
 //   GSM    serving cell (identity, location area, dedicated or not), level in idle and in dedicated mode,
 //          RXQUAL in dedicated mode, strongest GSM neighbour
+//
+// A technology that is left for another is told to be left, as every source does (docs/architecture.md): its RRC state
+// becomes NULL (LTE) or INACTIVE (UMTS), its channel not dedicated (GSM).
 #pragma once
 
 #include <chrono>
@@ -32,28 +35,42 @@ class TraceTranslator {
  public:
   // Replaces the content of `metrics` by what the row adds to the rows before.
   void translate(const TraceRow& row, std::vector<TraceMetric>& metrics);
+  // The drive begins anew. Between its end and its beginning nobody knows what the phone did, nor for how long; but
+  // what was told of the technology that served at the end is ended where the beginning is on another.
+  void startOver();
 
  private:
   struct Cell {
     std::optional<std::uint32_t> identity;
     std::optional<std::uint32_t> area;
     std::optional<bool> dedicated;  // GSM
-    friend bool operator==(const Cell&, const Cell&) = default;
+  };
+  // Of which technologies a state was ever told: there is nothing to end of another.
+  struct Told {
+    bool lte = false;
+    bool umts = false;
+    bool gsm = false;
   };
 
-  void enter(std::optional<TraceTechnology> technology);
-  bool cellChanged(const Cell& cell);
+  void loseSight();
+  void leave(const TraceRow& row);
+  bool isNews(const Cell& cell);
   void translateLte(const TraceRow& row);
   void translateUmts(const TraceRow& row);
   void translateGsm(const TraceRow& row);
+  void tellLteState(const TraceRow& row, std::int32_t state);
+  void tellUmtsState(const TraceRow& row, std::int32_t state);
   void add(std::int64_t metricId, const PBCodable& message);
 
   std::vector<TraceMetric>* metrics_ = nullptr;
-  std::optional<TraceTechnology> technology_;
-  // Of the technology that serves; absent until a row of it has told.
-  std::optional<Cell> cell_;
-  std::optional<std::int32_t> state_;
-  std::chrono::milliseconds stateSince_{};
+  std::optional<TraceTechnology> technology_;  // that serves, or served before there was none
+  std::optional<std::chrono::milliseconds> time_;
+  Cell cell_;  // what was told of the cell that serves
+  Told told_;
+  // The states as told; absent: not known. They are ended, not unknown, while another technology serves.
+  std::optional<std::int32_t> lteState_;
+  std::optional<std::chrono::milliseconds> lteStateSince_;  // absent: not known
+  std::optional<std::int32_t> umtsState_;
 };
 
 }  // namespace probeview

@@ -138,8 +138,9 @@ TEST_F(TracePagesTest, ADriveThatLeavesLteShowsOnTheOtherTechnologiesPages) {
            .text() +
        TraceLine{.time = "2024.03.05_12.00.03", .state = "I", .area = "1A2B", .cell = "25602"}.text());
   EXPECT_EQ(page("UMTS RRC State"),
-            "  timestamp  2024-03-05 12:00:01 UTC\n"
-            "  state      KWCDMA_RRC_CONN_STATE_CELL_DCH\n");
+            "  timestamp  2024-03-05 12:00:02 UTC\n"
+            "  state      KWCDMA_RRC_CONN_STATE_INACTIVE\n")
+      << "UMTS has been left";
   EXPECT_EQ(page("UMTS Serving Cell Info"),
             "  timestamp  2024-03-05 12:00:01 UTC\n"
             "  lac        30122\n"
@@ -149,10 +150,10 @@ TEST_F(TracePagesTest, ADriveThatLeavesLteShowsOnTheOtherTechnologiesPages) {
             "  ecno       -8.0\n"
             "  rscp       -95\n"
             "  timestamp  2024-03-05 12:00:01 UTC\n");
-  EXPECT_EQ(page("GSM Serving Cell Info"), "  timestamp  2024-03-05 12:00:02 UTC\n") << "one row, by its nature";
-  EXPECT_EQ(
-      printed(store.myGSMScellInfoDict().value()),
-      R"(["timestamp": "2024-03-05 12:00:02 UTC", "lac": 1022, "cell_id": 34124, "state": "NON_DEDICATED_STATE"])");
+  EXPECT_EQ(page("GSM Serving Cell Info"), "  timestamp  2024-03-05 12:00:03 UTC\n") << "one row, by its nature";
+  EXPECT_EQ(printed(store.myGSMScellInfoDict().value()),
+            R"(["timestamp": "2024-03-05 12:00:03 UTC", "state": "NON_DEDICATED_STATE"])")
+      << "no cell of GSM serves any more";
   EXPECT_EQ(printed(store.myGSMIdleScellMeasDict().value()),
             R"(["timestamp": "2024-03-05 12:00:02 UTC", "idle_rxlev_dBm": -83])");
   EXPECT_EQ(page("GSM GSM Neighbor Cell Meas"),
@@ -160,8 +161,10 @@ TEST_F(TracePagesTest, ADriveThatLeavesLteShowsOnTheOtherTechnologiesPages) {
             "  rxlev      -90\n"
             "  timestamp  2024-03-05 12:00:02 UTC\n");
   EXPECT_EQ(page("LTE RRC State"),
-            "  timestamp  2024-03-05 12:00:03 UTC\n"
-            "  state      KLTE_RRC_STATE_IDLE\n");
+            "  timestamp          2024-03-05 12:00:03 UTC\n"
+            "  state              KLTE_RRC_STATE_IDLE\n"
+            "  prev_state         KLTE_RRC_STATE_NULL\n"
+            "  prev_state_dur_ms  2000\n");
   EXPECT_THAT(systemLog.lines(), ElementsAre());
 }
 

@@ -8,9 +8,12 @@
 #include <filesystem>
 #include <fstream>
 
+#include "messages/lte_messages.h"
 #include "messages/metric_identifiers.h"
+#include "messages/runtime/data_reader.h"
 #include "platform/manual_loop.h"
 #include "tests/service/sources/trace_rows.h"
+#include "values/printer.h"
 
 namespace probeview {
 namespace {
@@ -238,6 +241,68 @@ TEST_F(TraceSourceTest, LoopStartsOverASecondOfTheDriveLater) {
   loop.advance(seconds(10));
   EXPECT_THAT(sink.records, SizeIs(23));
   EXPECT_THAT(log.lines, IsEmpty());
+}
+
+TEST_F(TraceSourceTest, ARoundThatBeginsElsewhereThanTheLastEndedLeavesThatTechnology) {
+  start(TraceLine{.time = "2024.03.05_12.00.00", .mode = "UMTS", .state = "I"}.text() +
+            TraceLine{.time = "2024.03.05_12.00.04", .mode = "LTE", .state = "D"}.text(),
+        ",loop");
+  EXPECT_THAT(source->metrics(), ElementsAre(K_LTE_RRC_STATE, K_UMTS_RRC_STATE));
+  listen();
+  loop.advance(seconds(5 + 4));
+  const auto lteState = [this](std::size_t record) {
+    KCellularLteRrcState message;
+    PBDataReader reader(sink.records.at(record).payload);
+    EXPECT_TRUE(message.readFrom(reader));
+    return printed(message.dictionaryRepresentation());
+  };
+  std::vector<std::int64_t> metrics;
+  for (const MetricRecord& record : sink.records) metrics.push_back(record.metricId);
+  ASSERT_THAT(metrics, ElementsAre(K_UMTS_RRC_STATE, K_UMTS_RRC_STATE, K_LTE_RRC_STATE,  // the first round
+                                   K_LTE_RRC_STATE, K_UMTS_RRC_STATE, K_UMTS_RRC_STATE, K_LTE_RRC_STATE));
+  EXPECT_EQ(lteState(2), R"(["timestamp": 1709640004000, "state": "KLTE_RRC_STATE_CONNECTED"])");
+  EXPECT_EQ(lteState(3), R"(["timestamp": 1709640000000, "state": "KLTE_RRC_STATE_NULL"])")
+      << "at the new round's time, with nothing of the old one's";
+  EXPECT_EQ(lteState(6), R"(["timestamp": 1709640004000, "state": "KLTE_RRC_STATE_CONNECTED", )"
+                         R"("prev_state": "KLTE_RRC_STATE_NULL", "prev_state_dur_ms": 4000])");
+}
+
+TEST_F(TraceSourceTest, ATechnologyThatWasLeftIsLeftForThosePlannedAndAskingLaterToo) {
+  start(TraceLine{.time = "2024.03.05_12.00.00", .state = "D"}.text() +
+        TraceLine{.time = "2024.03.05_12.00.01", .mode = "UMTS", .state = "I"}.text());
+  MetricPlan plan;
+  plan.metrics[K_LTE_RRC_STATE] = seconds(10);
+  source->setPlan(plan);
+  listen();
+  loop.advance(seconds(2));
+  const auto isLeft = [this] {
+    KCellularLteRrcState message;
+    PBDataReader reader(sink.records.back().payload);
+    EXPECT_TRUE(message.readFrom(reader));
+    return sink.records.back().metricId == K_LTE_RRC_STATE && message.hasState() &&
+           message.state() == KCellularLteRrcState::State::KLTE_RRC_STATE_NULL;
+  };
+  ASSERT_THAT(sink.records, SizeIs(1));
+  EXPECT_FALSE(isLeft());
+  EXPECT_TRUE(source->query(K_LTE_RRC_STATE));
+  ASSERT_THAT(sink.records, SizeIs(2));
+  EXPECT_TRUE(isLeft()) << "whoever asks gets the state that is";
+  loop.advance(seconds(60));
+  EXPECT_THAT(sink.records, SizeIs(2)) << "and what has been passed on is not passed on again";
+
+  start(TraceLine{.time = "2024.03.05_12.00.00", .state = "D"}.text() +
+        TraceLine{.time = "2024.03.05_12.00.01", .mode = "UMTS", .state = "I"}.text());
+  source->setPlan(plan);
+  listen();
+  loop.advance(milliseconds(10'001));
+  ASSERT_THAT(sink.records, SizeIs(4));
+  EXPECT_TRUE(isLeft()) << "with the end of the period that it came in";
+
+  source->setPlan(MetricPlan{});
+  plan.metrics[K_UMTS_RRC_STATE] = std::nullopt;
+  source->setPlan(plan);
+  ASSERT_THAT(sink.records, SizeIs(5));
+  EXPECT_EQ(sink.records.back().metricId, K_UMTS_RRC_STATE) << "what waited for somebody to want it";
 }
 
 TEST_F(TraceSourceTest, MetricsThatNobodyWantsAreNotSent) {

@@ -4,8 +4,12 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
+#include <random>
+
+#include "messages/lte_messages.h"
 #include "messages/metric_identifiers.h"
 #include "messages/runtime/data_reader.h"
+#include "messages/umts_messages.h"
 #include "tests/service/sources/trace_rows.h"
 #include "values/printer.h"
 
@@ -142,18 +146,209 @@ TEST_F(TraceTranslatorTest, AGsmRowInACallFillsTheDedicatedMeasurement) {
   EXPECT_THAT(add({.mode = "GPRS", .level = "-83", .quality = "3", .state = "V", .area = "3FE", .cell = "34124"}),
               ElementsAre(R"(K_GSM_SCELL_INFO ["lac": 1022, "cell_id": 34124, "state": "DEDICATED_STATE"])",
                           R"(K_GSM_CS_RF_MEAS ["cs_rxlev_sub": 27, "cs_rxqual_sub": 3])"));
-  EXPECT_THAT(
-      add({.mode = "GPRS", .level = "-51", .quality = "0", .state = "V"}),
-      ElementsAre(R"(K_GSM_SCELL_INFO ["state": "DEDICATED_STATE"])", R"(K_GSM_CS_RF_MEAS ["cs_rxqual_sub": 0])"));
+  EXPECT_THAT(add({.mode = "GPRS", .level = "-51", .quality = "0", .state = "V"}),
+              ElementsAre(R"(K_GSM_CS_RF_MEAS ["cs_rxqual_sub": 0])"))
+      << "a row that names no cell says nothing of a new one";
 }
 
-TEST_F(TraceTranslatorTest, ATechnologyThatIsEnteredAgainIsToldAnewAndWithoutAPast) {
-  const TraceLine lte{.mode = "LTE", .state = "D", .area = "10", .cell = "25601"};
-  add({.mode = "LTE", .state = "I", .area = "10", .cell = "25601"});
+TEST_F(TraceTranslatorTest, AServingCellThatARowDoesNotNameStaysTheOneThatWasTold) {
+  const TraceLine lte{.mode = "LTE", .area = "10", .cell = "25601"};
+  const TraceLine foreign{
+      .mode = "LTE", .level = "-99", .area = "75AA", .cell = "838535", .cellPart = "CB87", .nodePart = "C"};
   add(lte);
-  add({.mode = "UMTS", .state = "D", .area = "75AA", .cell = "838585"});
-  EXPECT_THAT(add(lte), ElementsAre(R"(K_LTE_SCELL_INFO ["cell_id": 25601, "tracking_area_code": 16])",
-                                    R"(K_LTE_RRC_STATE ["state": "KLTE_RRC_STATE_CONNECTED"])"));
+  EXPECT_THAT(add(foreign), ElementsAre(R"(K_LTE_RSRP_RSRQ_SINR ["inst_values": [["rsrp0": -99]]])"));
+  EXPECT_THAT(add(lte), IsEmpty()) << "the same cell as before";
+  EXPECT_THAT(add({.mode = "LTE", .area = "-", .cell = "25601"}), IsEmpty()) << "the same cell, told less of";
+  EXPECT_THAT(add({.mode = "LTE", .area = "-", .cell = "25602"}),
+              ElementsAre(R"(K_LTE_SCELL_INFO ["cell_id": 25602])"));
+  EXPECT_THAT(add({.mode = "LTE", .area = "10", .cell = "25602"}),
+              ElementsAre(R"(K_LTE_SCELL_INFO ["cell_id": 25602, "tracking_area_code": 16])"));
+}
+
+TEST_F(TraceTranslatorTest, AChangeOfTheGsmStateIsToldWithoutTheCellWhileThatIsNotKnown) {
+  const TraceLine foreign{
+      .mode = "EDGE", .state = "I", .area = "75AA", .cell = "838535", .cellPart = "CB87", .nodePart = "C"};
+  add({.mode = "EDGE", .state = "V", .area = "3FE", .cell = "34124"});
+  EXPECT_THAT(add(foreign), ElementsAre(R"(K_GSM_SCELL_INFO ["state": "NON_DEDICATED_STATE"])"));
+  EXPECT_THAT(add(foreign), IsEmpty());
+  EXPECT_THAT(add({.mode = "EDGE", .state = "I", .area = "3FE", .cell = "34124"}),
+              ElementsAre(R"(K_GSM_SCELL_INFO ["lac": 1022, "cell_id": 34124, "state": "NON_DEDICATED_STATE"])"));
+}
+
+TEST_F(TraceTranslatorTest, AnotherTechnologyThatServesEndsTheStateOfTheOneThatIsLeft) {
+  add({.time = "2024.03.05_12.00.00", .mode = "LTE", .state = "D"});
+  EXPECT_THAT(add({.time = "2024.03.05_12.00.07", .mode = "UMTS", .state = "V", .area = "75AA", .cell = "838585"}),
+              ElementsAre(R"(K_LTE_RRC_STATE ["state": "KLTE_RRC_STATE_NULL", "prev_state": )"
+                          R"("KLTE_RRC_STATE_CONNECTED", "prev_state_dur_ms": 7000])",
+                          R"(K_UMTS_SCELL_INFO ["lac": 30122, "cell_id": 838585])",
+                          R"(K_UMTS_RRC_STATE ["state": "KWCDMA_RRC_CONN_STATE_CELL_DCH"])"));
+  EXPECT_THAT(add({.time = "2024.03.05_12.00.08", .mode = "HSPA+", .state = "V"}), IsEmpty()) << "UMTS as well";
+  EXPECT_THAT(add({.time = "2024.03.05_12.00.10", .mode = "EDGE", .state = "V", .area = "3FE", .cell = "34124"}),
+              ElementsAre(R"(K_UMTS_RRC_STATE ["state": "KWCDMA_RRC_CONN_STATE_INACTIVE"])",
+                          R"(K_GSM_SCELL_INFO ["lac": 1022, "cell_id": 34124, "state": "DEDICATED_STATE"])"));
+  EXPECT_THAT(add({.time = "2024.03.05_12.00.20", .mode = "LTE", .state = "I"}),
+              ElementsAre(R"(K_GSM_SCELL_INFO ["state": "NON_DEDICATED_STATE"])",
+                          R"(K_LTE_RRC_STATE ["state": "KLTE_RRC_STATE_IDLE", "prev_state": )"
+                          R"("KLTE_RRC_STATE_NULL", "prev_state_dur_ms": 13000])"));
+  EXPECT_THAT(add({.time = "2024.03.05_12.00.21", .mode = "EDGE", .state = "I"}),
+              ElementsAre(R"(K_LTE_RRC_STATE ["state": "KLTE_RRC_STATE_NULL", "prev_state": )"
+                          R"("KLTE_RRC_STATE_IDLE", "prev_state_dur_ms": 1000])",
+                          R"(K_GSM_SCELL_INFO ["state": "NON_DEDICATED_STATE"])"));
+  EXPECT_THAT(add({.time = "2024.03.05_12.00.22", .mode = "UMTS", .state = "I"}),
+              ElementsAre(R"(K_GSM_SCELL_INFO ["state": "NON_DEDICATED_STATE"])",
+                          R"(K_UMTS_RRC_STATE ["state": "KWCDMA_RRC_CONN_STATE_IDLE"])"))
+      << "left from its idle state, too: no cell of GSM serves any more";
+}
+
+TEST_F(TraceTranslatorTest, ATechnologyWhoseStateWasNeverToldIsLeftInSilence) {
+  add({.mode = "LTE", .level = "-95", .state = "-"});
+  EXPECT_THAT(add({.mode = "UMTS"}), IsEmpty());
+  EXPECT_THAT(add({.mode = "EDGE"}), IsEmpty());
+  EXPECT_THAT(add({.mode = "LTE", .state = "I"}), ElementsAre(R"(K_LTE_RRC_STATE ["state": "KLTE_RRC_STATE_IDLE"])"))
+      << "and nothing was told that could have lasted";
+}
+
+TEST_F(TraceTranslatorTest, LeavingTellsThePreviousStateOnlyWhereItIsKnown) {
+  add({.mode = "LTE", .state = "D"});
+  add({.mode = "LTE", .state = "-"});
+  EXPECT_THAT(add({.mode = "UMTS"}), ElementsAre(R"(K_LTE_RRC_STATE ["state": "KLTE_RRC_STATE_NULL"])"));
+  EXPECT_THAT(add({.mode = "LTE", .state = "-"}), IsEmpty()) << "a state that nobody knows";
+  EXPECT_THAT(add({.mode = "LTE", .state = "I"}), ElementsAre(R"(K_LTE_RRC_STATE ["state": "KLTE_RRC_STATE_IDLE"])"))
+      << "which came between";
+}
+
+TEST_F(TraceTranslatorTest, RowsWithoutATechnologyAreNoLeaving) {
+  add({.time = "2024.03.05_12.00.00", .mode = "LTE", .state = "D", .area = "10", .cell = "25601"});
+  EXPECT_THAT(add({.time = "2024.03.05_12.00.01", .mode = "-"}), IsEmpty());
+  EXPECT_THAT(add({.time = "2024.03.05_12.00.02", .mode = "LTE", .state = "D", .area = "10", .cell = "25601"}),
+              ElementsAre(R"(K_LTE_SCELL_INFO ["cell_id": 25601, "tracking_area_code": 16])",
+                          R"(K_LTE_RRC_STATE ["state": "KLTE_RRC_STATE_CONNECTED"])"));
+  EXPECT_THAT(add({.time = "2024.03.05_12.00.03", .mode = "-"}), IsEmpty());
+  EXPECT_THAT(add({.time = "2024.03.05_12.00.10", .mode = "UMTS", .state = "I"}),
+              ElementsAre(R"(K_LTE_RRC_STATE ["state": "KLTE_RRC_STATE_NULL"])",
+                          R"(K_UMTS_RRC_STATE ["state": "KWCDMA_RRC_CONN_STATE_IDLE"])"))
+      << "left when another technology serves, from nobody knows which state";
+  EXPECT_THAT(add({.time = "2024.03.05_12.00.11", .mode = "-"}), IsEmpty());
+  EXPECT_THAT(add({.time = "2024.03.05_12.00.15", .mode = "LTE", .state = "I"}),
+              ElementsAre(R"(K_UMTS_RRC_STATE ["state": "KWCDMA_RRC_CONN_STATE_INACTIVE"])",
+                          R"(K_LTE_RRC_STATE ["state": "KLTE_RRC_STATE_IDLE", "prev_state": )"
+                          R"("KLTE_RRC_STATE_NULL", "prev_state_dur_ms": 5000])"))
+      << "LTE was away all the time";
+}
+
+TEST_F(TraceTranslatorTest, AClockThatWentBackWhileLteWasAwayLeavesTheDurationUnset) {
+  add({.time = "2024.03.05_12.00.00", .mode = "LTE", .state = "D"});
+  add({.time = "2024.03.05_12.00.10", .mode = "UMTS"});
+  add({.time = "2024.03.05_11.00.00", .mode = "UMTS"});
+  EXPECT_THAT(add({.time = "2024.03.05_12.00.20", .mode = "LTE", .state = "D"}),
+              ElementsAre(R"(K_LTE_RRC_STATE ["state": "KLTE_RRC_STATE_CONNECTED", "prev_state": )"
+                          R"("KLTE_RRC_STATE_NULL"])"))
+      << "the two times alone would say ten seconds";
+}
+
+TEST_F(TraceTranslatorTest, ATechnologyThatIsEnteredAgainIsToldAnew) {
+  const TraceLine lte{.mode = "LTE", .state = "D", .area = "10", .cell = "25601"};
+  const TraceLine umts{.mode = "UMTS", .state = "I", .area = "75AA", .cell = "838585"};
+  add(lte);
+  add(umts);
+  EXPECT_THAT(add(lte), ElementsAre(R"(K_UMTS_RRC_STATE ["state": "KWCDMA_RRC_CONN_STATE_INACTIVE"])",
+                                    R"(K_LTE_SCELL_INFO ["cell_id": 25601, "tracking_area_code": 16])",
+                                    R"(K_LTE_RRC_STATE ["state": "KLTE_RRC_STATE_CONNECTED", "prev_state": )"
+                                    R"("KLTE_RRC_STATE_NULL", "prev_state_dur_ms": 0])"));
+  EXPECT_THAT(add(umts), ElementsAre(R"(K_LTE_RRC_STATE ["state": "KLTE_RRC_STATE_NULL", "prev_state": )"
+                                     R"("KLTE_RRC_STATE_CONNECTED", "prev_state_dur_ms": 0])",
+                                     R"(K_UMTS_SCELL_INFO ["lac": 30122, "cell_id": 838585])",
+                                     R"(K_UMTS_RRC_STATE ["state": "KWCDMA_RRC_CONN_STATE_IDLE"])"));
+}
+
+TEST_F(TraceTranslatorTest, ADriveThatStartsOverLeavesWhatServedAtItsEndAndHasNoPast) {
+  const TraceLine umts{.time = "2024.03.05_12.00.00", .mode = "UMTS", .state = "D", .area = "75AA", .cell = "838585"};
+  const TraceLine lte{.time = "2024.03.05_12.00.05", .mode = "LTE", .state = "D", .area = "10", .cell = "25601"};
+  add(umts);
+  add(lte);
+  translator.startOver();
+  EXPECT_THAT(add(umts), ElementsAre(R"(K_LTE_RRC_STATE ["state": "KLTE_RRC_STATE_NULL"])",
+                                     R"(K_UMTS_SCELL_INFO ["lac": 30122, "cell_id": 838585])",
+                                     R"(K_UMTS_RRC_STATE ["state": "KWCDMA_RRC_CONN_STATE_CELL_DCH"])"));
+  EXPECT_EQ(add(lte).back(), R"(K_LTE_RRC_STATE ["state": "KLTE_RRC_STATE_CONNECTED", "prev_state": )"
+                             R"("KLTE_RRC_STATE_NULL", "prev_state_dur_ms": 5000])")
+      << "both ends are of this round";
+  add({.time = "2024.03.05_12.00.06", .mode = "UMTS", .state = "I"});
+  translator.startOver();
+  add({.time = "2024.03.05_12.00.00", .mode = "UMTS", .state = "I"});
+  EXPECT_EQ(add(lte).back(), R"(K_LTE_RRC_STATE ["state": "KLTE_RRC_STATE_CONNECTED"])")
+      << "LTE was left in the round before";
+}
+
+TEST_F(TraceTranslatorTest, InARandomDriveNoTechnologyKeepsAStateThatAnotherOneContradicts) {
+  const char* const modes[] = {"LTE", "5G", "HSPA+", "EDGE", "-"};
+  const char* const states[] = {"I", "D", "V", "-"};
+  std::mt19937 random(20240305);
+  std::optional<std::uint64_t> lteTold;  // the time of the last state of LTE
+  bool clockWentBack = false;            // since then
+  std::int32_t lte = 0;
+  bool umtsEnded = true;
+  bool gsmEnded = true;
+  std::uint64_t now = 1'709'640'000'000;
+  int durations = 0;
+  std::size_t mode = 0;
+  for (int count = 0; count < 5000; ++count) {
+    TraceRow row;
+    if (random() % 3 == 0) mode = random() % std::size(modes);
+    const std::string state = states[random() % std::size(states)];
+    if (random() % 50 == 0) {
+      now -= 30'000;
+      clockWentBack = true;
+    } else {
+      now += random() % 3 * 1000;
+    }
+    if (random() % 1000 == 0) {
+      translator.startOver();
+      clockWentBack = true;
+    }
+    row.time = std::chrono::milliseconds(now);
+    if (mode < 2) row.technology = TraceTechnology::Lte;
+    if (mode == 2) row.technology = TraceTechnology::Umts;
+    if (mode == 3) row.technology = TraceTechnology::Gsm;
+    if (state != "-") row.activity = TraceActivity{.data = state == "D", .voice = state == "V"};
+    std::vector<TraceMetric> metrics;
+    translator.translate(row, metrics);
+    for (const TraceMetric& metric : metrics) {
+      PBDataReader reader(metric.payload);
+      if (metric.metricId == K_LTE_RRC_STATE) {
+        KCellularLteRrcState message;
+        ASSERT_TRUE(message.readFrom(reader));
+        if (message.hasPrevState()) {
+          ASSERT_TRUE(lteTold.has_value());
+          EXPECT_EQ(message.prevState(), lte);
+        }
+        if (message.hasPrevStateDurMs()) {
+          EXPECT_FALSE(clockWentBack);
+          EXPECT_EQ(message.prevStateDurMs(), now - *lteTold);
+          ++durations;
+        }
+        lte = message.state();
+        lteTold = now;
+        clockWentBack = false;
+      } else if (metric.metricId == K_UMTS_RRC_STATE) {
+        KCellularWcdmaRrcConnectionState message;
+        ASSERT_TRUE(message.readFrom(reader));
+        umtsEnded = message.state() == KCellularWcdmaRrcConnectionState::State::KWCDMA_RRC_CONN_STATE_INACTIVE;
+        EXPECT_EQ(umtsEnded, row.technology != TraceTechnology::Umts);
+      } else {
+        ASSERT_EQ(metric.metricId, K_GSM_SCELL_INFO);
+        gsmEnded = row.technology != TraceTechnology::Gsm;
+      }
+    }
+    if (!row.technology) {
+      EXPECT_THAT(metrics, IsEmpty());
+      continue;
+    }
+    EXPECT_TRUE(lte == KCellularLteRrcState::State::KLTE_RRC_STATE_NULL || *row.technology == TraceTechnology::Lte);
+    EXPECT_TRUE(umtsEnded || *row.technology == TraceTechnology::Umts);
+    EXPECT_TRUE(gsmEnded || *row.technology == TraceTechnology::Gsm);
+  }
+  EXPECT_GT(durations, 500);
 }
 
 }  // namespace
