@@ -153,6 +153,7 @@ TEST(TraceCell, WithoutTheColumnsOfNodeAndCellIdentitiesAreTakenAsTheyStandAndTh
     EXPECT_EQ(log.rows[1].cellIdentity, std::nullopt) << "which GSM cannot have";
     EXPECT_EQ(log.rows[1].areaCode, std::nullopt);
     EXPECT_EQ(log.rows[2].cellIdentity, std::nullopt) << "0 is none, whatever stands beside it";
+    EXPECT_EQ(log.rows[2].areaCode, 0x1Au) << "which nothing contradicts";
     EXPECT_THAT(log.problems,
                 ElementsAre("line 3: RAWCELLID 838535 is above 65535 and thus no cell of GSM, cell and area left out"));
     EXPECT_EQ(log.remark, "there is no column " + std::string(each.missing) +
