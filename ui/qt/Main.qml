@@ -15,7 +15,8 @@ ApplicationWindow {
     height: 800
     minimumWidth: 240
     minimumHeight: 320
-    title: stack.currentItem ? "probeview – " + stack.currentItem.page.title : "probeview"
+    // The first page bears the program's own name.
+    title: stack.depth > 1 ? "probeview – " + stack.currentItem.page.title : "probeview"
     color: Theme.ground
 
     palette.window: Theme.ground
@@ -112,14 +113,21 @@ ApplicationWindow {
         popExit: Transition { Slide { from: 0; to: stack.width } }
     }
 
-    // Wherever the keyboard is, the list or the back button.
+    // Wherever the keyboard is, the list or the back button. There is nothing to type into, so plain keys may lead back.
     Shortcut {
-        sequences: ["Esc", "Alt+Left", "Back"]
+        sequences: ["Esc", "Left", "Backspace", "Alt+Left", "Back"]
         autoRepeat: false
         onActivated: {
             window.keyboardUsed = true;
             window.back();
         }
+    }
+
+    // The program ends with its only window.
+    Shortcut {
+        sequences: ["Ctrl+Q", "Ctrl+W"]
+        autoRepeat: false
+        onActivated: window.close()
     }
 
     Item {

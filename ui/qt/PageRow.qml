@@ -48,12 +48,17 @@ ItemDelegate {
 
         readonly property real room: row.width - 2 * (row.inset + Theme.rowPadding)
                                      - (row.disclosure ? chevron.width + Theme.gap : 0)
+        // A row that leads to another list needs no value; in any other row one without a value misses it.
+        readonly property bool isMissing: row.value === "" && !row.disclosure
+        readonly property bool isLabelAlone: row.value === "" && row.disclosure
+        readonly property real valueWidth: isMissing ? stroke.width : valueText.implicitWidth
+        readonly property real valueHeight: isLabelAlone ? 0 : valueText.implicitHeight
         // Beside each other if that takes one line.
-        readonly property bool beside: row.value === "" || row.value.indexOf("\n") < 0
-                                       && labelText.implicitWidth + Theme.gap + valueText.implicitWidth <= room
+        readonly property bool beside: isLabelAlone || row.value.indexOf("\n") < 0
+                                       && labelText.implicitWidth + Theme.gap + valueWidth <= room
 
-        implicitHeight: beside ? Math.max(labelText.implicitHeight, row.value === "" ? 0 : valueText.implicitHeight)
-                               : labelText.implicitHeight + 3 + valueText.implicitHeight
+        implicitHeight: beside ? Math.max(labelText.implicitHeight, valueHeight)
+                               : labelText.implicitHeight + 3 + valueHeight
 
         Text {
             id: labelText
@@ -85,13 +90,15 @@ ItemDelegate {
             font.pixelSize: Theme.textSize
         }
 
-        // A value that is not there is a short quiet stroke, not a text that somebody could take for one.
+        // A value that is not there is a short quiet stroke, not a text that somebody could take for one. It stands
+        // where the value would: below a label that leaves no room beside it.
         Rectangle {
+            id: stroke
             objectName: "missing"
 
-            visible: row.value === "" && !row.disclosure
-            anchors.verticalCenter: parent.verticalCenter
-            x: labelText.x + content.room - width
+            visible: content.isMissing
+            x: labelText.x + (content.beside ? content.room - width : 0)
+            y: valueText.y + (valueText.height - height) / 2
             width: Theme.textSize
             height: 2
             radius: 1

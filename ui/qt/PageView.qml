@@ -45,7 +45,7 @@ FocusScope {
         id: list
         objectName: "list"
 
-        readonly property real inset: Math.max(Theme.margin, (width - Theme.columnWidth) / 2)
+        readonly property real inset: Theme.inset(width)
 
         anchors.fill: parent
         focus: true

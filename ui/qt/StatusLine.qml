@@ -23,9 +23,9 @@ Rectangle {
 
         y: 9
         anchors.left: parent.left
-        anchors.leftMargin: Theme.margin + Theme.rowPadding
+        anchors.leftMargin: Theme.inset(line.width) + Theme.rowPadding
         anchors.right: parent.right
-        anchors.rightMargin: Theme.margin
+        anchors.rightMargin: Theme.inset(line.width)
         text: line.text
         textFormat: Text.PlainText
         wrapMode: Text.Wrap

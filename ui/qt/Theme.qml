@@ -61,6 +61,11 @@ QtObject {
     readonly property int radius: 12
     readonly property int focusWidth: 2
 
+    // How far the column of a page stands from both sides: on a desk it stays narrow, in the middle.
+    function inset(width: real): real {
+        return Math.max(margin, (width - columnWidth) / 2);
+    }
+
     // Milliseconds that a page takes to slide in.
     property int slide: 160
 }

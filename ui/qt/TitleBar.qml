@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// The bar above the page: the way back and the page's title.
+// The bar above the page: the way back and the page's title, which stands over its column where there is room.
 import QtQuick
 import QtQuick.Controls
 
@@ -12,6 +12,8 @@ Rectangle {
     property string context
     property bool canGoBack: false
 
+    readonly property real inset: Theme.inset(width)
+
     signal backRequested
 
     implicitHeight: Math.max(Theme.barHeight, texts.implicitHeight + 2 * 8)
@@ -22,7 +24,7 @@ Rectangle {
         objectName: "backButton"
 
         visible: bar.canGoBack
-        x: 4
+        x: texts.x - 4 - width
         anchors.verticalCenter: parent.verticalCenter
         width: Theme.rowHeight
         height: Theme.rowHeight
@@ -61,8 +63,8 @@ Rectangle {
         anchors.verticalCenter: parent.verticalCenter
         anchors.left: parent.left
         anchors.right: parent.right
-        anchors.leftMargin: bar.canGoBack ? Theme.rowHeight + 8 : Theme.margin + Theme.rowPadding
-        anchors.rightMargin: Theme.margin
+        anchors.leftMargin: Math.max(bar.inset + Theme.rowPadding, bar.canGoBack ? Theme.rowHeight + 8 : 0)
+        anchors.rightMargin: bar.inset
 
         Text {
             objectName: "context"

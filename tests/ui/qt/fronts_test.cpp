@@ -4,6 +4,7 @@
 #include <QGuiApplication>
 #include <QImage>
 #include <QTemporaryDir>
+#include <QTest>
 #include <QWindow>
 #include <sstream>
 
@@ -55,6 +56,20 @@ TEST_F(FrontTest, TheWindowEndsTheProgramWithStatus0WhenItIsClosed) {
       if (!window->isExposed()) continue;
       wasVisible = true;
       window->close();
+    }
+  });
+  EXPECT_EQ(run(*front), 0);
+  EXPECT_TRUE(wasVisible);
+}
+
+TEST_F(FrontTest, ControlQEndsTheProgramWithStatus0) {
+  const auto front = qt::makeWindowFront(argc, argv);
+  bool wasVisible = false;
+  const auto typing = front->scheduler().every(5ms, [&] {
+    for (auto* window : QGuiApplication::topLevelWindows()) {
+      if (!window->isExposed()) continue;
+      wasVisible = true;
+      QTest::keyClick(window, Qt::Key_Q, Qt::ControlModifier);
     }
   });
   EXPECT_EQ(run(*front), 0);

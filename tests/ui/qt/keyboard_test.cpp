@@ -135,6 +135,40 @@ TEST_F(WindowKeyboard, TabReachesTheBackButtonAndReturnPressesIt) {
   EXPECT_TRUE(list()->hasActiveFocus()) << "the list has the keyboard again";
 }
 
+TEST_F(WindowKeyboard, EveryKeyThatLeadsBackGoesBackOnePage) {
+  show();
+  for (const auto& [key, modifier] :
+       std::initializer_list<std::pair<Qt::Key, Qt::KeyboardModifiers>>{{Qt::Key_Escape, Qt::NoModifier},
+                                                                        {Qt::Key_Left, Qt::NoModifier},
+                                                                        {Qt::Key_Backspace, Qt::NoModifier},
+                                                                        {Qt::Key_Left, Qt::AltModifier},
+                                                                        {Qt::Key_Back, Qt::NoModifier}}) {
+    SCOPED_TRACE(key);
+    goTo("LTE", "RRC State");
+    press(key, modifier);
+    rest();
+    EXPECT_EQ(stack->depth(), 2u);
+    press(key, modifier);
+    rest();
+    EXPECT_EQ(stack->depth(), 1u);
+    press(key, modifier);
+    rest();
+    EXPECT_EQ(stack->depth(), 1u) << "the first page stays";
+    EXPECT_TRUE(window().isVisible());
+  }
+}
+
+TEST_F(WindowKeyboard, ControlQAndControlWCloseTheWindowFromAnyPage) {
+  for (const auto key : {Qt::Key_Q, Qt::Key_W}) {
+    show();
+    press(key);
+    EXPECT_TRUE(window().isVisible()) << "not without Control";
+    goTo("LTE", "RRC State");
+    press(key, Qt::ControlModifier);
+    EXPECT_TRUE(waitUntil([this] { return !window().isVisible(); }));
+  }
+}
+
 TEST_F(WindowKeyboard, EscapeGoesBackFromTheBackButtonToo) {
   show();
   clickRow("LTE");

@@ -64,6 +64,27 @@ class WindowLooks : public testing_ui::WindowTest {
         EXPECT_FALSE(drawn.intersects(label)) << textOf(text);
         label = drawn;
       }
+      auto* stroke = part(found, "missing");
+      if (!stroke->isVisible()) continue;
+      const QRectF place = stroke->mapRectToItem(found, stroke->boundingRect());
+      EXPECT_TRUE(QRectF(0, 0, found->width(), found->height()).contains(place)) << "the stroke of row " << index;
+      // Far enough from the letters to be no part of them.
+      EXPECT_FALSE(place.adjusted(-6, -6, 6, 6).intersects(label)) << "the stroke of row " << index;
+    }
+  }
+
+  // Around the item the picture shows nothing but the card.
+  void expectAloneInThePicture(QQuickItem* item) {
+    const QImage picture = window().grabWindow();
+    const QRect place = item->mapRectToScene(item->boundingRect()).toAlignedRect();
+    const QRect around = place.adjusted(-4, -4, 4, 4);
+    ASSERT_TRUE(picture.rect().contains(around));
+    EXPECT_NE(picture.pixelColor(place.center()), color("card")) << "the item itself is drawn";
+    for (int y = around.top(); y <= around.bottom(); ++y) {
+      for (int x = around.left(); x <= around.right(); ++x) {
+        if (place.contains(x, y)) continue;
+        ASSERT_EQ(picture.pixelColor(x, y), color("card")) << x << ", " << y;
+      }
     }
   }
 };
@@ -238,6 +259,64 @@ TEST_F(WindowLooks, AMissingValueLooksMissing) {
   store.filled[DisplayDictionary::myLTESCellInfoDict] = testing_ui::dictionaryOf(1);
   loop.advance(std::chrono::seconds(5));
   EXPECT_FALSE(part(row("field 0"), "missing")->isVisible());
+}
+
+TEST_F(WindowLooks, TheStrokeOfAMissingValueNeverTouchesItsLabelAtAnyTextSizeOrWidth) {
+  auto page = std::make_unique<testing_ui::HandPage>();
+  auto& rows = page->content.sections.emplace_back().rows;
+  // Every length from none to several lines, so that at each width some labels end where the stroke would begin.
+  const std::string name = "a_name_that_grows_until_it_is_longer_than_the_line_";
+  for (std::size_t length = 0; length <= 2 * name.size(); ++length) {
+    rows.push_back(testing_ui::valueRow((name + name).substr(0, length), ""));
+  }
+  rows.push_back(testing_ui::valueRow("names with blanks are wrapped at them, wherever that leads", ""));
+  showPage(std::move(page));
+  for (const double scale : {0.8, 1.0, 1.3, 1.6, 2.0}) {
+    for (const int width : {240, 360, 800}) {
+      SCOPED_TRACE(testing::Message() << "scale " << scale << ", width " << width);
+      window().resize(width, 720);
+      setLook(false, scale);
+      int seen = 0;
+      for (int index = 0; index < model().rowCount(); index += 4) {
+        constexpr int beginning = 0;  // ListView.Beginning
+        QMetaObject::invokeMethod(list(), "positionViewAtIndex", Q_ARG(int, index), Q_ARG(int, beginning));
+        rest();
+        expectNothingClipped();
+        QQuickItem* found = nullptr;
+        QMetaObject::invokeMethod(list(), "itemAtIndex", Q_RETURN_ARG(QQuickItem*, found), Q_ARG(int, index));
+        ASSERT_NE(found, nullptr);
+        auto* stroke = part(found, "missing");
+        ASSERT_TRUE(stroke->isVisible());
+        expectAloneInThePicture(stroke);
+        ++seen;
+      }
+      EXPECT_GT(seen, 20);
+    }
+  }
+}
+
+TEST_F(WindowLooks, TitlesStandOverTheirColumnOnADesk) {
+  store.filled[DisplayDictionary::myLTERRCStateDict] = testing_ui::dictionaryOf(2);
+  const auto left = [](QQuickItem* item) { return item->mapToScene(QPointF(0, 0)).x(); };
+  for (const double scale : {1.0, 2.0}) {
+    show({1280, 800});
+    setLook(false, scale);
+    auto* title = part(whole(), "title");
+    EXPECT_GT(left(title), 100);
+    EXPECT_EQ(left(title), left(part(row("LTE"), "label")));
+    goTo("LTE", "RRC State");
+    EXPECT_EQ(left(title), left(part(row("field 0"), "label")));
+    EXPECT_EQ(left(part(whole(), "context")), left(title));
+    EXPECT_EQ(left(part(whole(), "statusText")), left(title)) << "and the line below the list, too";
+    auto* back = part(whole(), "backButton");
+    EXPECT_LE(left(back) + back->width(), left(title));
+    EXPECT_GE(left(back) + back->width(), left(title) - 8) << "beside the title, not at the window's edge";
+  }
+  // A phone has no room for that: the button keeps its place at the edge.
+  window().resize(360, 720);
+  rest();
+  EXPECT_EQ(left(part(whole(), "backButton")), 4);
+  EXPECT_EQ(left(part(whole(), "title")), 56);
 }
 
 TEST_F(WindowLooks, LinesStayReadableOnAWideScreen) {

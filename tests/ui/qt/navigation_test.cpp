@@ -26,6 +26,19 @@ TEST_F(WindowNavigation, ClicksGoThroughTheListsToACategoryPage) {
   EXPECT_EQ(textOf(part(row("field 2"), "value")), "2");
 }
 
+TEST_F(WindowNavigation, TheWindowIsNamedAfterItsPageAndOnTheLaunchListAfterTheProgramAlone) {
+  show();
+  EXPECT_EQ(window().title().toStdString(), "probeview");
+  goTo("LTE", "RRC State");
+  EXPECT_EQ(window().title().toStdString(), "probeview – RRC State");
+  press(Qt::Key_Escape);
+  rest();
+  EXPECT_EQ(window().title().toStdString(), "probeview – LTE");
+  press(Qt::Key_Escape);
+  rest();
+  EXPECT_EQ(window().title().toStdString(), "probeview");
+}
+
 TEST_F(WindowNavigation, FingersGoTheSameWay) {
   show();
   for (const auto* label : {"UMTS", "RRC Configuration"}) {
