@@ -17,7 +17,7 @@ int applicationMain(std::string_view delegateClassName, Front& front,
   session.navigation().viewDidLoad();
   if (beforeShowing) beforeShowing(session);
   delegate->applicationDidBecomeActive();
-  const int status = front.run(session.navigation(), session.statusText());
+  const int status = front.run(session.navigation(), session.statusSource());
   delegate->applicationWillTerminate();
   return status;
 }

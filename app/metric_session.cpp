@@ -23,8 +23,12 @@ MetricSession::MetricSession(Front& front)
 
 MetricSession::~MetricSession() { mainQueue_.detach(); }
 
-StatusText MetricSession::statusText() const {
-  return [this] { return statusLine_.text(navigation_.myRadixWrapper->serviceStatus()); };
+StatusSource MetricSession::statusSource() const {
+  return [this] {
+    return statusLine_.status({.service = navigation_.myRadixWrapper->serviceStatus(),
+                               .feed = feedOfTopPage(navigation_),
+                               .isConfigurationMissing = navigation_.metricFileIsMissing()});
+  };
 }
 
 std::string MetricSession::serviceTrouble() const {

@@ -22,8 +22,8 @@ class MetricSession {
   ~MetricSession();
 
   RootNavigationController& navigation() { return navigation_; }
-  // Why the pages move or stand still. The session must outlive it.
-  StatusText statusText() const;
+  // Why the page on top moves or stands still. The session must outlive it.
+  StatusSource statusSource() const;
   // Why the service has never been there, for people; empty once it has.
   std::string serviceTrouble() const;
   // Whether the store has got what there is to get; to be asked often.

@@ -31,8 +31,12 @@ int runProbeview(int argc, const char* const* argv, const MakeWindow& makeWindow
                   "the terminal)")
       ->type_name("FILE");
   program.footer(
+      "Keys: arrows, Page Up, Page Down, Home and End move, Return opens; Esc, Backspace and Left go back. In the "
+      "window\n"
+      "Ctrl+Q and Ctrl+W end the program; in the terminal q does, and ? shows all keys.\n\n"
       "Environment:\n"
-      "  RADIXD_SOCKET    the service's socket (default: the user's service, else the system's)\n\n"
+      "  RADIXD_SOCKET    the service's socket (default: the user's service, else the system's)\n"
+      "  LC_ALL, LC_CTYPE, LANG    the terminal's pages are drawn in ASCII where the encoding is not UTF-8\n\n"
       "Exit status: 0 when all went well, 1 when the pages could not be shown or there is no service to print them "
       "of,\n"
       "2 when the command line was not understood.");

@@ -33,14 +33,26 @@ HandledMetrics handledMetricsInOrder() {
   return metrics;
 }
 
+const HandledMetrics& handledMetrics() {
+  static const HandledMetrics metrics = handledMetricsInOrder();
+  return metrics;
+}
+
 }  // namespace
 
 const HandledMetric* handledMetric(std::int64_t metricID) {
-  static const HandledMetrics metrics = handledMetricsInOrder();
+  const HandledMetrics& metrics = handledMetrics();
   const auto found =
       std::lower_bound(metrics.begin(), metrics.end(), metricID,
                        [](const HandledMetric& metric, std::int64_t id) { return metric.handler.metricID < id; });
   return found != metrics.end() && found->handler.metricID == metricID ? &*found : nullptr;
+}
+
+std::optional<std::int64_t> metricOf(DisplayDictionary dictionary) {
+  for (const HandledMetric& metric : handledMetrics()) {
+    if (metric.handler.dictionary == dictionary) return metric.handler.metricID;
+  }
+  return std::nullopt;
 }
 
 void formatTimestampAndLog(HandlerTurn& turn) {

@@ -3,6 +3,7 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <optional>
 #include <span>
 #include <string_view>
 
@@ -39,6 +40,9 @@ inline constexpr std::size_t handledMetricCount = 29;
 
 // The handled metric of exactly this identifier; null for one that nobody handles.
 const HandledMetric* handledMetric(std::int64_t metricID);
+
+// The metric whose latest message that dictionary holds; absent for the one that no handler stores into.
+std::optional<std::int64_t> metricOf(DisplayDictionary dictionary);
 
 // What every handler does that has nothing more to do.
 void formatTimestampAndLog(HandlerTurn& turn);

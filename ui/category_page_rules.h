@@ -5,10 +5,12 @@
 
 #include <cstdint>
 #include <optional>
+#include <span>
 #include <string_view>
 #include <variant>
 
 #include "store/metric_validator.h"
+#include "ui/list_page.h"
 #include "values/dictionary.h"
 
 namespace probeview {
@@ -42,6 +44,8 @@ enum class CellRule : std::uint8_t {
 struct CategoryPageRule {
   std::string_view key;
   PageSource source;
+  // The metrics that the page's content changes with, by the display dictionaries that hold their latest messages.
+  std::span<const DisplayDictionary> fedBy;
   SectionRule sections;
   std::string_view titlePrefix;  // a header is this and the section's number; empty: no header
   RowRule rows;
@@ -51,5 +55,7 @@ struct CategoryPageRule {
 // Exact and case-sensitive. A key that has no rule of its own gets the fallback: one section, no header, one row,
 // "Come back later".
 const CategoryPageRule& categoryPageRule(std::string_view key);
+
+PageFeed feedOf(const CategoryPageRule& rule);
 
 }  // namespace probeview

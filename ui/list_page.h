@@ -4,10 +4,13 @@
 // A front takes one snapshot per reload (ui/page_snapshot.h) and draws it; it decides nothing. Main thread.
 #pragma once
 
+#include <cstdint>
 #include <functional>
 #include <memory>
+#include <optional>
 #include <string>
 #include <utility>
+#include <vector>
 
 #include "ui/list_content.h"
 
@@ -15,6 +18,9 @@ namespace probeview {
 
 // Rows are as high as their content needs.
 inline constexpr double automaticDimension = -1.0;
+
+// The identifiers of the metrics that fill a page; empty where none does.
+using PageFeed = std::vector<std::int64_t>;
 
 class ListPage : public ListContent {
  public:
@@ -24,6 +30,9 @@ class ListPage : public ListContent {
 
   // For the navigation bar; never part of the list.
   virtual std::string title() const = 0;
+
+  // What fills the page; absent for one that shows no metric of its own, such as the lists that lead to others.
+  virtual std::optional<PageFeed> feed() const { return std::nullopt; }
 
   virtual double heightForRowAtIndexPath(std::size_t /*section*/, std::size_t /*row*/) const {
     return automaticDimension;

@@ -48,6 +48,13 @@ void NavigationStack::push(std::unique_ptr<ListPage> page) {
   if (observer_) observer_->didPush(topPage());
 }
 
+std::optional<PageFeed> feedOfTopPage(const NavigationStack& navigation) {
+  for (std::size_t index = navigation.depth(); index > 0; --index) {
+    if (auto feed = navigation.page(index - 1).feed()) return feed;
+  }
+  return std::nullopt;
+}
+
 std::string navigationPath(const NavigationStack& navigation) {
   std::string path;
   for (std::size_t index = 0; index < navigation.depth(); ++index) {

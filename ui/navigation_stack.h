@@ -61,6 +61,10 @@ class NavigationStack {
   NavigationObserver* observer_ = nullptr;
 };
 
+// What fills the page on top: a page that shows no metric of its own stands for the one that it was reached from.
+// Absent on the lists.
+std::optional<PageFeed> feedOfTopPage(const NavigationStack& navigation);
+
 // The titles of the stack's pages, from the root to the top, as "probeview › LTE › Tx Power".
 std::string navigationPath(const NavigationStack& navigation);
 

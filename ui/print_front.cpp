@@ -11,7 +11,7 @@
 
 namespace probeview {
 
-int PrintFront::run(NavigationStack& navigation, const StatusText& status) {
+int PrintFront::run(NavigationStack& navigation, const StatusSource& status) {
   // Who asks for text is not to wait for a service that is not there.
   if (hasFailed()) return 1;
   if (isFilled_) {
@@ -21,7 +21,7 @@ int PrintFront::run(NavigationStack& navigation, const StatusText& status) {
     if (hasFailed()) return 1;
   }
   const bool onePage = navigation.depth() > 1;
-  if (onePage ? printTopPage(navigation) : printBelow(navigation)) write(status() + "\n");
+  if (onePage ? printTopPage(navigation) : printBelow(navigation)) write(status().text + "\n");
   // A reader that has gone away has seen enough.
   if (trouble_ == 0 || trouble_ == EPIPE) return 0;
   if (errors_ != nullptr) *errors_ << "the pages could not be written: " << std::strerror(trouble_) << "\n";

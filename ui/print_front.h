@@ -36,7 +36,7 @@ class PrintFront final : public Front {
   TaskQueue& mainQueue() override { return loop_; }
   Scheduler& scheduler() override { return loop_; }
   // Prints every page that the launch list leads to; where the stack stands on another page, that page alone.
-  int run(NavigationStack& navigation, const StatusText& status) override;
+  int run(NavigationStack& navigation, const StatusSource& status) override;
 
  private:
   // Whether nothing can come; then it has said so.

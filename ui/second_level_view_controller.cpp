@@ -3,6 +3,7 @@
 
 #include "platform/fatal_error.h"
 #include "ui/category_page.h"
+#include "ui/category_page_rules.h"
 
 namespace probeview {
 
@@ -13,6 +14,8 @@ SecondLevelViewController::SecondLevelViewController(const PageEnvironment& envi
       consoleLog_(environment.consoleLog) {}
 
 std::string SecondLevelViewController::title() const { return seguedThroughRow.value_or(""); }
+
+std::optional<PageFeed> SecondLevelViewController::feed() const { return feedOf(categoryPageRule(key())); }
 
 std::size_t SecondLevelViewController::numberOfSectionsInTableView() {
   return CategoryPage(key(), myMetricValidator, consoleLog_).numberOfSectionsInTableView();

@@ -28,6 +28,7 @@ class SecondLevelViewController final : public ListPage {
   const MetricValidator& myMetricValidator;
 
   std::string title() const override;
+  std::optional<PageFeed> feed() const override;
   std::size_t numberOfSectionsInTableView() override;
   std::optional<std::string> titleForHeaderInSection(std::size_t section) override;
   std::size_t numberOfRowsInSection(std::size_t section) override;

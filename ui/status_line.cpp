@@ -3,6 +3,10 @@
 
 #include <algorithm>
 #include <cstdint>
+#include <vector>
+
+#include "values/plain_text.h"
+#include "values/printer.h"
 
 namespace probeview {
 
@@ -15,6 +19,90 @@ std::int64_t floorDivided(std::int64_t number, std::int64_t divisor) {
 }
 
 std::string twoDigits(std::int64_t number) { return (number < 10 ? "0" : "") + std::to_string(number); }
+
+// Bytes of what others say that the line has room for.
+constexpr std::size_t longestOrigin = 64;
+constexpr std::size_t longestReason = 240;
+
+// What another program says, as it may stand in the line.
+std::string shown(std::string_view text, std::size_t longest) {
+  std::string valid;
+  appendValidUtf8(beginningOf(text, longest), valid);
+  return onOneLine(valid) + (text.size() > longest ? "…" : "");
+}
+
+std::string withReason(std::string_view what, const std::string& reason) {
+  return reason.empty() ? std::string(what) : std::string(what) + ": " + shown(reason, longestReason);
+}
+
+using radix::client::SourceState;
+using Kind = Status::Kind;
+
+bool isRunning(const SourceState& source) { return source.phase == SourceState::Phase::Running; }
+
+// Where several bear the name, one that runs speaks for them.
+const SourceState* sourceNamed(const std::vector<SourceState>& sources, const std::string& origin) {
+  const SourceState* found = nullptr;
+  for (const auto& source : sources) {
+    if (source.origin == origin && (found == nullptr || isRunning(source))) found = &source;
+  }
+  return found;
+}
+
+Kind kindOf(const SourceState& source) {
+  switch (source.phase) {
+    case SourceState::Phase::Running:
+      return Kind::Live;
+    case SourceState::Phase::Ended:
+      return Kind::Ended;
+    case SourceState::Phase::Failed:
+      return Kind::Failed;
+  }
+  return Kind::Live;
+}
+
+// How a source that no longer runs has come to its end.
+std::string endOf(const SourceState& source) {
+  if (source.phase == SourceState::Phase::Failed) return withReason("source failed", source.reason);
+  return source.origin.starts_with("trace:") ? "trace ended" : "source ended";
+}
+
+std::string named(const SourceState& source) {
+  return source.origin.empty() ? "a source without name" : shown(source.origin, longestOrigin);
+}
+
+// "a", "a and b", or the text where they are more.
+std::string named(const std::vector<const SourceState*>& sources, const std::string& ofMany) {
+  if (sources.size() > 2) return ofMany;
+  return sources.size() == 1 ? named(*sources[0]) : named(*sources[0]) + " and " + named(*sources[1]);
+}
+
+// Why no record has come for a page, or for the lists.
+Status nothingYet(const std::vector<SourceState>& sources, const std::optional<PageFeed>& feed) {
+  if (sources.empty()) return {Kind::Unfillable, "the baseband service has no source"};
+  std::vector<const SourceState*> all;
+  std::vector<const SourceState*> able;
+  std::vector<const SourceState*> running;
+  const SourceState* failed = nullptr;
+  for (const auto& source : sources) {
+    all.push_back(&source);
+    const auto fills = [&](std::int64_t metric) {
+      return std::find(source.metrics.begin(), source.metrics.end(), metric) != source.metrics.end();
+    };
+    if (feed && std::none_of(feed->begin(), feed->end(), fills)) continue;
+    able.push_back(&source);
+    if (isRunning(source)) running.push_back(&source);
+    if (source.phase == SourceState::Phase::Failed && failed == nullptr) failed = &source;
+  }
+  const auto count = [](const auto& many) { return std::to_string(many.size()) + " sources"; };
+  if (able.empty())
+    return {Kind::Unfillable,
+            named(all, "none of the " + count(all)) + " can" + (all.size() > 2 ? "" : "not") + " fill this page"};
+  if (!running.empty())
+    return {Kind::Waiting, "nothing received yet from " + named(running, "any of " + count(running))};
+  const auto& gone = failed != nullptr ? *failed : *able.front();
+  return {kindOf(gone), named(gone) + " · " + endOf(gone) + (failed != nullptr ? "" : ", nothing received")};
+}
 
 }  // namespace
 
@@ -30,21 +118,83 @@ std::string ageText(std::chrono::nanoseconds age) {
   return std::to_string(seconds / secondsPerDay) + " d";
 }
 
-std::string StatusLine::text(const ServiceStatus& status) const {
-  const auto& connection = status.connection;
-  const auto& lastRecord = status.lastRecord;
-  if (!connection.connected) {
-    // Why it does not come is worth its place: who waits may be waiting at the wrong socket.
-    if (!connection.everConnected) {
-      return "Waiting for the baseband service" + (connection.trouble.empty() ? "" : " · " + connection.trouble);
-    }
-    return "Baseband service away since " + localTime(connection.since) +
-           (lastRecord ? ", showing what was last known" : ", nothing received yet");
+Status StatusLine::status(const StatusFacts& facts) const {
+  const auto& connection = facts.service.connection;
+  if (!connection.connected) return away(facts);
+  if (facts.isConfigurationMissing) return {Kind::Failed, "no configuration: resource missing"};
+  if (connection.configuration == ConfigurationOutcome::Refused) {
+    return {Kind::Failed, withReason("configuration refused", connection.configurationTrouble)};
   }
-  if (!lastRecord) return "Connected to the baseband service, nothing received yet";
-  // When the values reached us, not when they were measured: a replayed drive may be years old and yet alive.
-  const auto age = ageText(clock_.monotonicTime() - lastRecord->receivedMonotonicTime) + " ago";
-  return lastRecord->origin.empty() ? "Last record " + age : lastRecord->origin + " · " + age;
+  if (facts.feed && facts.feed->empty()) return {Kind::Unfillable, "no metric fills this page"};
+  if (const auto* record = youngestOf(facts)) return filled(facts.service, *record);
+  if (connection.configuration == ConfigurationOutcome::Unsent) {
+    return {Kind::Waiting, withReason("configuration not taken yet", connection.configurationTrouble)};
+  }
+  if (connection.configuration == ConfigurationOutcome::NotPushed) {
+    return {Kind::Waiting, "no configuration pushed, nothing received yet"};
+  }
+  if (connection.sources) return nothingYet(*connection.sources, facts.feed);
+  return {Kind::Waiting, facts.feed ? "Connected to the baseband service, nothing received yet for this page"
+                                    : "Connected to the baseband service, nothing received yet"};
+}
+
+Status StatusLine::away(const StatusFacts& facts) const {
+  const auto& connection = facts.service.connection;
+  if (!connection.everConnected) {
+    if (connection.trouble.empty()) return {Kind::Waiting, "Waiting for the baseband service"};
+    // Why it does not come is worth its place: who waits may be waiting at the wrong socket.
+    return {Kind::Away, "Waiting for the baseband service · " + shown(connection.trouble, longestReason)};
+  }
+  return {Kind::Away, "Baseband service away since " + localTime(connection.since) +
+                          (youngestOf(facts) ? ", showing what was last known" : ", nothing received yet")};
+}
+
+Status StatusLine::filled(const ServiceStatus& service, const Record& record) const {
+  // How old the values are, not when they were measured: a replayed drive may be years old and yet alive.
+  const auto age = ageText(ageOf(record));
+  const auto origin = shown(record.origin, longestOrigin);
+  const auto line = origin.empty() ? "Last record " + age + " ago" : origin + " · " + age + " ago";
+  if (service.connection.sources && !record.origin.empty()) {
+    const auto* source = sourceNamed(*service.connection.sources, record.origin);
+    if (source == nullptr) return {Kind::Ended, line + " · no longer a source"};
+    if (source->phase != SourceState::Phase::Running) return {kindOf(*source), line + " · " + endOf(*source)};
+  }
+  if (!isStale(record)) return {Kind::Live, line};
+  const auto silence = silenceOf(service, record.origin);
+  // Other metrics of a source that runs may go on: a phone that has left a cell no longer measures it.
+  if (origin.empty() || silence <= leastStaleAge) return {Kind::Stale, line + ", stale"};
+  const auto silent = "source silent for " + ageText(silence);
+  return {Kind::Stale, (ageText(silence) == age ? origin : line) + " · " + silent};
+}
+
+std::chrono::nanoseconds StatusLine::ageOf(const Record& record) const {
+  return record.age.value_or(std::chrono::milliseconds(0)) + clock_.monotonicTime() - record.receivedMonotonicTime;
+}
+
+bool StatusLine::isStale(const Record& record) const {
+  if (!record.period || record.period->count() == 0) return false;
+  return ageOf(record) > std::max<std::chrono::nanoseconds>(leastStaleAge, stalePeriods * *record.period);
+}
+
+std::chrono::nanoseconds StatusLine::silenceOf(const ServiceStatus& service, const std::string& origin) const {
+  auto silence = std::chrono::nanoseconds::max();
+  for (const auto& [metric, record] : service.lastRecords) {
+    if (record.origin == origin) silence = std::min(silence, ageOf(record));
+  }
+  if (service.lastRecord && service.lastRecord->origin == origin)
+    silence = std::min(silence, ageOf(*service.lastRecord));
+  return silence;
+}
+
+const StatusLine::Record* StatusLine::youngestOf(const StatusFacts& facts) const {
+  if (!facts.feed) return facts.service.lastRecord ? &*facts.service.lastRecord : nullptr;
+  const Record* youngest = nullptr;
+  for (const auto metric : *facts.feed) {
+    const auto found = facts.service.lastRecords.find(metric);
+    if (found == facts.service.lastRecords.end()) continue;
+    if (youngest == nullptr || ageOf(found->second) < ageOf(*youngest)) youngest = &found->second;
+  }
+  return youngest;
 }
 
 std::string StatusLine::localTime(std::chrono::milliseconds wallTime) const {

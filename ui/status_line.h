@@ -2,33 +2,63 @@
 #pragma once
 
 #include <chrono>
+#include <optional>
 #include <string>
+#include <string_view>
 
 #include "client/radix_wrapper.h"
 #include "platform/clock.h"
 #include "platform/time_zone.h"
+#include "ui/list_page.h"
+#include "ui/status.h"
 
 namespace probeview {
 
-// Puts into one line why the pages move or stand still: whether the service is there, what feeds it and how old the
-// last record is. Times of day are local, ages count on the clock that only goes forward. Main thread.
+// What the line is about.
+struct StatusFacts {
+  const ServiceStatus& service;
+  // What fills the page above the line (feedOfTopPage); absent on the lists, whose line speaks of all records.
+  std::optional<PageFeed> feed{};
+  // Whether the configuration that the session was to push is not among the program's resources.
+  bool isConfigurationMissing = false;
+};
+
+// Puts into one line why the page above it moves or stands still: whether the service is there and has taken the
+// configuration, which source fills the page, how old its values are and whether more are to come. The youngest record
+// of the page's metrics counts. Times of day are local; a record's age is how old it was when it left the service and
+// what has gone by since, on the clock that only goes forward. Main thread.
 //
 //   scenario:city · 0.4 s ago
-//   Connected to the baseband service, nothing received yet
-//   Waiting for the baseband service · you may not connect to the baseband service at /run/radixd/radix.sock
+//   nothing received yet from scenario:city
+//   scenario:city · source silent for 2 min
+//   trace:drive.csv · 3 min ago · trace ended
+//   trace:drive.csv cannot fill this page
 //   Baseband service away since 12:03:10, showing what was last known
 class StatusLine {
  public:
   // How often a front asks for the line anew: seconds count, tenths need not be followed.
   static constexpr std::chrono::nanoseconds refreshInterval = std::chrono::seconds(1);
+  // A record that comes at a period is stale when it is older than both: so long, and so many periods. One that comes
+  // on change, or because it was asked for, never is while its source runs; nor one of a service that names no period.
+  static constexpr std::chrono::nanoseconds leastStaleAge = std::chrono::seconds(10);
+  static constexpr int stalePeriods = 3;
 
   // Both must outlive the line.
   explicit StatusLine(const Clock& clock = systemClock(), const TimeZone& zone = deviceTimeZone())
       : clock_(clock), zone_(zone) {}
 
-  std::string text(const ServiceStatus& status) const;
+  Status status(const StatusFacts& facts) const;
 
  private:
+  using Record = ServiceStatus::LastRecord;
+
+  Status away(const StatusFacts& facts) const;
+  Status filled(const ServiceStatus& service, const Record& record) const;
+  std::chrono::nanoseconds ageOf(const Record& record) const;
+  bool isStale(const Record& record) const;
+  // How old the youngest record of that origin is.
+  std::chrono::nanoseconds silenceOf(const ServiceStatus& service, const std::string& origin) const;
+  const Record* youngestOf(const StatusFacts& facts) const;
   std::string localTime(std::chrono::milliseconds wallTime) const;
 
   const Clock& clock_;

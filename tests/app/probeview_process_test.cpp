@@ -48,6 +48,13 @@ TEST(Programs, PrintShowsEveryPageOnceWhenEveryMetricHasComeAndEndsWell) {
   EXPECT_NE(shown.output.find("\nscenario:city · "), std::string::npos);
 }
 
+TEST(Programs, TheLineBelowAPageSpeaksOfThatPage) {
+  RadixdProcess radixd("scenario:city,seed=1");
+  ASSERT_TRUE(radixd.start());
+  EXPECT_NE(run(probectl + " pages 'LTE RRC State'").output.find("\n\nscenario:city · "), std::string::npos);
+  EXPECT_TRUE(run(probectl + " pages 'LTE Tx Power'").output.ends_with("\n\nno metric fills this page\n"));
+}
+
 TEST(Programs, TheConsoleLogGoesToTheFileThatIsNamed) {
   RadixdProcess radixd("scenario:city,seed=1");
   ASSERT_TRUE(radixd.start());

@@ -115,7 +115,7 @@ TEST_F(RealService, KillingAndRestartingItUnderARunningSessionResumesWithinSixSe
   const int reloadsBefore = reloads;
   ASSERT_TRUE(until([&] { return reloads > reloadsBefore; }));
   EXPECT_EQ(shown, known) << "a page that reloads while the service is away shows what was last known";
-  EXPECT_NE(StatusLine().text(wrapper.serviceStatus()).find("away since"), std::string::npos);
+  EXPECT_NE(StatusLine().status({wrapper.serviceStatus()}).text.find("away since"), std::string::npos);
 
   const auto wentAway = systemClock().monotonicTime();
   ASSERT_TRUE(radixd.start());
@@ -128,7 +128,7 @@ TEST_F(RealService, KillingAndRestartingItUnderARunningSessionResumesWithinSixSe
       6s));
   EXPECT_LT(systemClock().monotonicTime() - restarted, 6s);
   EXPECT_TRUE(wrapper.serviceStatus().connection.connected);
-  EXPECT_EQ(StatusLine().text(wrapper.serviceStatus()).find("scenario:city · "), 0u);
+  EXPECT_EQ(StatusLine().status({wrapper.serviceStatus()}).text.find("scenario:city · "), 0u);
 }
 
 TEST_F(RealService, ASessionStartedBeforeTheServiceWaitsAndFillsWhenItComes) {

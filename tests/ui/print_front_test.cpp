@@ -44,7 +44,7 @@ class Printing : public testing_ui::PagesTest {
   Pipe pipe;
   PrintFront front{pipe.writing.number()};
   NavigationStack stack{InterfaceDescription(PageEnvironment{front.mainQueue(), front.scheduler(), console, store})};
-  const StatusText status = [] { return "the status"; };
+  const StatusSource status = [] { return Status{Status::Kind::Live, "the status"}; };
 };
 
 TEST_F(Printing, EveryPageIsPrintedOnceInTheOrderOfTheListsAndThenTheStatus) {

@@ -71,6 +71,7 @@ ApplicationWindow {
     footer: StatusLine {
         visible: text !== ""
         text: window.viewer.statusText
+        kind: window.viewer.statusKind
     }
 
     Component {

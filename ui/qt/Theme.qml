@@ -33,6 +33,17 @@ QtObject {
     readonly property color missing: dark ? "#8b9ba4" : "#5a6870"
     readonly property color accent: dark ? "#63cfe3" : "#00627a"
 
+    // What is amiss, in the line below the list. Each has a mark of its own, too.
+    readonly property color stale: dark ? "#f0b44c" : "#855000"
+    readonly property color ended: dark ? "#b9adf5" : "#5b4a9c"
+    readonly property color failed: dark ? "#ff8f86" : "#b3261e"
+    readonly property color away: dark ? "#f493c6" : "#9c2767"
+
+    // The colour of each kind of status, by its name.
+    readonly property var statusColors: ({
+        live: label, waiting: label, unfillable: label, stale: stale, ended: ended, failed: failed, away: away
+    })
+
     // Which colour stands on which ground; the contrast of each pair is tested in both looks.
     readonly property var textPairs: [
         [text, ground], [text, bar], [text, card], [text, cardHovered], [text, cardPressed], [text, cardSelected],
@@ -40,7 +51,8 @@ QtObject {
         [value, card], [value, cardHovered], [value, cardPressed], [value, cardSelected],
         [missing, card], [missing, cardHovered], [missing, cardPressed], [missing, cardSelected],
         [accent, ground], [accent, bar], [accent, card], [accent, cardHovered], [accent, cardPressed],
-        [accent, cardSelected]
+        [accent, cardSelected],
+        [stale, bar], [ended, bar], [failed, bar], [away, bar]
     ]
 
     // Text sizes in pixels.

@@ -47,7 +47,7 @@ class PicturesFrontOnQt final : public PicturesFront {
   Scheduler& scheduler() override { return scheduler_; }
   void waitUntil(std::function<bool()> isFilled) override { isFilled_ = std::move(isFilled); }
 
-  int run(NavigationStack& navigation, const StatusText& status) override {
+  int run(NavigationStack& navigation, const StatusSource& status) override {
     waitForContent();
     std::vector<QImage> lights;
     std::vector<QImage> darks;
@@ -87,7 +87,7 @@ class PicturesFrontOnQt final : public PicturesFront {
   }
 
   // The page that the stack stands on, in both looks.
-  void draw(NavigationStack& navigation, const StatusText& status, std::vector<QImage>& lights,
+  void draw(NavigationStack& navigation, const StatusSource& status, std::vector<QImage>& lights,
             std::vector<QImage>& darks) {
     Viewer viewer(navigation, status, scheduler_, appearance_);
     Window window(viewer);

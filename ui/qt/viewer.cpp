@@ -19,9 +19,9 @@ QString equalWidthFamily() {
 
 }  // namespace
 
-Viewer::Viewer(NavigationStack& stack, StatusText status, Scheduler& scheduler, Appearance& appearance)
+Viewer::Viewer(NavigationStack& stack, StatusSource status, Scheduler& scheduler, Appearance& appearance)
     : stack_(stack), appearance_(appearance), valueFamily_(equalWidthFamily()), status_(std::move(status)) {
-  for (std::size_t page = 0; page < stack_.depth(); ++page) didPush(stack_.page(page));
+  for (std::size_t page = 0; page < stack_.depth(); ++page) pages_.push_back(new PageModel(stack_.page(page), this));
   stack_.setObserver(this);
   connect(&appearance, &Appearance::changed, this, &Viewer::appearanceChanged);
   if (!status_) return;
@@ -32,9 +32,10 @@ Viewer::Viewer(NavigationStack& stack, StatusText status, Scheduler& scheduler, 
 Viewer::~Viewer() { stack_.setObserver(nullptr); }
 
 void Viewer::refreshStatus() {
-  const auto text = QString::fromStdString(status_());
-  if (statusText_ == text) return;
-  statusText_ = text;
+  if (!status_) return;
+  auto status = status_();
+  if (shownStatus_ == status) return;
+  shownStatus_ = std::move(status);
   emit statusChanged();
 }
 
@@ -48,13 +49,19 @@ QObject* Viewer::open(int row) {
   return stack_.tap(cell) ? topPage() : nullptr;
 }
 
-void Viewer::back() { stack_.pop(); }
+void Viewer::back() {
+  // The line speaks of the page that is on top.
+  if (stack_.pop()) refreshStatus();
+}
 
 void Viewer::release(QObject* page) {
   if (page) page->deleteLater();
 }
 
-void Viewer::didPush(ListPage& page) { pages_.push_back(new PageModel(page, this)); }
+void Viewer::didPush(ListPage& page) {
+  pages_.push_back(new PageModel(page, this));
+  refreshStatus();
+}
 
 void Viewer::willPop(ListPage&) {
   pages_.back()->detach();

@@ -21,18 +21,21 @@ class Viewer final : public QObject, private NavigationObserver {
   Q_PROPERTY(double textScale READ textScale NOTIFY appearanceChanged FINAL)
   Q_PROPERTY(QString valueFamily READ valueFamily CONSTANT FINAL)
   Q_PROPERTY(QString statusText READ statusText NOTIFY statusChanged FINAL)
+  // The name of the line's kind (statusKindName).
+  Q_PROPERTY(QString statusKind READ statusKind NOTIFY statusChanged FINAL)
   // The pages that the stack held when the window was made, from the root on.
   Q_PROPERTY(QList<QObject*> firstPages READ firstPages CONSTANT FINAL)
 
  public:
   // The stack may already stand on any page. An empty status function means no status line. All outlive the viewer.
-  Viewer(NavigationStack& stack, StatusText status, Scheduler& scheduler, Appearance& appearance);
+  Viewer(NavigationStack& stack, StatusSource status, Scheduler& scheduler, Appearance& appearance);
   ~Viewer() override;
 
   bool dark() const { return appearance_.dark(); }
   double textScale() const { return appearance_.textScale(); }
   QString valueFamily() const { return valueFamily_; }
-  QString statusText() const { return statusText_; }
+  QString statusText() const { return QString::fromStdString(shownStatus_.text); }
+  QString statusKind() const { return QString::fromUtf8(statusKindName(shownStatus_.kind)); }
   QList<QObject*> firstPages() const;
   PageModel* topPage() const { return pages_.back(); }
 
@@ -54,8 +57,8 @@ class Viewer final : public QObject, private NavigationObserver {
   NavigationStack& stack_;
   Appearance& appearance_;
   QString valueFamily_;
-  StatusText status_;
-  QString statusText_;
+  StatusSource status_;
+  Status shownStatus_;
   ScheduledTaskHandle statusTimer_;
   std::vector<PageModel*> pages_;  // one per page of the stack; children of this object
 };

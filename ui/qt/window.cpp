@@ -27,7 +27,7 @@ class WindowFront final : public Front {
   TaskQueue& mainQueue() override { return mainQueue_; }
   Scheduler& scheduler() override { return scheduler_; }
 
-  int run(NavigationStack& navigation, const StatusText& status) override {
+  int run(NavigationStack& navigation, const StatusSource& status) override {
     Viewer viewer(navigation, status, scheduler_, appearance_);
     Window window(viewer);
     const auto show = [&window] { window.quickWindow().setVisible(true); };

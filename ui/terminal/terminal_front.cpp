@@ -26,9 +26,10 @@ constexpr int backspaceKey = 8;
 // How long a lone Esc waits for the rest of a key's sequence.
 constexpr int escapeDelayMilliseconds = 25;
 
-// Characters need a locale whose encoding is UTF-8; nothing else of the locale is taken over.
+// The widths of characters come from a locale whose encoding is UTF-8, also where none but ASCII is written; nothing
+// else of the locale is taken over.
 void chooseCharacters() {
-  if (std::setlocale(LC_CTYPE, "") && std::strcmp(::nl_langinfo(CODESET), "UTF-8") == 0) return;
+  if (std::setlocale(LC_CTYPE, "") && characterSetOf(::nl_langinfo(CODESET)) == CharacterSet::Unicode) return;
   std::setlocale(LC_CTYPE, "C.UTF-8");
 }
 
@@ -36,8 +37,39 @@ void leaveScreen() {
   if (!::isendwin()) ::endwin();
 }
 
-void write(int line, int column, std::wstring_view text) {
-  ::mvaddnwstr(line, column, text.data(), static_cast<int>(text.size()));
+// What is amiss has a colour that can be read on a dark ground and on a light one; 0 is the terminal's own.
+short colorOf(Status::Kind kind) {
+  switch (kind) {
+    case Status::Kind::Live:
+    case Status::Kind::Waiting:
+    case Status::Kind::Unfillable:
+      return 0;
+    case Status::Kind::Stale:
+      return COLOR_YELLOW;
+    case Status::Kind::Ended:
+      return COLOR_CYAN;
+    case Status::Kind::Failed:
+      return COLOR_RED;
+    case Status::Kind::Away:
+      return COLOR_MAGENTA;
+  }
+  return 0;
+}
+
+void prepareColors() {
+  if (!::has_colors()) return;
+  ::start_color();
+  ::use_default_colors();
+  // A pair is named by its colour.
+  for (const short color : std::initializer_list<short>{COLOR_YELLOW, COLOR_CYAN, COLOR_RED, COLOR_MAGENTA}) {
+    ::init_pair(color, color, -1);
+  }
+}
+
+attr_t attributesOf(Status::Kind kind) {
+  const short color = colorOf(kind);
+  if (color == 0) return A_NORMAL;
+  return ::has_colors() ? static_cast<attr_t>(COLOR_PAIR(color)) : A_BOLD;
 }
 
 }  // namespace
@@ -73,7 +105,20 @@ class TerminalFront::Views final : public NavigationObserver {
   std::vector<std::unique_ptr<ListView>> views_;
 };
 
-std::unique_ptr<TerminalFront> TerminalFront::make(std::string& error) {
+std::string TerminalFront::localeEncoding() {
+  if (std::setlocale(LC_CTYPE, "")) return ::nl_langinfo(CODESET);
+  // A locale that is not installed, as it often is behind a remote shell: its name tells the encoding all the same.
+  for (const char* variable : {"LC_ALL", "LC_CTYPE", "LANG"}) {
+    const char* const value = std::getenv(variable);
+    if (!value || !*value) continue;
+    const std::string_view name(value);
+    const auto point = name.find('.');
+    return std::string(point == std::string_view::npos ? "" : name.substr(point + 1, name.find('@') - point - 1));
+  }
+  return {};
+}
+
+std::unique_ptr<TerminalFront> TerminalFront::make(std::string& error, std::string_view encoding) {
   if (!::isatty(STDIN_FILENO) || !::isatty(STDOUT_FILENO)) {
     error = "standard input and output are no terminal; --print writes the pages as plain text";
     return nullptr;
@@ -88,10 +133,10 @@ std::unique_ptr<TerminalFront> TerminalFront::make(std::string& error) {
             "\"; set TERM to one that is known, such as xterm, or use --print";
     return nullptr;
   }
-  return std::unique_ptr<TerminalFront>(new TerminalFront);
+  return std::unique_ptr<TerminalFront>(new TerminalFront(characterSetOf(encoding)));
 }
 
-TerminalFront::TerminalFront() {
+TerminalFront::TerminalFront(CharacterSet characterSet) : characterSet_(characterSet) {
   loop_.onSignals({SIGWINCH, SIGINT, SIGTERM, SIGHUP}, [this](int signal) {
     if (signal == SIGWINCH) {
       resize();
@@ -103,7 +148,7 @@ TerminalFront::TerminalFront() {
 
 TerminalFront::~TerminalFront() = default;
 
-int TerminalFront::run(NavigationStack& navigation, const StatusText& status) {
+int TerminalFront::run(NavigationStack& navigation, const StatusSource& status) {
   navigation_ = &navigation;
   status_ = status;
   chooseCharacters();
@@ -120,6 +165,7 @@ int TerminalFront::run(NavigationStack& navigation, const StatusText& status) {
   ::define_key("\x1b[C", KEY_RIGHT);
   ::define_key("\x1b[D", KEY_LEFT);
   ::curs_set(0);
+  prepareColors();
   addFatalErrorFlush(leaveScreen);
 
   views_ = std::make_unique<Views>(*this);
@@ -141,6 +187,10 @@ void TerminalFront::readKeys() {
 }
 
 void TerminalFront::handleKey(int key) {
+  // The news that the size has changed is no key of a person's.
+  if (key == KEY_RESIZE) return;
+  // Any key closes the list of keys and does nothing else.
+  if (std::exchange(showsKeys_, false)) return;
   auto& view = views_->top();
   switch (key) {
     case KEY_UP:
@@ -169,6 +219,9 @@ void TerminalFront::handleKey(int key) {
     case KEY_LEFT:
       navigation_->pop();
       return;
+    case '?':
+      showsKeys_ = true;
+      return;
     case 'q':
     case 'Q':
       return loop_.stop();
@@ -187,19 +240,46 @@ void TerminalFront::resize() {
   draw();
 }
 
+void TerminalFront::write(int line, int column, std::wstring_view text) const {
+  const auto written = characterSet_ == CharacterSet::Ascii ? inAscii(text) : std::wstring(text);
+  ::mvaddnwstr(line, column, written.data(), static_cast<int>(written.size()));
+}
+
+void TerminalFront::drawLine(int y) const {
+  ::mvhline(y, 0, characterSet_ == CharacterSet::Ascii ? '-' : ACS_HLINE, COLS);
+}
+
 void TerminalFront::draw() {
   ::erase();
   const int width = COLS;
-  const auto line = [&](int y) { ::mvhline(y, 0, ACS_HLINE, width); };
+  const int bottom = 2 + Views::listHeight();
 
   // Where one is: the titles of the pages, one below the other.
   ::attron(A_BOLD);
-  write(0, 1, shortened(characters(navigationPath(*navigation_)), width - 2));
+  write(0, 1, shortened(showsKeys_ ? L"Keys" : characters(navigationPath(*navigation_)), width - 2));
   ::attroff(A_BOLD);
-  line(1);
+  drawLine(1);
+  drawLine(bottom);
+  showsKeys_ ? drawKeys() : drawPage(views_->top());
 
-  const auto& view = views_->top();
+  // The keys stand in the line above the status, so that neither takes the other's room. The line shows on both sides,
+  // and at its end the mark that there is more below.
+  const auto keys = showsKeys_ ? std::wstring(L"any key closes this") : keyHints(navigation_->depth() > 1, width - 8);
+  if (!keys.empty() && columns(keys) <= width - 8) {
+    const int column = width - 6 - columns(keys);
+    write(bottom, column, L" ");
+    ::attron(A_DIM);
+    write(bottom, column + 1, keys);
+    ::attroff(A_DIM);
+    write(bottom, width - 5, L" ");
+  }
+  drawStatus(bottom + 1);
+  ::refresh();
+}
+
+void TerminalFront::drawPage(const ListView& view) const {
   const auto& layout = view.layout();
+  const int width = COLS;
   const int height = Views::listHeight();
   for (int y = 0; y < height; ++y) {
     const auto index = view.firstLine() + static_cast<std::size_t>(y);
@@ -226,22 +306,26 @@ void TerminalFront::draw() {
       }
     }
   }
-  line(2 + height);
   if (view.hasMoreAbove()) write(1, width - 3, L"↑");
   if (view.hasMoreBelow()) write(2 + height, width - 3, L"↓");
+}
 
-  const std::wstring keys = navigation_->depth() > 1 ? L"↑↓ Return  Esc back  q quit" : L"↑↓ Return  q quit";
-  const int keysWidth = columns(keys);
-  const auto status = characters(status_());
-  // The status goes first; the keys show where there is room beside it.
-  const bool hasRoom = columns(status) + keysWidth + 4 <= width;
-  write(3 + height, 1, shortened(status, width - 2));
-  if (hasRoom) {
-    ::attron(A_DIM);
-    write(3 + height, width - 1 - keysWidth, keys);
-    ::attroff(A_DIM);
+void TerminalFront::drawKeys() const {
+  const auto lines = helpLines(characterSet_);
+  for (int y = 0; y < Views::listHeight() && y < static_cast<int>(lines.size()); ++y) {
+    const auto& [sign, meaning] = lines[static_cast<std::size_t>(y)];
+    write(2 + y, 2, shortened(sign, COLS - 3));
+    write(2 + y, 2 + helpColumn, shortened(meaning, COLS - 3 - helpColumn));
   }
-  ::refresh();
+}
+
+void TerminalFront::drawStatus(int y) const {
+  const auto status = status_();
+  const auto attributes = attributesOf(status.kind);
+  ::attron(attributes);
+  const auto line = std::wstring(1, statusMark(status.kind, characterSet_)) + L' ' + characters(status.text);
+  write(y, 1, shortened(line, COLS - 2));
+  ::attroff(attributes);
 }
 
 }  // namespace probeview::terminal

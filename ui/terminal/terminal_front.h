@@ -3,11 +3,13 @@
 
 #include <memory>
 #include <string>
+#include <string_view>
 #include <vector>
 
 #include "platform/event_loop.h"
 #include "ui/front.h"
 #include "ui/terminal/list_view.h"
+#include "ui/terminal/screen_text.h"
 
 namespace probeview::terminal {
 
@@ -17,29 +19,40 @@ namespace probeview::terminal {
 //
 //   ↑ ↓ Page-Up Page-Down Home End   move        Return →     open
 //   Esc Backspace ←                  back        q Ctrl-C     quit
+//   ?                                all keys, until the next key
 class TerminalFront final : public Front {
  public:
   // Make it before other threads start, so that signals reach it. Null, with the reason, where there is no terminal.
-  static std::unique_ptr<TerminalFront> make(std::string& error);
+  // Where the encoding is not UTF-8, everything is drawn in ASCII.
+  static std::unique_ptr<TerminalFront> make(std::string& error, std::string_view encoding = localeEncoding());
+  // The name of the encoding that the environment's locale asks for. Takes over the locale's characters.
+  static std::string localeEncoding();
   ~TerminalFront() override;
 
   TaskQueue& mainQueue() override { return loop_; }
   Scheduler& scheduler() override { return loop_; }
-  int run(NavigationStack& navigation, const StatusText& status) override;
+  int run(NavigationStack& navigation, const StatusSource& status) override;
 
  private:
   class Views;
 
-  TerminalFront();
+  explicit TerminalFront(CharacterSet characterSet);
   void readKeys();
   void handleKey(int key);
   void resize();
   void draw();
+  void drawLine(int y) const;
+  void drawPage(const ListView& view) const;
+  void drawKeys() const;
+  void drawStatus(int y) const;
+  void write(int line, int column, std::wstring_view text) const;
 
+  const CharacterSet characterSet_;
   EventLoop loop_;
   NavigationStack* navigation_ = nullptr;
   std::unique_ptr<Views> views_;
-  StatusText status_;
+  StatusSource status_;
+  bool showsKeys_ = false;
 };
 
 }  // namespace probeview::terminal

@@ -35,7 +35,7 @@ class FrontTest : public testing::Test {
   int run(Front& front) {
     const PageEnvironment environment{front.mainQueue(), front.scheduler(), console, store};
     NavigationStack stack{InterfaceDescription(environment)};
-    return front.run(stack, [] { return "scenario:city · 0.4 s ago"; });
+    return front.run(stack, [] { return Status{Status::Kind::Live, "scenario:city · 0.4 s ago"}; });
   }
 
   char name[5] = "test";
@@ -87,7 +87,7 @@ TEST_F(FrontTest, ThePagesOfTheWindowLiveOnItsMainQueue) {
     complaints = console.lines.size();
     if (complaints >= 2) QGuiApplication::quit();
   });
-  front->run(stack, [] { return std::string(); });
+  front->run(stack, [] { return Status{}; });
   EXPECT_GE(complaints, 2u);
 }
 

@@ -2,7 +2,9 @@
 #include <QColor>
 #include <QFontMetricsF>
 #include <QImage>
+#include <algorithm>
 #include <cmath>
+#include <map>
 
 #include "tests/ui/qt/window_testing.h"
 
@@ -121,6 +123,11 @@ TEST_F(WindowLooks, EveryTextInSightHasAColourOfTheTestedPairs) {
   goTo("LTE", "RRC State");
   for (const bool dark : {false, true}) {
     setLook(dark, 1);
+    expectTested();
+  }
+  for (std::size_t index = 0; index < statusKindNames.size(); ++index) {
+    statusKind = static_cast<Status::Kind>(index);
+    show();
     expectTested();
   }
 }
@@ -317,6 +324,45 @@ TEST_F(WindowLooks, TitlesStandOverTheirColumnOnADesk) {
   rest();
   EXPECT_EQ(left(part(whole(), "backButton")), 4);
   EXPECT_EQ(left(part(whole(), "title")), 56);
+}
+
+TEST_F(WindowLooks, EveryKindOfStatusHasAMarkAndWhatIsAmissAColourOfItsOwn) {
+  using Kind = Status::Kind;
+  statusText = "the same words for every kind";
+  for (const bool dark : {false, true}) {
+    // The shape of each mark: which of its pixels differ from the ground, whatever their colour.
+    std::map<std::vector<bool>, std::string> shapes;
+    std::map<QRgb, std::vector<Kind>> colours;
+    for (std::size_t index = 0; index < statusKindNames.size(); ++index) {
+      statusKind = static_cast<Kind>(index);
+      show();
+      setLook(dark, 2);
+      const std::string name(statusKindName(statusKind));
+      auto* mark = part(whole(), "statusMark");
+      const QRect place = mark->mapRectToScene(mark->boundingRect()).toAlignedRect();
+      auto* text = part(whole(), "statusText");
+      EXPECT_LE(place.right(), text->mapToScene(QPointF(0, 0)).x()) << name;
+      EXPECT_GE(place.left(), 0) << name;
+      const QImage picture = window().grabWindow();
+      std::vector<bool> shape;
+      for (int y = place.top(); y <= place.bottom(); ++y) {
+        for (int x = place.left(); x <= place.right(); ++x) {
+          shape.push_back(contrast(picture.pixelColor(x, y), color("bar")) > 2);
+        }
+      }
+      EXPECT_GT(std::count(shape.begin(), shape.end(), true), 20) << name;
+      const auto [same, isNew] = shapes.emplace(std::move(shape), name);
+      EXPECT_TRUE(isNew) << name << " looks like " << same->second;
+      EXPECT_EQ(mark->property("color").value<QColor>(), text->property("color").value<QColor>()) << name;
+      colours[text->property("color").value<QColor>().rgb()].push_back(statusKind);
+      EXPECT_EQ(textOf(text), statusText);
+    }
+    for (const auto kind : {Kind::Stale, Kind::Ended, Kind::Failed, Kind::Away}) {
+      const bool isAlone = std::any_of(colours.begin(), colours.end(),
+                                       [&](const auto& entry) { return entry.second == std::vector<Kind>{kind}; });
+      EXPECT_TRUE(isAlone) << statusKindName(kind) << (dark ? ", dark" : ", light");
+    }
+  }
 }
 
 TEST_F(WindowLooks, LinesStayReadableOnAWideScreen) {

@@ -214,6 +214,24 @@ TEST_F(WindowReload, TheStatusLineIsAskedAnewEverySecondAndStandsOutsideTheList)
   EXPECT_GE(status()->mapToScene({}).y(), list()->mapToScene(QPointF(0, list()->height())).y());
 }
 
+TEST_F(WindowReload, TheStatusLineFollowsThePageAtOnce) {
+  statusText = "of the lists";
+  show();
+  const auto status = [this] { return textOf(part(window().contentItem(), "statusText")); };
+  EXPECT_EQ(status(), "of the lists");
+  clickRow("LTE");
+  rest();
+  statusText = "of the page";
+  EXPECT_EQ(status(), "of the lists") << "no clock has moved";
+  clickRow("RRC State");
+  rest();
+  EXPECT_EQ(status(), "of the page");
+  statusText = "of the lists again";
+  press(Qt::Key_Escape);
+  rest();
+  EXPECT_EQ(status(), "of the lists again");
+}
+
 TEST_F(WindowReload, AReloadCostsLittle) {
   for (const std::size_t count : {std::size_t{1000}, std::size_t{10000}}) {
     SCOPED_TRACE(count);

@@ -77,7 +77,11 @@ void WindowTest::close() {
 
 void WindowTest::open(QSize size) {
   viewer_ = std::make_unique<qt::Viewer>(
-      *stack, [this] { return statusText; }, loop, *appearance);
+      *stack,
+      [this] {
+        return Status{statusKind, statusText};
+      },
+      loop, *appearance);
   window_ = std::make_unique<qt::Window>(*viewer_);
   // Pages slide as they do for a user, only faster.
   theme().setProperty("slide", 30);

@@ -89,6 +89,7 @@ class WindowTest : public PagesTest {
 
   // Without a bus, until a test brings one.
   std::unique_ptr<qt::Appearance> appearance;
+  Status::Kind statusKind = Status::Kind::Live;
   std::string statusText = "scenario:city · 0.4 s ago";
   std::optional<NavigationStack> stack;
 

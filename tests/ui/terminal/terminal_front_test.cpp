@@ -12,9 +12,11 @@
 #include <unistd.h>
 #include <utmp.h>
 
+#include <algorithm>
 #include <chrono>
 #include <csignal>
 #include <cstdlib>
+#include <map>
 
 #include "platform/file_descriptor.h"
 #include "tests/ui/testing.h"
@@ -27,7 +29,8 @@ using namespace std::chrono_literals;
 // A child whose terminal is ours.
 class Screen {
  public:
-  explicit Screen(const std::function<int()>& program, unsigned short width = 80, unsigned short height = 24) {
+  explicit Screen(const std::function<int()>& program, unsigned short width = 80, unsigned short height = 24,
+                  const char* locale = "C.UTF-8") {
     winsize size{height, width, 0, 0};
     int master = -1;
     int slave = -1;
@@ -39,7 +42,7 @@ class Screen {
       ::close(master);
       ::login_tty(slave);
       ::setenv("TERM", "xterm", 1);
-      ::setenv("LC_ALL", "C.UTF-8", 1);
+      ::setenv("LC_ALL", locale, 1);
       ::_exit(program());
     }
     ::close(slave);
@@ -113,7 +116,11 @@ class Screen {
 };
 
 // What the child runs: the front on the launch list over a store that is fed by hand.
-int showPages(const std::function<void(TerminalFront&, testing_ui::HandFilledStore&)>& before = {}) {
+int showPages(
+    const std::function<void(TerminalFront&, testing_ui::HandFilledStore&)>& before = {},
+    const StatusSource& status = [] {
+      return Status{Status::Kind::Live, "the status"};
+    }) {
   std::string error;
   const auto front = TerminalFront::make(error);
   if (!front) return 9;
@@ -122,7 +129,7 @@ int showPages(const std::function<void(TerminalFront&, testing_ui::HandFilledSto
   store.filled[DisplayDictionary::myLTERRCStateDict] = Dictionary{{"state", Value::text("KLTE_RRC_STATE_IDLE")}};
   NavigationStack stack(InterfaceDescription(PageEnvironment{front->mainQueue(), front->scheduler(), log, store}));
   if (before) before(*front, store);
-  return front->run(stack, [] { return "the status"; });
+  return front->run(stack, status);
 }
 const auto plainly = [] { return showPages(); };
 
@@ -189,6 +196,138 @@ TEST(Terminal, ATerminalThatChangesItsSizeIsDrawnAnew) {
   EXPECT_TRUE(screen.shows("the status"));
   screen.type("q");
   EXPECT_EQ(screen.end(), 0);
+}
+
+TEST(Terminal, TheKeysThatMatterAreShownAt40ColumnsBesideAnyStatus) {
+  const std::string status = "a status that is a good deal longer than the line that it stands on";
+  Screen screen([&] { return showPages({}, [&] { return Status{Status::Kind::Live, status}; }); }, 40, 20);
+  EXPECT_TRUE(screen.shows("↑↓ Return  ? keys  q quit"));
+  EXPECT_TRUE(screen.shows("• " + status.substr(0, 35) + "…")) << "the status has a line of its own";
+  screen.type("\r");
+  ASSERT_TRUE(screen.shows("SIM Files"));
+  // Only a change of size draws everything anew.
+  screen.resize(39, 20);
+  EXPECT_TRUE(screen.shows("Esc back"));
+  screen.resize(40, 20);
+  EXPECT_TRUE(screen.shows("↑↓ Return Esc back ? keys q quit"));
+  EXPECT_TRUE(screen.shows("• " + status.substr(0, 35) + "…"));
+  screen.type("q");
+  EXPECT_EQ(screen.end(), 0);
+}
+
+TEST(Terminal, AQuestionMarkShowsTheKeysUntilTheNextKeyWhichDoesNothingElse) {
+  Screen screen(plainly, 40, 20);
+  ASSERT_TRUE(screen.shows("the status"));
+  screen.type("\r");
+  ASSERT_TRUE(screen.shows("SIM Files"));
+  for (const auto* key : {"\x1b", "q", "?", "\x1bOB", "\r"}) {
+    screen.type("?");
+    EXPECT_TRUE(screen.shows("Keys"));
+    EXPECT_TRUE(screen.shows("Esc Backspace"));
+    EXPECT_TRUE(screen.shows("back"));
+    EXPECT_TRUE(screen.shows("the service is away"));
+    EXPECT_TRUE(screen.shows("any key closes this"));
+    screen.type(key);
+    EXPECT_TRUE(screen.shows("IMEISV")) << "the same page as before";
+  }
+  screen.type("q");
+  EXPECT_EQ(screen.end(), 0);
+}
+
+TEST(Terminal, AChangeOfSizeLeavesTheListOfKeysOpen) {
+  Screen screen(plainly);
+  ASSERT_TRUE(screen.shows("the status"));
+  screen.type("?");
+  ASSERT_TRUE(screen.shows("any key closes this"));
+  screen.resize(40, 20);
+  EXPECT_TRUE(screen.shows("any key closes this"));
+  // A second on, when the status line has been asked anew, it is still there: the page is drawn only after a key.
+  screen.resize(60, 22);
+  EXPECT_TRUE(screen.shows("any key closes this"));
+  screen.type("x");
+  EXPECT_TRUE(screen.shows("Device Info"));
+  screen.type("q");
+  EXPECT_EQ(screen.end(), 0);
+}
+
+TEST(Terminal, WhereTheLocaleIsNotUtf8EverythingIsDrawnInAscii) {
+  for (const auto* locale : {"C", "POSIX", "de_DE.ISO-8859-1", "no_SUCH"}) {
+    Screen screen(
+        [] {
+          return showPages(
+              [](TerminalFront&, testing_ui::HandFilledStore& store) {
+                store.filled[DisplayDictionary::myLTERRCStateDict] = Dictionary{{"state", Value::text("Zürich 信")}};
+              },
+              [] {
+                return Status{Status::Kind::Stale, "scenario:city · 2 min ago, stale"};
+              });
+        },
+        40, 8, locale);
+    EXPECT_TRUE(screen.shows("^v Return")) << locale;
+    EXPECT_TRUE(screen.shows("o scenario:city - 2 min ago, stale"));
+    screen.type("\x1bOB\r");
+    EXPECT_TRUE(screen.shows("> LTE"));
+    ASSERT_TRUE(screen.shows("RRC State"));
+    screen.resize(41, 8);
+    EXPECT_TRUE(screen.shows("-v--")) << "there is more below";
+    screen.type("\x1bOB\r");
+    EXPECT_TRUE(screen.shows("Z?rich ??"));
+    screen.type("?");
+    EXPECT_TRUE(screen.shows("any key closes this"));
+    screen.type("xq");
+    EXPECT_EQ(screen.end(), 0);
+    const auto& written = screen.written();
+    EXPECT_TRUE(std::all_of(written.begin(), written.end(), [](char byte) { return (byte & 0x80) == 0; })) << locale;
+    EXPECT_EQ(written.find("\x1b(0"), std::string::npos) << "nor by the terminal's own characters for lines";
+  }
+}
+
+TEST(Terminal, ALocaleThatIsNotInstalledTellsItsEncodingByItsName) {
+  Screen screen(plainly, 80, 24, "xx_XX.UTF-8");
+  EXPECT_TRUE(screen.shows("↑↓ Return"));
+  screen.type("q");
+  EXPECT_EQ(screen.end(), 0);
+}
+
+TEST(Terminal, TheEncodingIsAFactThatCanBeHandedIn) {
+  Screen screen([] {
+    std::string error;
+    const auto front = TerminalFront::make(error, "KOI8-R");
+    if (!front) return 9;
+    testing_ui::RememberedLines log;
+    testing_ui::HandFilledStore store(log, log);
+    NavigationStack stack(InterfaceDescription(PageEnvironment{front->mainQueue(), front->scheduler(), log, store}));
+    return front->run(stack, [] { return Status{Status::Kind::Live, "a · b"}; });
+  });
+  EXPECT_TRUE(screen.shows("* a - b"));
+  screen.type("q");
+  EXPECT_EQ(screen.end(), 0);
+}
+
+TEST(Terminal, WhatIsAmissHasAColourAndAMarkOfItsOwn) {
+  const std::map<Status::Kind, std::string> drawn = {
+      {Status::Kind::Stale, "\x1b[33m○ the"},
+      {Status::Kind::Ended, "\x1b[36m■ the"},
+      {Status::Kind::Failed, "\x1b[31m! the"},
+      {Status::Kind::Away, "\x1b[35m× the"},
+  };
+  for (const auto& [kind, text] : drawn) {
+    Screen screen([kind = kind] { return showPages({}, [kind] { return Status{kind, "the status"}; }); });
+    EXPECT_TRUE(screen.shows(text)) << statusKindName(kind);
+    screen.type("q");
+    EXPECT_EQ(screen.end(), 0);
+  }
+}
+
+TEST(Terminal, ATerminalWithoutColoursShowsTheMark) {
+  Screen screen([] {
+    ::setenv("TERM", "vt100", 1);
+    return showPages({}, [] { return Status{Status::Kind::Away, "the status"}; });
+  });
+  EXPECT_TRUE(screen.shows("× the status"));
+  screen.type("q");
+  EXPECT_EQ(screen.end(), 0);
+  EXPECT_EQ(screen.written().find("\x1b[35m"), std::string::npos);
 }
 
 TEST(Terminal, ASignalToEndGivesTheTerminalBack) {
