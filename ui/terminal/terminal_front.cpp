@@ -322,10 +322,10 @@ void TerminalFront::drawKeys() const {
 void TerminalFront::drawStatus(int y) const {
   const auto status = status_();
   const auto attributes = attributesOf(status.kind);
-  ::attron(attributes);
+  ::attr_on(attributes, nullptr);
   const auto line = std::wstring(1, statusMark(status.kind, characterSet_)) + L' ' + characters(status.text);
   write(y, 1, shortened(line, COLS - 2));
-  ::attroff(attributes);
+  ::attr_off(attributes, nullptr);
 }
 
 }  // namespace probeview::terminal
