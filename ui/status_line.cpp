@@ -28,7 +28,11 @@ constexpr std::size_t longestReason = 240;
 std::string shown(std::string_view text, std::size_t longest) {
   std::string valid;
   appendValidUtf8(beginningOf(text, longest), valid);
-  return onOneLine(valid) + (text.size() > longest ? "…" : "");
+  const std::string line = onOneLine(valid);
+  // What stands in place of a character may be longer than it.
+  const auto beginning = beginningOf(line, longest);
+  const bool isWhole = text.size() <= longest && beginning.size() == line.size();
+  return std::string(beginning) + (isWhole ? "" : "…");
 }
 
 std::string withReason(std::string_view what, const std::string& reason) {
@@ -36,7 +40,7 @@ std::string withReason(std::string_view what, const std::string& reason) {
 }
 
 using radix::client::SourceState;
-using Kind = Status::Kind;
+using StatusKind = Status::Kind;
 
 bool isRunning(const SourceState& source) { return source.phase == SourceState::Phase::Running; }
 
@@ -49,16 +53,16 @@ const SourceState* sourceNamed(const std::vector<SourceState>& sources, const st
   return found;
 }
 
-Kind kindOf(const SourceState& source) {
+StatusKind kindOf(const SourceState& source) {
   switch (source.phase) {
     case SourceState::Phase::Running:
-      return Kind::Live;
+      return StatusKind::Live;
     case SourceState::Phase::Ended:
-      return Kind::Ended;
+      return StatusKind::Ended;
     case SourceState::Phase::Failed:
-      return Kind::Failed;
+      return StatusKind::Failed;
   }
-  return Kind::Live;
+  return StatusKind::Live;
 }
 
 // How a source that no longer runs has come to its end.
@@ -79,7 +83,7 @@ std::string named(const std::vector<const SourceState*>& sources, const std::str
 
 // Why no record has come for a page, or for the lists.
 Status nothingYet(const std::vector<SourceState>& sources, const std::optional<PageFeed>& feed) {
-  if (sources.empty()) return {Kind::Unfillable, "the baseband service has no source"};
+  if (sources.empty()) return {StatusKind::Unfillable, "the baseband service has no source"};
   std::vector<const SourceState*> all;
   std::vector<const SourceState*> able;
   std::vector<const SourceState*> running;
@@ -96,10 +100,10 @@ Status nothingYet(const std::vector<SourceState>& sources, const std::optional<P
   }
   const auto count = [](const auto& many) { return std::to_string(many.size()) + " sources"; };
   if (able.empty())
-    return {Kind::Unfillable,
+    return {StatusKind::Unfillable,
             named(all, "none of the " + count(all)) + " can" + (all.size() > 2 ? "" : "not") + " fill this page"};
   if (!running.empty())
-    return {Kind::Waiting, "nothing received yet from " + named(running, "any of " + count(running))};
+    return {StatusKind::Waiting, "nothing received yet from " + named(running, "any of " + count(running))};
   const auto& gone = failed != nullptr ? *failed : *able.front();
   return {kindOf(gone), named(gone) + " · " + endOf(gone) + (failed != nullptr ? "" : ", nothing received")};
 }
@@ -121,32 +125,32 @@ std::string ageText(std::chrono::nanoseconds age) {
 Status StatusLine::status(const StatusFacts& facts) const {
   const auto& connection = facts.service.connection;
   if (!connection.connected) return away(facts);
-  if (facts.isConfigurationMissing) return {Kind::Failed, "no configuration: resource missing"};
+  if (facts.isConfigurationMissing) return {StatusKind::Failed, "no configuration: resource missing"};
   if (connection.configuration == ConfigurationOutcome::Refused) {
-    return {Kind::Failed, withReason("configuration refused", connection.configurationTrouble)};
+    return {StatusKind::Failed, withReason("configuration refused", connection.configurationTrouble)};
   }
-  if (facts.feed && facts.feed->empty()) return {Kind::Unfillable, "no metric fills this page"};
+  if (facts.feed && facts.feed->empty()) return {StatusKind::Unfillable, "no metric fills this page"};
   if (const auto* record = youngestOf(facts)) return filled(facts.service, *record);
   if (connection.configuration == ConfigurationOutcome::Unsent) {
-    return {Kind::Waiting, withReason("configuration not taken yet", connection.configurationTrouble)};
+    return {StatusKind::Waiting, withReason("configuration not taken yet", connection.configurationTrouble)};
   }
   if (connection.configuration == ConfigurationOutcome::NotPushed) {
-    return {Kind::Waiting, "no configuration pushed, nothing received yet"};
+    return {StatusKind::Waiting, "no configuration pushed, nothing received yet"};
   }
   if (connection.sources) return nothingYet(*connection.sources, facts.feed);
-  return {Kind::Waiting, facts.feed ? "Connected to the baseband service, nothing received yet for this page"
-                                    : "Connected to the baseband service, nothing received yet"};
+  return {StatusKind::Waiting, facts.feed ? "Connected to the baseband service, nothing received yet for this page"
+                                          : "Connected to the baseband service, nothing received yet"};
 }
 
 Status StatusLine::away(const StatusFacts& facts) const {
   const auto& connection = facts.service.connection;
   if (!connection.everConnected) {
-    if (connection.trouble.empty()) return {Kind::Waiting, "Waiting for the baseband service"};
+    if (connection.trouble.empty()) return {StatusKind::Waiting, "Waiting for the baseband service"};
     // Why it does not come is worth its place: who waits may be waiting at the wrong socket.
-    return {Kind::Away, "Waiting for the baseband service · " + shown(connection.trouble, longestReason)};
+    return {StatusKind::Away, "Waiting for the baseband service · " + shown(connection.trouble, longestReason)};
   }
-  return {Kind::Away, "Baseband service away since " + localTime(connection.since) +
-                          (youngestOf(facts) ? ", showing what was last known" : ", nothing received yet")};
+  return {StatusKind::Away, "Baseband service away since " + localTime(connection.since) +
+                                (youngestOf(facts) ? ", showing what was last known" : ", nothing received yet")};
 }
 
 Status StatusLine::filled(const ServiceStatus& service, const Record& record) const {
@@ -156,15 +160,15 @@ Status StatusLine::filled(const ServiceStatus& service, const Record& record) co
   const auto line = origin.empty() ? "Last record " + age + " ago" : origin + " · " + age + " ago";
   if (service.connection.sources && !record.origin.empty()) {
     const auto* source = sourceNamed(*service.connection.sources, record.origin);
-    if (source == nullptr) return {Kind::Ended, line + " · no longer a source"};
+    if (source == nullptr) return {StatusKind::Ended, line + " · no longer a source"};
     if (source->phase != SourceState::Phase::Running) return {kindOf(*source), line + " · " + endOf(*source)};
   }
-  if (!isStale(record)) return {Kind::Live, line};
+  if (!isStale(record)) return {StatusKind::Live, line};
   const auto silence = silenceOf(service, record.origin);
   // Other metrics of a source that runs may go on: a phone that has left a cell no longer measures it.
-  if (origin.empty() || silence <= leastStaleAge) return {Kind::Stale, line + ", stale"};
+  if (origin.empty() || silence <= leastStaleAge) return {StatusKind::Stale, line + ", stale"};
   const auto silent = "source silent for " + ageText(silence);
-  return {Kind::Stale, (ageText(silence) == age ? origin : line) + " · " + silent};
+  return {StatusKind::Stale, (ageText(silence) == age ? origin : line) + " · " + silent};
 }
 
 std::chrono::nanoseconds StatusLine::ageOf(const Record& record) const {

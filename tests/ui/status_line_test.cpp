@@ -20,7 +20,7 @@ namespace {
 
 using namespace std::chrono_literals;
 
-using Kind = Status::Kind;
+using StatusKind = Status::Kind;
 using radix::client::SourceState;
 using Phase = SourceState::Phase;
 
@@ -80,13 +80,13 @@ class StatusLines : public testing::Test {
 TEST_F(StatusLines, WhileRecordsComeItNamesTheirOriginAndTheAgeOfTheLastOne) {
   receive(rrcState, "scenario:city");
   clock.advance(449ms);
-  EXPECT_EQ(onLists(), (Status{Kind::Live, "scenario:city · 0.4 s ago"}));
+  EXPECT_EQ(onLists(), (Status{StatusKind::Live, "scenario:city · 0.4 s ago"}));
 }
 
 TEST_F(StatusLines, ARecordWithoutOriginIsTheLastRecord) {
   receive(rrcState, "");
   setSources({source("scenario:city")});
-  EXPECT_EQ(onLists(), (Status{Kind::Live, "Last record 0.0 s ago"}));
+  EXPECT_EQ(onLists(), (Status{StatusKind::Live, "Last record 0.0 s ago"}));
 }
 
 TEST_F(StatusLines, TheAgeOfARecordIsHowOldItWasWhenItLeftTheServiceAndWhatHasGoneBySince) {
@@ -106,7 +106,7 @@ TEST_F(StatusLines, OnAPageItSpeaksOfTheMetricThatFillsThePageAndOnTheListsOfThe
   EXPECT_EQ(onPage({servingCell}).text, "trace:drive.csv · 1.0 s ago");
   EXPECT_EQ(onPage({rrcState}).text, "scenario:city · 6.0 s ago") << "of two sources the one that filled the page";
   EXPECT_EQ(onPage({0x3C0013}),
-            (Status{Kind::Waiting, "Connected to the baseband service, nothing received yet for this page"}));
+            (Status{StatusKind::Waiting, "Connected to the baseband service, nothing received yet for this page"}));
 }
 
 TEST_F(StatusLines, WhereSeveralMetricsFillAPageTheYoungestRecordCounts) {
@@ -121,7 +121,7 @@ TEST_F(StatusLines, WhereSeveralMetricsFillAPageTheYoungestRecordCounts) {
 TEST_F(StatusLines, APageThatNoMetricFillsSaysSoWhateverComes) {
   receive(rrcState, "scenario:city");
   setSources({source("scenario:city")});
-  EXPECT_EQ(onPage({}), (Status{Kind::Unfillable, "no metric fills this page"}));
+  EXPECT_EQ(onPage({}), (Status{StatusKind::Unfillable, "no metric fills this page"}));
 }
 
 TEST_F(StatusLines, ARecordIsStaleWhenItIsOlderThanTenSecondsAndThanThreePeriods) {
@@ -130,27 +130,27 @@ TEST_F(StatusLines, ARecordIsStaleWhenItIsOlderThanTenSecondsAndThanThreePeriods
     return onPage({rrcState}).kind;
   };
   setSources({source("scenario:city")});
-  EXPECT_EQ(kindAfter(1s, 10s), Kind::Live);
-  EXPECT_EQ(kindAfter(1s, 10001ms), Kind::Stale);
-  EXPECT_EQ(kindAfter(3333ms, 10s), Kind::Live);
-  EXPECT_EQ(kindAfter(3333ms, 10001ms), Kind::Stale);
-  EXPECT_EQ(kindAfter(10s, 30s), Kind::Live);
-  EXPECT_EQ(kindAfter(10s, 30001ms), Kind::Stale);
-  EXPECT_EQ(kindAfter(radix::longestSpan, radix::longestSpan), Kind::Live);
+  EXPECT_EQ(kindAfter(1s, 10s), StatusKind::Live);
+  EXPECT_EQ(kindAfter(1s, 10001ms), StatusKind::Stale);
+  EXPECT_EQ(kindAfter(3333ms, 10s), StatusKind::Live);
+  EXPECT_EQ(kindAfter(3333ms, 10001ms), StatusKind::Stale);
+  EXPECT_EQ(kindAfter(10s, 30s), StatusKind::Live);
+  EXPECT_EQ(kindAfter(10s, 30001ms), StatusKind::Stale);
+  EXPECT_EQ(kindAfter(radix::longestSpan, radix::longestSpan), StatusKind::Live);
 }
 
 TEST_F(StatusLines, WhatComesOnChangeOrIsAskedForOnceIsNeverStaleWhileItsSourceRuns) {
   setSources({source("scenario:city")});
   receive(rrcState, "scenario:city", 0ms);
   clock.advance(1000h);
-  EXPECT_EQ(onLists(), (Status{Kind::Live, "scenario:city · 41 d ago"}));
-  EXPECT_EQ(onPage({rrcState}), (Status{Kind::Live, "scenario:city · 41 d ago"}));
+  EXPECT_EQ(onLists(), (Status{StatusKind::Live, "scenario:city · 41 d ago"}));
+  EXPECT_EQ(onPage({rrcState}), (Status{StatusKind::Live, "scenario:city · 41 d ago"}));
 }
 
 TEST_F(StatusLines, WhereTheServiceNamesNoPeriodNothingIsCalledStale) {
   receive(rrcState, "scenario:city");
   clock.advance(1000h);
-  EXPECT_EQ(onPage({rrcState}).kind, Kind::Live);
+  EXPECT_EQ(onPage({rrcState}).kind, StatusKind::Live);
 }
 
 TEST_F(StatusLines, ASourceOfWhichNothingComesIsSilentForAsLongAsItsYoungestRecordIsOld) {
@@ -159,15 +159,15 @@ TEST_F(StatusLines, ASourceOfWhichNothingComesIsSilentForAsLongAsItsYoungestReco
   clock.advance(180s);
   receive(servingCell, "scenario:city", 0ms);
   clock.advance(125s);
-  EXPECT_EQ(onPage({rrcState}), (Status{Kind::Stale, "scenario:city · 5 min ago · source silent for 2 min"}));
+  EXPECT_EQ(onPage({rrcState}), (Status{StatusKind::Stale, "scenario:city · 5 min ago · source silent for 2 min"}));
   receive(rrcState, "scenario:city", 1s);
   clock.advance(120s);
-  EXPECT_EQ(onPage({rrcState}), (Status{Kind::Stale, "scenario:city · source silent for 2 min"}));
-  EXPECT_EQ(onLists(), (Status{Kind::Stale, "scenario:city · source silent for 2 min"}));
+  EXPECT_EQ(onPage({rrcState}), (Status{StatusKind::Stale, "scenario:city · source silent for 2 min"}));
+  EXPECT_EQ(onLists(), (Status{StatusKind::Stale, "scenario:city · source silent for 2 min"}));
   // Another source is another matter.
   receive(servingCell, "trace:drive.csv", 1s);
-  EXPECT_EQ(onPage({rrcState}), (Status{Kind::Stale, "scenario:city · source silent for 2 min"}));
-  EXPECT_EQ(onLists(), (Status{Kind::Live, "trace:drive.csv · 0.0 s ago"}));
+  EXPECT_EQ(onPage({rrcState}), (Status{StatusKind::Stale, "scenario:city · source silent for 2 min"}));
+  EXPECT_EQ(onLists(), (Status{StatusKind::Live, "trace:drive.csv · 0.0 s ago"}));
 }
 
 TEST_F(StatusLines, AMetricThatStopsWhileItsSourceGoesOnIsStaleAndTheSourceIsNotCalledSilent) {
@@ -176,29 +176,30 @@ TEST_F(StatusLines, AMetricThatStopsWhileItsSourceGoesOnIsStaleAndTheSourceIsNot
   clock.advance(120s);
   receive(servingCell, "scenario:city", 1s);
   clock.advance(10s);
-  EXPECT_EQ(onPage({rrcState}), (Status{Kind::Stale, "scenario:city · 2 min ago, stale"}));
+  EXPECT_EQ(onPage({rrcState}), (Status{StatusKind::Stale, "scenario:city · 2 min ago, stale"}));
 }
 
 TEST_F(StatusLines, ATraceThatHasEndedIsSaidToHaveEndedHoweverYoungItsLastRecordIs) {
   setSources({source("trace:drive.csv", Phase::Ended)});
   receive(rrcState, "trace:drive.csv", 0ms);
-  EXPECT_EQ(onPage({rrcState}), (Status{Kind::Ended, "trace:drive.csv · 0.0 s ago · trace ended"}));
+  EXPECT_EQ(onPage({rrcState}), (Status{StatusKind::Ended, "trace:drive.csv · 0.0 s ago · trace ended"}));
   clock.advance(180s);
-  EXPECT_EQ(onLists(), (Status{Kind::Ended, "trace:drive.csv · 3 min ago · trace ended"}));
+  EXPECT_EQ(onLists(), (Status{StatusKind::Ended, "trace:drive.csv · 3 min ago · trace ended"}));
 }
 
 TEST_F(StatusLines, AnotherSourceThatEndsIsNoTrace) {
   setSources({source("modem", Phase::Ended)});
   receive(rrcState, "modem", 1s);
-  EXPECT_EQ(onPage({rrcState}), (Status{Kind::Ended, "modem · 0.0 s ago · source ended"}));
+  EXPECT_EQ(onPage({rrcState}), (Status{StatusKind::Ended, "modem · 0.0 s ago · source ended"}));
 }
 
 TEST_F(StatusLines, ASourceThatHasFailedSaysWhy) {
   setSources({source("trace:drive.csv", Phase::Failed, "row 7 is no row")});
   receive(rrcState, "trace:drive.csv", 1s, 120s);
-  EXPECT_EQ(onPage({rrcState}), (Status{Kind::Failed, "trace:drive.csv · 2 min ago · source failed: row 7 is no row"}));
+  EXPECT_EQ(onPage({rrcState}),
+            (Status{StatusKind::Failed, "trace:drive.csv · 2 min ago · source failed: row 7 is no row"}));
   setSources({source("trace:drive.csv", Phase::Failed)});
-  EXPECT_EQ(onPage({rrcState}), (Status{Kind::Failed, "trace:drive.csv · 2 min ago · source failed"}));
+  EXPECT_EQ(onPage({rrcState}), (Status{StatusKind::Failed, "trace:drive.csv · 2 min ago · source failed"}));
 }
 
 TEST_F(StatusLines, OfTwoSourcesOfOneNameTheOneThatRunsCounts) {
@@ -206,51 +207,51 @@ TEST_F(StatusLines, OfTwoSourcesOfOneNameTheOneThatRunsCounts) {
     setSources({source("scenario:city", runsFirst ? Phase::Running : Phase::Failed),
                 source("scenario:city", runsFirst ? Phase::Failed : Phase::Running)});
     receive(rrcState, "scenario:city", 1s);
-    EXPECT_EQ(onPage({rrcState}), (Status{Kind::Live, "scenario:city · 0.0 s ago"}));
+    EXPECT_EQ(onPage({rrcState}), (Status{StatusKind::Live, "scenario:city · 0.0 s ago"}));
   }
 }
 
 TEST_F(StatusLines, WhatASourceLeftThatTheServiceNoLongerHasIsNotLive) {
   setSources({source("scenario:city")});
   receive(rrcState, "trace:drive.csv", 0ms, 60s);
-  EXPECT_EQ(onPage({rrcState}), (Status{Kind::Ended, "trace:drive.csv · 1 min ago · no longer a source"}));
+  EXPECT_EQ(onPage({rrcState}), (Status{StatusKind::Ended, "trace:drive.csv · 1 min ago · no longer a source"}));
 }
 
 TEST_F(StatusLines, APageThatNothingHasFilledYetNamesTheSourceThatMay) {
   setSources({source("scenario:city")});
-  EXPECT_EQ(onLists(), (Status{Kind::Waiting, "nothing received yet from scenario:city"}));
-  EXPECT_EQ(onPage({rrcState}), (Status{Kind::Waiting, "nothing received yet from scenario:city"}));
+  EXPECT_EQ(onLists(), (Status{StatusKind::Waiting, "nothing received yet from scenario:city"}));
+  EXPECT_EQ(onPage({rrcState}), (Status{StatusKind::Waiting, "nothing received yet from scenario:city"}));
   setSources({source("trace:drive.csv", Phase::Running, "", {servingCell}), source("scenario:city")});
-  EXPECT_EQ(onPage({rrcState}), (Status{Kind::Waiting, "nothing received yet from scenario:city"}));
+  EXPECT_EQ(onPage({rrcState}), (Status{StatusKind::Waiting, "nothing received yet from scenario:city"}));
   EXPECT_EQ(onPage({servingCell}),
-            (Status{Kind::Waiting, "nothing received yet from trace:drive.csv and scenario:city"}));
+            (Status{StatusKind::Waiting, "nothing received yet from trace:drive.csv and scenario:city"}));
   setSources({source("a"), source("b"), source("c")});
-  EXPECT_EQ(onLists(), (Status{Kind::Waiting, "nothing received yet from any of 3 sources"}));
+  EXPECT_EQ(onLists(), (Status{StatusKind::Waiting, "nothing received yet from any of 3 sources"}));
 }
 
 TEST_F(StatusLines, APageThatNoSourceCanFillSaysSo) {
   setSources({source("trace:x.csv", Phase::Running, "", {servingCell})});
-  EXPECT_EQ(onPage({rrcState}), (Status{Kind::Unfillable, "trace:x.csv cannot fill this page"}));
-  EXPECT_EQ(onPage({rrcState, servingCell}), (Status{Kind::Waiting, "nothing received yet from trace:x.csv"}));
-  EXPECT_EQ(onLists(), (Status{Kind::Waiting, "nothing received yet from trace:x.csv"}));
+  EXPECT_EQ(onPage({rrcState}), (Status{StatusKind::Unfillable, "trace:x.csv cannot fill this page"}));
+  EXPECT_EQ(onPage({rrcState, servingCell}), (Status{StatusKind::Waiting, "nothing received yet from trace:x.csv"}));
+  EXPECT_EQ(onLists(), (Status{StatusKind::Waiting, "nothing received yet from trace:x.csv"}));
   setSources({source("trace:x.csv", Phase::Ended, "", {servingCell}), source("trace:y.csv", Phase::Running, "", {})});
-  EXPECT_EQ(onPage({rrcState}), (Status{Kind::Unfillable, "trace:x.csv and trace:y.csv cannot fill this page"}));
+  EXPECT_EQ(onPage({rrcState}), (Status{StatusKind::Unfillable, "trace:x.csv and trace:y.csv cannot fill this page"}));
   setSources(
       {source("a", Phase::Running, "", {}), source("b", Phase::Running, "", {}), source("c", Phase::Running, "", {})});
-  EXPECT_EQ(onPage({rrcState}), (Status{Kind::Unfillable, "none of the 3 sources can fill this page"}));
+  EXPECT_EQ(onPage({rrcState}), (Status{StatusKind::Unfillable, "none of the 3 sources can fill this page"}));
   setSources({});
-  EXPECT_EQ(onPage({rrcState}), (Status{Kind::Unfillable, "the baseband service has no source"}));
+  EXPECT_EQ(onPage({rrcState}), (Status{StatusKind::Unfillable, "the baseband service has no source"}));
 }
 
 TEST_F(StatusLines, WhereTheOnlySourceIsGoneBeforeAnythingCameItSaysHow) {
   setSources({source("trace:x.csv", Phase::Ended)});
-  EXPECT_EQ(onPage({rrcState}), (Status{Kind::Ended, "trace:x.csv · trace ended, nothing received"}));
+  EXPECT_EQ(onPage({rrcState}), (Status{StatusKind::Ended, "trace:x.csv · trace ended, nothing received"}));
   setSources({source("trace:x.csv", Phase::Ended), source("trace:y.csv", Phase::Failed, "it is a folder")});
-  EXPECT_EQ(onPage({rrcState}), (Status{Kind::Failed, "trace:y.csv · source failed: it is a folder"}));
+  EXPECT_EQ(onPage({rrcState}), (Status{StatusKind::Failed, "trace:y.csv · source failed: it is a folder"}));
 }
 
 TEST_F(StatusLines, AServiceThatDoesNotSayWhatFeedsItHasSentNothingYet) {
-  EXPECT_EQ(onLists(), (Status{Kind::Waiting, "Connected to the baseband service, nothing received yet"}));
+  EXPECT_EQ(onLists(), (Status{StatusKind::Waiting, "Connected to the baseband service, nothing received yet"}));
 }
 
 TEST_F(StatusLines, ARefusedConfigurationIsSaidWithItsReasonWhateverIsKnown) {
@@ -258,7 +259,7 @@ TEST_F(StatusLines, ARefusedConfigurationIsSaidWithItsReasonWhateverIsKnown) {
   receive(rrcState, "scenario:city", 1s);
   service.connection.configuration = ConfigurationOutcome::Refused;
   service.connection.configurationTrouble = "line 3, column 7: an equals sign is missing";
-  const Status refused{Kind::Failed, "configuration refused: line 3, column 7: an equals sign is missing"};
+  const Status refused{StatusKind::Failed, "configuration refused: line 3, column 7: an equals sign is missing"};
   EXPECT_EQ(onLists(), refused);
   EXPECT_EQ(onPage({rrcState}), refused);
   EXPECT_EQ(onPage({}), refused);
@@ -268,33 +269,33 @@ TEST_F(StatusLines, AConfigurationThatIsNotAmongTheResourcesIsMissing) {
   service.connection.configuration = ConfigurationOutcome::NotPushed;
   setSources({source("scenario:city")});
   EXPECT_EQ(line.status({.service = service, .feed = PageFeed{rrcState}, .isConfigurationMissing = true}),
-            (Status{Kind::Failed, "no configuration: resource missing"}));
+            (Status{StatusKind::Failed, "no configuration: resource missing"}));
 }
 
 TEST_F(StatusLines, WithoutAnAcceptedConfigurationItDoesNotPromiseThatSomethingComesFromASource) {
   setSources({source("scenario:city")});
   service.connection.configuration = ConfigurationOutcome::NotPushed;
-  EXPECT_EQ(onLists(), (Status{Kind::Waiting, "no configuration pushed, nothing received yet"}));
+  EXPECT_EQ(onLists(), (Status{StatusKind::Waiting, "no configuration pushed, nothing received yet"}));
   service.connection.configuration = ConfigurationOutcome::Unsent;
   service.connection.configurationTrouble = "no answer within 2 s";
-  EXPECT_EQ(onLists(), (Status{Kind::Waiting, "configuration not taken yet: no answer within 2 s"}));
+  EXPECT_EQ(onLists(), (Status{StatusKind::Waiting, "configuration not taken yet: no answer within 2 s"}));
   // A service of an older kind sends all the same.
   receive(rrcState, "scenario:city", 1s);
-  EXPECT_EQ(onLists(), (Status{Kind::Live, "scenario:city · 0.0 s ago"}));
+  EXPECT_EQ(onLists(), (Status{StatusKind::Live, "scenario:city · 0.0 s ago"}));
 }
 
 TEST_F(StatusLines, WhileTheServiceIsAwayItSaysSinceWhenInLocalTime) {
   receive(rrcState, "scenario:city", 1s);
   goAway(clock.wallTime() + 190s);
   clock.advance(300s);
-  EXPECT_EQ(onLists(), (Status{Kind::Away, "Baseband service away since 13:03:10, showing what was last known"}));
+  EXPECT_EQ(onLists(), (Status{StatusKind::Away, "Baseband service away since 13:03:10, showing what was last known"}));
   EXPECT_EQ(onPage({rrcState}).text, "Baseband service away since 13:03:10, showing what was last known");
   EXPECT_EQ(onPage({servingCell}).text, "Baseband service away since 13:03:10, nothing received yet");
 }
 
 TEST_F(StatusLines, AServiceThatLeftBeforeAnythingCameLeftNothingToShow) {
   goAway(clock.wallTime());
-  EXPECT_EQ(onLists(), (Status{Kind::Away, "Baseband service away since 13:00:00, nothing received yet"}));
+  EXPECT_EQ(onLists(), (Status{StatusKind::Away, "Baseband service away since 13:00:00, nothing received yet"}));
 }
 
 TEST_F(StatusLines, AServiceThatLeftOnAnotherDayIsAwaySinceThatDay) {
@@ -305,20 +306,21 @@ TEST_F(StatusLines, AServiceThatLeftOnAnotherDayIsAwaySinceThatDay) {
 
 TEST_F(StatusLines, BeforeTheServiceWasEverThereItWaits) {
   service = {};
-  EXPECT_EQ(onLists(), (Status{Kind::Waiting, "Waiting for the baseband service"}));
+  EXPECT_EQ(onLists(), (Status{StatusKind::Waiting, "Waiting for the baseband service"}));
 }
 
 TEST_F(StatusLines, WhileItWaitsItSaysWhyIfItKnows) {
   service = {};
   service.connection.trouble = "you may not connect to the baseband service at /run/radixd/radix.sock";
-  EXPECT_EQ(onPage({rrcState}), (Status{Kind::Away,
+  EXPECT_EQ(onPage({rrcState}), (Status{StatusKind::Away,
                                         "Waiting for the baseband service · you may not connect to the baseband "
                                         "service at /run/radixd/radix.sock"}));
 }
 
 // Whatever a service says, the line stays one line of well-formed text, neither steers a terminal nor fills the window.
 TEST_F(StatusLines, WhatAServiceSaysCannotBreakTheLine) {
-  const std::string hostile = "a\x1b[31m\n\xff\xc2\x9b" + std::string(5000, 'x');
+  const std::string steering = "a\x1b[31m\n\xff\xc2\x9b";
+  const std::string hostile = steering + std::string(5000, '\x1b') + steering;
   const auto expectTame = [](const Status& status) {
     EXPECT_TRUE(isValidUtf8(status.text));
     EXPECT_EQ(onOneLine(status.text), status.text);
