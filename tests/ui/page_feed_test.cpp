@@ -92,8 +92,9 @@ TEST_F(PageFeeds, APageChangesWithExactlyTheMetricsThatItsRuleNames) {
   ASSERT_EQ(navigablePageKeys().size(), 42u);
   for (const auto& key : keys()) {
     const auto feed = feedOf(categoryPageRule(key));
-    EXPECT_EQ(std::set<std::int64_t>(feed.begin(), feed.end()), changedBy[key]) << key;
-    EXPECT_EQ(feed.size(), changedBy[key].size()) << key << " names a metric twice";
+    const std::set<std::int64_t> named(feed.begin(), feed.end());
+    EXPECT_EQ(named, changedBy[key]) << key;
+    EXPECT_EQ(named.size(), feed.size()) << key << " names a metric twice";
     fed += feed.empty() ? 0 : 1;
   }
   // Nothing reports IMSI and IMEISV, two pages of GSM have their cells under other keys, and no handler fills the lists
