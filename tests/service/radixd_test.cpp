@@ -9,9 +9,11 @@
 #include <sys/stat.h>
 #include <sys/un.h>
 
+#include <algorithm>
 #include <cstring>
 #include <fstream>
 #include <random>
+#include <set>
 
 #include "platform/event_loop.h"
 #include "radix/client.h"
@@ -54,8 +56,8 @@ class Radixd : public ::testing::Test {
     return surroundings;
   }
 
-  radix::client::ManagerHandle manager() {
-    return radix::client::makeSocketManager("test", {std::shared_ptr<void>(), &loop_}, surroundings());
+  radix::client::ManagerHandle manager(radix::client::ManagerOptions options = {}) {
+    return radix::client::makeSocketManager("test", {std::shared_ptr<void>(), &loop_}, surroundings(), options);
   }
 
   int status(const radix::client::ManagerHandle& manager) {
@@ -149,6 +151,89 @@ TEST_F(Radixd, KilledAndStartedAgainUnderARunningClientItGoesOnWithConfiguration
   for (const std::int64_t metric : metrics) EXPECT_EQ(metric, 0x3C4E04);
 }
 
+// A log of so many seconds from the minute on; each row's records bear its time, so that none is like another.
+std::string logFrom(const std::string& minute, int seconds) {
+  std::string text(drive, std::string_view(drive).find('\n') + 1);
+  for (int second = 0; second < seconds; ++second) {
+    text += "2024.03.05_" + minute + (second < 10 ? ".0" : ".") + std::to_string(second) +
+            ",0.0,0.0,0,A,1,LTE,-90,-10,12.0,10,-60,1,1," + (second % 2 == 0 ? "D" : "I") +
+            ",-,-,-,-,-,1,64,1A2B,25601,-100,-14\n";
+  }
+  return text;
+}
+
+TEST_F(Radixd, AViewerOnAServiceThatHasPlayedItsTraceGetsEachRecordOnceWithItsAgeAndSoFromTheNextOne) {
+  const auto look = loop_.every(std::chrono::milliseconds(5), [] {});
+  std::ofstream(trace_) << logFrom("12.00", 20);
+  const std::vector<std::string> words{"--socket", socket_, "--source", "trace:" + trace_ + ",speed=1000"};
+  auto radixd = std::make_unique<RadixdProcess>(words);
+  ASSERT_TRUE(radixd->waitForLog("listening"));
+  {
+    // Somebody has watched before, to the end.
+    const auto before = manager({.observes = true});
+    radix::client::EventsOn(before);
+    ASSERT_TRUE(radixd->waitForLog("played to its end"));
+  }
+  const auto viewer = manager();
+  std::vector<std::pair<std::int64_t, std::string>> records;
+  std::int64_t youngest = INT64_MAX;
+  radix::client::RegisterEventHandler(viewer, radix::kEventMetric, [&](const auto& event, radix::client::Group) {
+    const Dictionary record = radix::client::nativeDictionary(*event);
+    const auto payload = *record.find(radix::kKeyPayload)->bytes();
+    records.emplace_back(*record.find(radix::kKeyMetricID)->int64(), std::string(payload.begin(), payload.end()));
+    youngest = std::min(youngest, *record.find(radix::kKeyAge)->int64());
+  });
+  const auto perform = [&](const char* command, const Dictionary& arguments) {
+    radix::client::ObjectHandle reply;
+    return radix::client::PerformCommand(viewer, command, arguments, reply).status;
+  };
+  const auto listen = [&] {
+    radix::client::EventsOff(viewer);
+    radix::client::EventsOn(viewer);
+  };
+  const auto eachOnce = [&] {
+    return std::set<std::pair<std::int64_t, std::string>>(records.begin(), records.end()).size() == records.size();
+  };
+  listen();
+  ASSERT_EQ(perform(radix::kCommandClearConfiguration, {}), 0);
+  const std::string configuration =
+      "[metrics]\nK_LTE_RRC_STATE = \"on change\"\nK_LTE_RSRP_RSRQ_SINR = 1\n[triggers]\n1 = [\"K_LTE_SCELL_INFO\"]\n";
+  ASSERT_EQ(perform(radix::kCommandAddConfiguration,
+                    {{radix::kKeyPayload, Value::bytes({reinterpret_cast<const std::uint8_t*>(configuration.data()),
+                                                        configuration.size()})}}),
+            0);
+  listen();
+  ASSERT_EQ(perform(radix::kCommandQueryMetric, {{radix::kKeyTriggerID, std::int64_t{1}}}), 0);
+  listen();
+  ASSERT_EQ(status(viewer), 0);
+  ASSERT_EQ(status(viewer), 0);
+  // State, measurement and cell as they were kept, and the cell once more as it was asked for.
+  ASSERT_TRUE(loop_.runUntil([&] { return records.size() >= 4; }, patience));
+  EXPECT_EQ(records.size(), 4U);
+  std::sort(records.begin(), records.end());
+  EXPECT_EQ(records[0].first, 0x3C40C2) << "K_LTE_SCELL_INFO";
+  EXPECT_EQ(records[0], records[1]) << "a question about what does not change is answered with the same content";
+  records.erase(records.begin());
+  EXPECT_TRUE(eachOnce());
+  ASSERT_TRUE(radix::client::Connection(viewer).sources);
+  EXPECT_EQ(radix::client::Connection(viewer).sources->at(0).phase, radix::client::SourceState::Phase::Ended);
+
+  radixd->send(SIGKILL);
+  radixd->waitForEnd();
+  ASSERT_TRUE(loop_.runUntil([&] { return !radix::client::Connection(viewer).connected; }, patience));
+  EXPECT_EQ(radix::client::Connection(viewer).sources, std::nullopt);
+  records.clear();
+  std::ofstream(trace_) << logFrom("13.00", 20);
+  radixd = std::make_unique<RadixdProcess>(words);
+  ASSERT_TRUE(radixd->waitForLog("played to its end"));
+  // Twenty states, twenty measurements but for those that came within one millisecond, one cell.
+  ASSERT_TRUE(loop_.runUntil([&] { return records.size() >= 30; }, patience));
+  listen();
+  ASSERT_EQ(status(viewer), 0);
+  ASSERT_EQ(status(viewer), 0);
+  EXPECT_TRUE(eachOnce());
+}
+
 TEST_F(Radixd, FiftyClientsConnectAtOnceAndAllAreServed) {
   RadixdProcess radixd(arguments());
   ASSERT_TRUE(radixd.waitForLog("listening"));
@@ -159,7 +244,7 @@ TEST_F(Radixd, FiftyClientsConnectAtOnceAndAllAreServed) {
     auto result = radix::makeSocketConnector(loop_, surroundings())->connect();
     ASSERT_TRUE(result.link) << "client " << number << ": " << result.error;
     crowd.push_back(std::make_unique<RawClient>(std::move(result.link)));
-    crowd.back()->say(radix::Hello{.name = "crowd"});
+    crowd.back()->say(radix::Hello{.name = "crowd", .observes = true});
     crowd.back()->say(radix::Delivery{true});
   }
   radixd.send(SIGCONT);
@@ -182,7 +267,7 @@ TEST_F(Radixd, WithoutDescriptorsItStaysUpAndServesAgainWhenThereAreSome) {
   std::vector<std::unique_ptr<RawClient>> crowd;
   for (int number = 0; number < 30; ++number) {
     crowd.push_back(std::make_unique<RawClient>(radix::makeSocketConnector(loop_, surroundings())->connect().link));
-    crowd.back()->say(radix::Hello{.name = "crowd"});
+    crowd.back()->say(radix::Hello{.name = "crowd", .observes = true});
   }
   EXPECT_TRUE(radixd.waitForLog("cannot accept a connection: Too many open files; trying again soon"));
   crowd.erase(crowd.begin(), crowd.begin() + 25);

@@ -64,6 +64,48 @@ TEST(ScenarioSource, EachMetricComesOnceWithinTwoSeconds) {
   }
 }
 
+TEST(ScenarioSource, ARecordTellsItsPeriodAsPlannedAndItsAge) {
+  MetricPlan plan;
+  plan.metrics[K_LTE_RSRP_RSRQ_SINR] = 700ms;
+  plan.metrics[K_LTE_RRC_STATE] = std::nullopt;
+  const auto periodsOf = [](const Drive& drive) {
+    std::map<std::int64_t, std::chrono::milliseconds> periods;
+    for (const MetricRecord& record : drive.records) {
+      EXPECT_GE(record.age, 0ns);
+      EXPECT_LT(record.age, 10s);
+      periods[record.metricId] = record.period;
+    }
+    return periods;
+  };
+  Drive planned("city");
+  planned.source->setPlan(plan);
+  planned.listen();
+  planned.forSeconds(30);
+  EXPECT_EQ(periodsOf(planned),
+            (std::map<std::int64_t, std::chrono::milliseconds>{{K_LTE_RSRP_RSRQ_SINR, 700ms}, {K_LTE_RRC_STATE, 0ms}}));
+  // Who observes gets everything beside them, and nothing more seldom.
+  Drive own("city");
+  own.listen();
+  own.forSeconds(30);
+  const auto ownPeriods = periodsOf(own);
+  plan.observed = true;
+  plan.metrics[K_LTE_TX_POWER] = std::chrono::hours(1);
+  Drive observed("city");
+  observed.source->setPlan(plan);
+  observed.listen();
+  observed.forSeconds(30);
+  auto expected = ownPeriods;
+  expected[K_LTE_RSRP_RSRQ_SINR] = std::min(ownPeriods.at(K_LTE_RSRP_RSRQ_SINR), std::chrono::milliseconds(700));
+  EXPECT_EQ(periodsOf(observed), expected);
+  for (const auto& [metric, period] : ownPeriods) {
+    EXPECT_GE(observed.count(metric), own.count(metric)) << nameOf(metric);
+  }
+  // What nobody wants again and again was asked for.
+  planned.records.clear();
+  EXPECT_TRUE(planned.source->query(K_LTE_TX_POWER));
+  EXPECT_EQ(planned.records.back().period, 0ms);
+}
+
 TEST(ScenarioSource, EachMetricComesOnceWithinTwoSecondsWhateverThePlansPeriods) {
   MetricPlan plan;
   for (const std::int64_t id : handledMetrics()) plan.metrics[id] = 60s;
