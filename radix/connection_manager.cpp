@@ -103,6 +103,13 @@ class EventRoad : public std::enable_shared_from_this<EventRoad> {
 
   // On the handlers' queue.
   void handOver() {
+    // A handler that lets the queue run gets what is left when it is through: one event at a time.
+    if (std::exchange(handsOver_, true)) return;
+    handOverWhileOn();
+    handsOver_ = false;
+  }
+
+  void handOverWhileOn() {
     while (!batches_.empty()) {
       Batch& batch = batches_.front();
       while (batch.handedOver < batch.events.size() && !closed_) {
@@ -140,7 +147,9 @@ class EventRoad : public std::enable_shared_from_this<EventRoad> {
   std::atomic<bool> closed_ = false;
   std::atomic<std::size_t> waiting_ = 0;
   std::atomic<bool> stopped_ = false;
-  std::deque<Batch> batches_;  // on the handlers' queue
+  // On the handlers' queue.
+  std::deque<Batch> batches_;
+  bool handsOver_ = false;
 };
 
 class ConnectionManager final : public Manager {

@@ -446,6 +446,25 @@ TEST_F(ServiceConnectionTest, AHandlerMaySwitchEventsOffAndOnInTheMiddleOfABatch
   EXPECT_THAT(metrics, ElementsAre(1, 2, 3, 4));
 }
 
+TEST_F(ServiceConnectionTest, AHandlerThatLetsItsQueueRunGetsTheNextEventWhenItIsThrough) {
+  std::vector<std::int64_t> metrics;
+  int depth = 0;
+  RegisterEventHandler(manager_, kEventMetric, [&](const ObjectHandle& event, Group) {
+    EXPECT_EQ(++depth, 1);
+    current().say(Event{.metricId = 10 + static_cast<std::int64_t>(metrics.size())});
+    if (metrics.size() < 3) loop_.run();
+    metrics.push_back(nativeDictionary(*event).find(kKeyMetricID)->int64().value());
+    --depth;
+    if (metrics.size() == 4) EventsOff(manager_);
+  });
+  EventsOn(manager_);
+  loop_.run();
+  current().say(Event{.metricId = 1});
+  current().say(Event{.metricId = 2});
+  loop_.run();
+  EXPECT_THAT(metrics, ElementsAre(1, 2, 10, 11));
+}
+
 TEST_F(ServiceConnectionTest, AnOlderServiceTellsNeitherAgesNorPeriodsNorSources) {
   restart({.clientName = "client", .observes = true});
   Dictionary got;
