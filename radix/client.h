@@ -91,6 +91,8 @@ Result PerformCommand(const ManagerHandle& manager, std::string_view command, co
                       ObjectHandle& reply);
 // Replaces the handler registered for the event name before.
 void RegisterEventHandler(const ManagerHandle& manager, std::string_view event, EventHandler handler);
+// Off: no event begins to be handed over once this has returned. What was on its way by then is handed over when events
+// are on again: a service sends each record once, so that off and on again loses nothing.
 void EventsOn(const ManagerHandle& manager);
 void EventsOff(const ManagerHandle& manager);
 

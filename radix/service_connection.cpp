@@ -73,7 +73,8 @@ void ServiceConnection::perform(std::shared_ptr<PendingCommand> command) {
 }
 
 void ServiceConnection::setDelivery(bool on) {
-  // Also when it is on already: switching on asks for the last records of a configuration pushed in the meantime.
+  // Also when it is on already: an older service gives the last records of a configuration that was pushed in the
+  // meantime only when events are switched on.
   delivery_ = on;
   if (phase_ == Phase::Ready) send(encode(Delivery{on}));
 }

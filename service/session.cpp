@@ -3,6 +3,7 @@
 
 #include <algorithm>
 #include <array>
+#include <iterator>
 #include <utility>
 
 #include "values/plain_text.h"
@@ -23,6 +24,8 @@ constexpr std::chrono::microseconds flushInterval{500};
 constexpr std::size_t mostWordsUnread = 64;
 // How long a source may take to answer a query: what comes later is no answer. A modem reads files from a card for it.
 constexpr std::chrono::seconds longestAnswer{30};
+// Questions of one client that are open at once.
+constexpr std::size_t mostAnswersAwaited = 256;
 
 }  // namespace
 
@@ -85,29 +88,34 @@ void Session::discardUnwanted() {
 }
 
 void Session::expectAnswer(std::size_t source, std::int64_t metricId) {
-  forgetAnswer(source, metricId);
+  // Whoever asks and asks what is never answered is owed the last of it.
+  if (awaited_.size() >= mostAnswersAwaited) awaited_.erase(awaited_.begin());
   awaited_.push_back(
       {.source = source, .metricId = metricId, .until = worker_.clock().monotonicTime() + longestAnswer, .number = 0});
 }
 
 void Session::forgetAnswer(std::size_t source, std::int64_t metricId) {
-  std::erase_if(awaited_, [&](const AwaitedAnswer& one) { return one.source == source && one.metricId == metricId; });
+  // The question that was asked last; one from before may still be answered.
+  const auto found = std::find_if(awaited_.rbegin(), awaited_.rend(), [&](const AwaitedAnswer& one) {
+    return one.source == source && one.metricId == metricId && one.number == 0;
+  });
+  if (found != awaited_.rend()) awaited_.erase(std::next(found).base());
 }
 
 bool Session::settlesQuery(std::size_t source, std::int64_t metricId, std::uint64_t number,
                            std::chrono::nanoseconds now) {
+  std::erase_if(awaited_, [now](const AwaitedAnswer& one) { return now > one.until; });
   const auto found = std::find_if(awaited_.begin(), awaited_.end(), [&](const AwaitedAnswer& one) {
     return one.source == source && one.metricId == metricId && one.number == 0;
   });
   if (found == awaited_.end()) return false;
-  const bool isInTime = now <= found->until;
-  if (isInTime && !takesEvents()) {
+  if (takesEvents()) {
+    awaited_.erase(found);
+  } else {
     // For when it does, so that switching events off and on loses no answer.
     found->number = number;
-  } else {
-    awaited_.erase(found);
   }
-  return isInTime;
+  return true;
 }
 
 bool Session::settlesQueryLate(std::int64_t metricId, std::uint64_t number) {

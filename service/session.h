@@ -89,10 +89,10 @@ class Session final : radix::LinkListener, radix::FrameHandler {
   // What it has pushed.
   const std::optional<Configuration>& configuration() const { return configuration_; }
   void setConfiguration(std::optional<Configuration> configuration);
-  // It has asked the source for the metric: it is owed the next record of it, whatever its configuration says. A source
+  // It has asked the source for the metric: it is owed one more record of it, whatever its configuration says. A source
   // that takes the question may answer on a later turn, but not for ever.
   void expectAnswer(std::size_t source, std::int64_t metricId);
-  // The source does not answer.
+  // The source has not taken the question.
   void forgetAnswer(std::size_t source, std::int64_t metricId);
 
   // Takes a record that flows, if it is one for this client. It leaves soon, together with others.

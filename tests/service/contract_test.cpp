@@ -382,6 +382,21 @@ TEST_P(Contract, AnAnswerGoesOnceToEachWhoAskedAndToThoseWhoTakeTheMetricAnyway)
   EXPECT_TRUE(until([&] { return !sourceIsHeard(); }));
 }
 
+TEST_P(Contract, EachQuestionIsAnsweredAndOneThatIsRefusedTakesNothingFromThoseBefore) {
+  bool takes = true;
+  world_->onService([&] { world_->script().onQuery = [&takes](std::int64_t) { return takes; }; });
+  Client& client = connect();
+  listen(client);
+  ASSERT_EQ(query(client, 0, K_LTE_RRC_STATE).status, 0);
+  ASSERT_EQ(query(client, 0, K_LTE_RRC_STATE).status, 0);
+  world_->onService([&] { takes = false; });
+  EXPECT_NE(query(client, 0, K_LTE_RRC_STATE).status, 0);
+  for (std::uint8_t number = 1; number <= 3; ++number) world_->emit(K_LTE_RRC_STATE, numbered(number));
+  ASSERT_TRUE(until([&] { return client.events.size() >= 2; }));
+  world_->settle();
+  EXPECT_EQ(numbersOf(client.payloads()), (std::vector<int>{1, 2}));
+}
+
 TEST_P(Contract, AQuestionThatIsRefusedOpensNothing) {
   world_->onService([&] { world_->script().onQuery = [](std::int64_t) { return false; }; });
   Client& client = connect();
