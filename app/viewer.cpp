@@ -21,13 +21,21 @@ namespace probeview {
 
 namespace {
 
+// The descriptor of a log's file, or none with the reason in errno. A pipe is not waited for until somebody reads it.
+int openLogFile(const std::string& path) {
+  const int file = ::open(path.c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC | O_NONBLOCK, 0600);
+  if (file >= 0) ::fcntl(file, F_SETFL, ::fcntl(file, F_GETFL) & ~O_NONBLOCK);
+  return file;
+}
+
 // The logs live as long as the process: wrapper and store keep referring to them.
 bool chooseLogs(const ViewerOptions& options, FrontKind front, std::ostream& errors) {
   const bool pagesOnly = options.pagesOnly || front == FrontKind::Terminal;
   if (options.logFile) {
-    const int file = ::open(options.logFile->c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0600);
+    const int file = openLogFile(*options.logFile);
     if (file < 0) {
-      errors << "the log file " << *options.logFile << " cannot be written: " << std::strerror(errno)
+      errors << "the log file " << *options.logFile
+             << " cannot be written: " << (errno == ENXIO ? "nobody reads this pipe" : std::strerror(errno))
              << "; name another with --log\n";
       return false;
     }

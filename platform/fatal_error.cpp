@@ -1,12 +1,19 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "platform/fatal_error.h"
 
+#include <poll.h>
+#include <signal.h>
 #include <unistd.h>
 
+#include <algorithm>
+#include <chrono>
+#include <cstdint>
 #include <cstdlib>
 #include <string>
 #include <utility>
 #include <vector>
+
+#include "platform/log_writer.h"
 
 namespace probeview {
 
@@ -23,6 +30,23 @@ std::function<void(std::string_view)>& observer() {
   return *one;
 }
 
+// Writes to standard error if somebody takes it within the time given.
+void writeLastLine(std::string_view text, std::chrono::nanoseconds atMost) {
+  const auto milliseconds = std::chrono::duration_cast<std::chrono::milliseconds>(atMost).count();
+  pollfd ready{STDERR_FILENO, POLLOUT, 0};
+  if (::poll(&ready, 1, static_cast<int>(std::max<std::int64_t>(milliseconds, 0))) <= 0) return;
+  // Another process may fill what was free just now; then the alarm ends this one.
+  ::signal(SIGALRM, SIG_DFL);
+  sigset_t alarms;
+  sigemptyset(&alarms);
+  sigaddset(&alarms, SIGALRM);
+  ::pthread_sigmask(SIG_UNBLOCK, &alarms, nullptr);
+  ::alarm(1);
+  // Nothing can be done about a standard error that is closed.
+  [[maybe_unused]] const ssize_t written = ::write(STDERR_FILENO, text.data(), text.size());
+  ::alarm(0);
+}
+
 }  // namespace
 
 void setFatalErrorObserver(std::function<void(std::string_view reason)> newObserver) {
@@ -33,12 +57,13 @@ void addFatalErrorFlush(std::function<void()> flush) { flushes().push_back(std::
 
 void fatalError(std::string_view reason) {
   for (const auto& flush : flushes()) flush();
+  const auto deadline = std::chrono::steady_clock::now() + logsEndTime;
+  drainLogs(logsEndTime);
   if (observer()) observer()(reason);
   std::string text = "probeview: stopped: ";
   text += reason;
   text += '\n';
-  // Nothing can be done about a standard error that is closed.
-  [[maybe_unused]] const ssize_t written = ::write(STDERR_FILENO, text.data(), text.size());
+  writeLastLine(text, deadline - std::chrono::steady_clock::now());
   std::abort();
 }
 

@@ -1,40 +1,57 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "platform/system_log.h"
 
-#include <sys/uio.h>
 #include <syslog.h>
 #include <unistd.h>
 
 #include <algorithm>
 #include <atomic>
 #include <climits>
-#include <csignal>
+#include <string>
+#include <utility>
 
 namespace probeview {
 
 namespace {
+
+constexpr char lossPrefix[] = "probeview: warning: ";
 
 std::atomic<LineSink*>& chosenSink() {
   static std::atomic<LineSink*> sink{nullptr};
   return sink;
 }
 
+SystemLog::Logger systemLogger(const char* identity) {
+  ::openlog(identity, LOG_PID, LOG_USER);
+  return [](std::string_view text) {
+    const int size = static_cast<int>(std::min<std::size_t>(text.size(), INT_MAX));
+    ::syslog(LOG_NOTICE, "%.*s", size, text.data());
+  };
+}
+
 }  // namespace
 
-SystemLog::SystemLog(const char* identity, Echo echo) : echo_(echo) {
-  ::openlog(identity, LOG_PID, LOG_USER);
-  // A closed standard error must not end the process.
-  std::signal(SIGPIPE, SIG_IGN);
+SystemLog::SystemLog(const char* identity, Echo echo) : SystemLog(systemLogger(identity), echo) {}
+
+SystemLog::SystemLog(Logger logger, Echo echo)
+    : toLogger_({.label = "system log", .prefix = lossPrefix, .mostBytes = mostBytes, .gathers = false},
+                [give = std::move(logger)](std::string_view text) {
+                  give(text);
+                  return LogWriter::Outcome::Taken;
+                }) {
+  if (echo == Echo::None) return;
+  toStandardError_ = std::make_unique<LogWriter>(
+      LogWriter::Settings{.label = "log echo", .prefix = lossPrefix, .mostBytes = mostBytes},
+      writeToDescriptor(STDERR_FILENO));
 }
 
 void SystemLog::line(std::string_view text) {
-  const int size = static_cast<int>(std::min<std::size_t>(text.size(), INT_MAX));
-  ::syslog(LOG_NOTICE, "%.*s", size, text.data());
-  if (echo_ == Echo::None) return;
-  char lineEnd = '\n';
-  const iovec parts[] = {{const_cast<char*>(text.data()), text.size()}, {&lineEnd, 1}};
-  // Nothing can be done about a standard error that nobody reads.
-  [[maybe_unused]] const ssize_t written = ::writev(STDERR_FILENO, parts, 2);
+  toLogger_.append(text);
+  if (!toStandardError_) return;
+  // One entry, so that no other process's line comes in between.
+  std::string line(text);
+  line += '\n';
+  toStandardError_->append(line);
 }
 
 LineSink& systemLog() {

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include <unistd.h>
 
+#include <chrono>
 #include <string>
 #include <vector>
 
@@ -8,6 +9,9 @@
 #include "service/radixd.h"
 
 int main(int count, char** arguments) {
-  probeview::ConsoleLog log(STDERR_FILENO);
+  // Nobody is ever kept: the service has one loop for all its clients.
+  probeview::ConsoleLog log(
+      STDERR_FILENO,
+      {.prefix = "radixd: warning: ", .mostBytes = 1024 * 1024, .patience = std::chrono::nanoseconds::zero()});
   return probeview::runRadixd(std::vector<std::string>(arguments + 1, arguments + count), log);
 }

@@ -7,6 +7,7 @@
 #include <cstring>
 #include <ostream>
 
+#include "platform/console_log.h"
 #include "ui/page_snapshot.h"
 
 namespace probeview {
@@ -20,6 +21,7 @@ int PrintFront::run(NavigationStack& navigation, const StatusSource& status) {
     loop_.runUntil(isFilled_, patience);
     if (hasFailed()) return 1;
   }
+  awaitLogsAt(fileDescriptor_);
   const bool onePage = navigation.depth() > 1;
   if (onePage ? printTopPage(navigation) : printBelow(navigation)) write(status().text + "\n");
   // A reader that has gone away has seen enough.
@@ -31,6 +33,8 @@ int PrintFront::run(NavigationStack& navigation, const StatusSource& status) {
 bool PrintFront::hasFailed() const {
   const std::string reason = failure_ ? failure_() : std::string();
   if (reason.empty()) return false;
+  // It is the last word also where the logs go to the same place.
+  drainLogs(logsEndTime);
   *errors_ << reason << "\n";
   return true;
 }

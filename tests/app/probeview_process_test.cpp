@@ -1,7 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
 //
 // The real programs, as a person starts them.
+#include <fcntl.h>
 #include <gtest/gtest.h>
+#include <sys/stat.h>
 
 #include <cstdio>
 
@@ -63,6 +65,29 @@ TEST(Programs, TheConsoleLogGoesToTheFileThatIsNamed) {
   EXPECT_EQ(shown.status, 0);
   EXPECT_EQ(shown.output.find("probeview › Device Info › IMSI\n"), 0u);
   EXPECT_EQ(run("head -n 2 " + folder.path() + "/log").output, "pushing metric file\nQuerying SIM files\n");
+}
+
+TEST(Programs, AConsoleLogThatNobodyReadsKeepsNoPageFromBeingPrinted) {
+  RadixdProcess radixd("scenario:city,seed=1,speed=20");
+  ASSERT_TRUE(radixd.start());
+  const TemporaryFolder folder;
+  const std::string log = folder.path() + "/log";
+  ASSERT_EQ(::mkfifo(log.c_str(), 0600), 0);
+  const FileDescriptor idle(::open(log.c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC));
+  ASSERT_EQ(::fcntl(idle.number(), F_SETPIPE_SZ, 4096), 4096);
+  const auto shown = run("timeout 60 " + probeview + " --print --log " + log + " 2>/dev/null");
+  EXPECT_EQ(shown.status, 0);
+  EXPECT_EQ(shown.output.find("probeview › Device Info › IMSI\n"), 0u);
+}
+
+TEST(Programs, ALogFileThatIsAPipeWithoutAReaderIsRefusedInsteadOfWaitedFor) {
+  const TemporaryFolder folder;
+  const std::string log = folder.path() + "/log";
+  ASSERT_EQ(::mkfifo(log.c_str(), 0600), 0);
+  const auto shown = run("timeout 60 " + probeview + " --print --log " + log + " 2>&1");
+  EXPECT_EQ(shown.status, 1);
+  EXPECT_EQ(shown.output,
+            "the log file " + log + " cannot be written: nobody reads this pipe; name another with --log\n");
 }
 
 TEST(Programs, AReaderThatGoesAwayEndsThePrintingInPeace) {

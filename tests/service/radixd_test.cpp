@@ -11,6 +11,7 @@
 
 #include <algorithm>
 #include <cstring>
+#include <filesystem>
 #include <fstream>
 #include <random>
 #include <set>
@@ -355,15 +356,37 @@ TEST_F(Radixd, GoesOnWhenNobodyCanTakeItsLog) {
   }
 }
 
+TEST_F(Radixd, GoesOnAndEndsWhenItsLogIsAPipeThatNobodyReads) {
+  int ends[2];
+  ASSERT_EQ(::pipe2(ends, O_CLOEXEC), 0);
+  const FileDescriptor reading(ends[0]);
+  FileDescriptor writing(ends[1]);
+  ASSERT_EQ(::fcntl(writing.number(), F_SETPIPE_SZ, 4096), 4096);
+  RadixdProcess radixd(arguments({"--log-level", "debug"}), [&writing] { ::dup2(writing.number(), STDERR_FILENO); });
+  const auto client = manager();
+  const auto deadline = std::chrono::steady_clock::now() + patience;
+  while (status(client) != 0) ASSERT_LT(std::chrono::steady_clock::now(), deadline);
+  // Each answer is a line of the log: far more than a pipe of 4096 bytes holds.
+  for (int number = 0; number < 1000; ++number) ASSERT_EQ(status(client), 0) << number;
+  // It is not that somebody has made the pipe non-blocking, which others may share.
+  EXPECT_EQ(::fcntl(writing.number(), F_GETFL) & O_NONBLOCK, 0);
+  writing.close();
+  radixd.send(SIGTERM);
+  EXPECT_EQ(radixd.waitForEnd(), 0);
+}
+
 TEST_F(Radixd, SleepsWhileNobodyIsThere) {
   RadixdProcess radixd(arguments());
   ASSERT_TRUE(radixd.waitForLog("can fill"));
   const auto switches = [&] {
-    std::ifstream file("/proc/" + std::to_string(radixd.process()) + "/status");
-    std::string line;
     long total = 0;
-    while (std::getline(file, line)) {
-      if (line.find("voluntary_ctxt_switches") == 0) total = std::stol(line.substr(line.find(':') + 1));
+    // Of all its threads.
+    for (const auto& thread :
+         std::filesystem::directory_iterator("/proc/" + std::to_string(radixd.process()) + "/task")) {
+      std::ifstream file(thread.path() / "status");
+      for (std::string line; std::getline(file, line);) {
+        if (line.find("voluntary_ctxt_switches") == 0) total += std::stol(line.substr(line.find(':') + 1));
+      }
     }
     return total;
   };
