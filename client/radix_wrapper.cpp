@@ -60,12 +60,14 @@ struct RadixWrapper::Shared {
     print(*content, line);
     shared->systemLog.line(line);
     if (shared->delegate.get().expired()) return;
-    shared->mainQueue.post([shared, content = std::move(content), operation, isRecord] {
-      const std::shared_ptr<RadixWrapperDelegate> receiver = shared->delegate.get().lock();
-      if (receiver == nullptr) return;
-      if (isRecord) shared->noteRecord(*content);
-      (*receiver.*operation)(content.get());
-    });
+    // It waits until the main thread has had it.
+    shared->mainQueue.post(
+        [shared, content = std::move(content), operation, isRecord, hold = radix::client::holdOf(*event)] {
+          const std::shared_ptr<RadixWrapperDelegate> receiver = shared->delegate.get().lock();
+          if (receiver == nullptr) return;
+          if (isRecord) shared->noteRecord(*content);
+          (*receiver.*operation)(content.get());
+        });
   }
 
   void noteRecord(const Dictionary& event) {

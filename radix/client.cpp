@@ -10,6 +10,8 @@ namespace radix::client {
 
 probeview::Dictionary nativeDictionary(const Object& object) { return object.content(); }
 
+EventHold holdOf(const Object& event) { return event.hold(); }
+
 ObjectHandle makeObject(const probeview::Dictionary& dictionary) { return std::make_shared<Object>(dictionary); }
 
 ManagerHandle CreateManager(std::string clientName, std::shared_ptr<probeview::TaskQueue> queue) {

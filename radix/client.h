@@ -65,6 +65,11 @@ using ObjectHandle = std::shared_ptr<const Object>;
 probeview::Dictionary nativeDictionary(const Object& object);
 ObjectHandle makeObject(const probeview::Dictionary& dictionary);
 
+// For a handler that hands on what an event holds to another queue: until the object and the last copy of this have
+// gone, the event counts among those that wait. Of these a manager takes only so many; the rest waits in the service.
+using EventHold = std::shared_ptr<const void>;
+EventHold holdOf(const Object& event);
+
 // The source group of an event; zero unless a service uses groups.
 using Group = std::int64_t;
 

@@ -10,6 +10,7 @@
 #include "platform/system_log.h"
 #include "radix/object.h"
 #include "radix/service_commands.h"
+#include "radix/waiting_events.h"
 
 namespace radix::client {
 
@@ -21,22 +22,9 @@ using probeview::TaskQueue;
 using probeview::Value;
 using probeview::Worker;
 
-// Events that wait on the handlers' queue before no more are read, and before reading goes on. The rest waits in the
-// service, which then drops the oldest of each metric instead of letting the memory of this process grow.
-// A large payload counts as several events: what waits stays below some megabytes.
-constexpr std::size_t mostEventsWaiting = 4096;
-constexpr std::size_t fewEventsWaiting = 1024;
-constexpr std::size_t bytesOfOneEvent = 2048;
-
-std::size_t weightOf(const std::vector<Event>& events) {
-  std::size_t weight = 0;
-  for (const Event& event : events) weight += 1 + event.payload.size() / bytesOfOneEvent;
-  return weight;
-}
-
 Value number(std::int64_t value) { return value; }
 
-ObjectHandle makeEventObject(const Event& event) {
+ObjectHandle makeEventObject(const Event& event, const EventHold& hold) {
   Dictionary content;
   if (event.kind == EventKind::Trigger) {
     content.reserve(5);
@@ -55,7 +43,7 @@ ObjectHandle makeEventObject(const Event& event) {
     if (event.age) content.append(kKeyAge, number(event.age->count()));
     if (event.period) content.append(kKeyPeriod, number(event.period->count()));
   }
-  return std::make_shared<Object>(std::move(content));
+  return std::make_shared<Object>(std::move(content), hold);
 }
 
 using Handlers = std::map<std::string, EventHandler, std::less<>>;
@@ -64,7 +52,8 @@ using Handlers = std::map<std::string, EventHandler, std::less<>>;
 // run after the manager has gone.
 class EventRoad : public std::enable_shared_from_this<EventRoad> {
  public:
-  EventRoad(std::shared_ptr<TaskQueue> queue, Worker& worker) : queue_(std::move(queue)), worker_(worker) {}
+  EventRoad(std::shared_ptr<TaskQueue> queue, Worker& worker)
+      : queue_(std::move(queue)), waiting_(std::make_shared<WaitingEvents>(worker)) {}
 
   // Callers register one after the other; nobody registers for the same manager from two threads at once.
   void setHandler(std::string_view event, EventHandler handler) {
@@ -78,16 +67,17 @@ class EventRoad : public std::enable_shared_from_this<EventRoad> {
   // of that is kept for the next switching on: it is sent once only, and switching off and on again loses nothing.
   void setOn(bool on) {
     on_ = on;
-    if (on && waiting_ > 0) queue_->post([self = shared_from_this()] { self->handOver(); });
+    if (on && waiting_->any()) queue_->post([self = shared_from_this()] { self->handOver(); });
   }
-  void close() { closed_ = true; }
+  void close() {
+    closed_ = true;
+    waiting_->close();
+  }
 
   // On the worker.
   void deliver(std::vector<Event> events, const std::shared_ptr<ServiceConnection>& connection) {
-    const std::size_t weight = weightOf(events);
-    const std::size_t before = waiting_.fetch_add(weight);
-    if (before + weight > mostEventsWaiting && !stopped_.exchange(true)) connection->setEventsWelcome(false);
-    queue_->post([self = shared_from_this(), batch = Batch{std::move(events), connection}]() mutable {
+    EventHold hold = waiting_->add(events, connection);
+    queue_->post([self = shared_from_this(), batch = Batch{std::move(events), std::move(hold)}]() mutable {
       self->batches_.push_back(std::move(batch));
       self->handOver();
     });
@@ -97,7 +87,7 @@ class EventRoad : public std::enable_shared_from_this<EventRoad> {
   // Events that came together, and those of them that have been handed over.
   struct Batch {
     std::vector<Event> events;
-    std::weak_ptr<ServiceConnection> connection;
+    EventHold hold;
     std::size_t handedOver = 0;
   };
 
@@ -114,39 +104,26 @@ class EventRoad : public std::enable_shared_from_this<EventRoad> {
       Batch& batch = batches_.front();
       while (batch.handedOver < batch.events.size() && !closed_) {
         if (!on_) return;
-        hand(batch.events[batch.handedOver++]);
+        hand(batch.events[batch.handedOver++], batch.hold);
       }
-      const Batch done = std::move(batch);
       batches_.pop_front();
-      settle(done.events, done.connection);
     }
   }
 
-  void hand(const Event& event) const {
+  void hand(const Event& event, const EventHold& hold) const {
     // Asked for each event: the handler before it may have registered another one.
     const auto handlers = handlers_.get();
     if (!handlers) return;
     const auto found = handlers->find(event.kind == EventKind::Trigger ? kEventTrigger : kEventMetric);
     if (found == handlers->end() || !found->second) return;
-    found->second(makeEventObject(event), event.group);
-  }
-
-  void settle(const std::vector<Event>& batch, std::weak_ptr<ServiceConnection> connection) {
-    const std::size_t weight = weightOf(batch);
-    const std::size_t left = waiting_.fetch_sub(weight) - weight;
-    if (left > fewEventsWaiting || closed_ || !stopped_.exchange(false)) return;
-    worker_.post([weak = std::move(connection)] {
-      if (const auto here = weak.lock()) here->setEventsWelcome(true);
-    });
+    found->second(makeEventObject(event, hold), event.group);
   }
 
   std::shared_ptr<TaskQueue> queue_;
-  Worker& worker_;
+  std::shared_ptr<WaitingEvents> waiting_;
   probeview::Guarded<std::shared_ptr<const Handlers>> handlers_;
   std::atomic<bool> on_ = false;
   std::atomic<bool> closed_ = false;
-  std::atomic<std::size_t> waiting_ = 0;
-  std::atomic<bool> stopped_ = false;
   // On the handlers' queue.
   std::deque<Batch> batches_;
   bool handsOver_ = false;

@@ -63,6 +63,9 @@ struct Delivery {
 
 enum class EventKind : std::int32_t { Metric = 0, Trigger = 1 };
 
+// Of an origin no more is taken, sent or kept.
+inline constexpr std::size_t longestOrigin = 1024;
+
 struct Event {
   EventKind kind = EventKind::Metric;
   std::int64_t metricId = 0;
@@ -89,7 +92,7 @@ struct Sources {
   // What is past these is left out or cut, by the side that says it and by the side that hears it.
   static constexpr std::size_t most = 32;
   static constexpr std::size_t mostMetrics = 256;
-  static constexpr std::size_t longestOrigin = 1024;
+  static constexpr std::size_t longestOrigin = radix::longestOrigin;
   static constexpr std::size_t longestReason = 512;
   std::vector<client::SourceState> states{};
 };

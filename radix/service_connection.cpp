@@ -79,8 +79,9 @@ void ServiceConnection::setDelivery(bool on) {
   if (phase_ == Phase::Ready) send(encode(Delivery{on}));
 }
 
-void ServiceConnection::setEventsWelcome(bool welcome) {
-  eventsWelcome_ = welcome;
+void ServiceConnection::setAppetite(Appetite appetite) {
+  if (appetite_ == appetite) return;
+  appetite_ = appetite;
   updateReading();
 }
 
@@ -217,7 +218,8 @@ void ServiceConnection::flush() {
 }
 
 void ServiceConnection::updateReading() {
-  if (link_) link_->setReading(eventsWelcome_ || !waiting_.empty());
+  if (!link_) return;
+  link_->setReading(appetite_ == Appetite::Everything || (appetite_ == Appetite::Replies && !waiting_.empty()));
 }
 
 void ServiceConnection::publish() { events_.state(state_); }
@@ -304,7 +306,11 @@ void ServiceConnection::onReply(Reply reply) {
 }
 
 void ServiceConnection::onEvent(Event event) {
-  batchBytes_ += event.payload.size();
+  // The service cuts it, too; but who says that it is ours?
+  if (event.origin.size() > longestOrigin) {
+    event.origin = std::string(probeview::beginningOf(event.origin, longestOrigin));
+  }
+  batchBytes_ += sizeof event + event.payload.size() + event.origin.size();
   batch_.push_back(std::move(event));
   // So that whoever counts what waits may stop the reading before too much is there.
   if (batchBytes_ >= largestBatch) onBatchEnd();

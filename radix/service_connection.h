@@ -27,10 +27,17 @@ inline constexpr std::chrono::nanoseconds longestReconnectDelay = std::chrono::s
 inline constexpr std::chrono::nanoseconds busyRetryDelay = std::chrono::milliseconds(10);
 // Answers that the service leaves unread before this side leaves it.
 inline constexpr std::size_t mostAnswersUnread = 64;
-// Payload bytes that are handed on together at most; a batch may have one event more.
+// Bytes of events that are handed on together at most; a batch may have one event more.
 inline constexpr std::size_t largestBatch = 1024 * 1024;
 // Commands that wait for their replies at once; more than any caller has threads.
 inline constexpr std::size_t mostCommandsAtOnce = 256;
+
+// What a connection may read now.
+enum class Appetite {
+  Everything,
+  Replies,  // events only while a command waits: its reply stands behind them
+  Nothing
+};
 
 // One command on its way. The worker fills in the result and then opens the gate.
 struct PendingCommand {
@@ -75,8 +82,7 @@ class ServiceConnection final : public std::enable_shared_from_this<ServiceConne
   void refuseConfiguration(const std::string& reason);
   // Whether events are to be delivered, on this connection and on those after it.
   void setDelivery(bool on);
-  // Whether events may come in now. While a command waits they do in any case: its reply stands behind them.
-  void setEventsWelcome(bool welcome);
+  void setAppetite(Appetite appetite);
 
  private:
   enum class Phase { Idle, Greeting, Ready };
@@ -141,7 +147,7 @@ class ServiceConnection final : public std::enable_shared_from_this<ServiceConne
 
   std::vector<Event> batch_;
   std::size_t batchBytes_ = 0;
-  bool eventsWelcome_ = true;
+  Appetite appetite_ = Appetite::Everything;
   ConnectionState state_;
 };
 

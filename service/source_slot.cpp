@@ -6,7 +6,6 @@
 #include <utility>
 
 #include "radix/frames.h"
-#include "radix/link.h"
 #include "service/payload_check.h"
 #include "values/plain_text.h"
 
@@ -16,8 +15,7 @@ namespace {
 
 // What a record's frame needs beside payload and origin.
 constexpr std::size_t frameOverhead = 256;
-constexpr std::size_t longestOrigin = 1024;
-constexpr std::size_t longestPayload = radix::longestFrame - frameOverhead - longestOrigin;
+constexpr std::size_t longestPayload = radix::longestFrame - frameOverhead - radix::longestOrigin;
 
 }  // namespace
 
@@ -60,7 +58,7 @@ SourceSlot::SourceSlot(std::unique_ptr<MetricSource> source, Worker& worker, Ser
       started_(worker.clock().monotonicTime()),
       alive_(std::make_shared<bool>(true)) {
   guarded("naming itself", [this] {
-    origin_ = beginningOf(source_->origin(), longestOrigin);
+    origin_ = beginningOf(source_->origin(), radix::longestOrigin);
     metrics_ = source_->metrics();
   });
 }
@@ -116,7 +114,7 @@ void SourceSlot::emit(MetricRecord record) {
     return;
   }
   if (record.origin.empty()) record.origin = origin_;
-  record.origin.resize(beginningOf(record.origin, longestOrigin).size());
+  record.origin.resize(beginningOf(record.origin, radix::longestOrigin).size());
   constexpr std::chrono::nanoseconds longestAge = radix::longestSpan;
   record.age = std::clamp(record.age, std::chrono::nanoseconds(0), longestAge);
   record.period = std::clamp(record.period, std::chrono::milliseconds(0), radix::longestSpan);

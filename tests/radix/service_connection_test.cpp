@@ -653,6 +653,83 @@ TEST_F(ServiceConnectionTest, TwoThousandAndFortyEightBytesOfPayloadCountAsOneEv
   }
 }
 
+TEST_F(ServiceConnectionTest, TheOriginCountsLikeThePayload) {
+  for (const std::size_t size : {1023U, 1024U}) {
+    auto queue = std::make_shared<ManualLoop>();
+    manager_ = makeConnectionManager(loop_, std::make_unique<TestConnector>(*this), {.clientName = "slow"}, queue);
+    EventsOn(manager_);
+    loop_.run();
+    for (int number = 0; number < 2049; ++number) {
+      current().say(Event{.metricId = 1, .payload = std::vector<std::uint8_t>(size), .origin = std::string(1024, 'o')});
+      loop_.run();
+    }
+    roomLeft(current());
+    loop_.run();
+    EXPECT_EQ(roomLeft(current()), size == 1023 ? 256U : 0U);
+    closeWith(*queue);
+  }
+}
+
+TEST_F(ServiceConnectionTest, AnOriginIsTakenUpTo1024BytesAndNoCharacterIsCutInTwo) {
+  std::vector<std::string> origins;
+  RegisterEventHandler(manager_, kEventMetric, [&](const ObjectHandle& event, Group) {
+    origins.emplace_back(*nativeDictionary(*event).find(kKeyOrigin)->text());
+  });
+  EventsOn(manager_);
+  loop_.run();
+  current().say(Event{.metricId = 1, .origin = std::string(1024, 'o')});
+  current().say(Event{.metricId = 1, .origin = std::string(1025, 'o')});
+  current().say(Event{.metricId = 1, .origin = std::string(1023, 'o') + "\u00FC"});
+  loop_.run();
+  EXPECT_THAT(origins, ElementsAre(std::string(1024, 'o'), std::string(1024, 'o'), std::string(1023, 'o')));
+}
+
+TEST_F(ServiceConnectionTest, AnEventThatItsHandlerHandedOnWaitsUntilTheLastOfItHasGone) {
+  std::vector<EventHold> holds;
+  std::vector<ObjectHandle> objects;
+  RegisterEventHandler(manager_, kEventMetric, [&](const ObjectHandle& event, Group) {
+    // Whoever keeps the object, or only its hold, still has to do with the event.
+    if (holds.size() < objects.size()) {
+      holds.push_back(holdOf(*event));
+    } else {
+      objects.push_back(event);
+    }
+  });
+  EventsOn(manager_);
+  loop_.run();
+  for (std::size_t number = 0; number < 4097; ++number) {
+    current().say(Event{.metricId = 1});
+    loop_.run();
+  }
+  EXPECT_EQ(holds.size() + objects.size(), 4097U);
+  roomLeft(current());
+  loop_.run();
+  EXPECT_EQ(roomLeft(current()), 0U);
+  objects.clear();
+  loop_.run();
+  EXPECT_EQ(roomLeft(current()), 0U) << "2048 are not few yet";
+  holds.resize(1024);
+  loop_.run();
+  EXPECT_EQ(roomLeft(current()), 256U);
+  holds.clear();
+  objects.clear();
+}
+
+TEST_F(ServiceConnectionTest, WhatWaitsIsBoundedAlsoWhileACommandWaitsForAServiceThatFloodsAndNeverAnswers) {
+  auto queue = std::make_shared<ManualLoop>();
+  manager_ = makeConnectionManager(loop_, std::make_unique<TestConnector>(*this), {.clientName = "slow"}, queue);
+  EventsOn(manager_);
+  loop_.run();
+  std::size_t sent = 0;
+  const auto flood = loop_.every(milliseconds(1), [&] {
+    while (current().trySay(Event{.metricId = 1})) ++sent;
+  });
+  EXPECT_EQ(perform().message, "the baseband service did not answer in time");
+  EXPECT_GE(sent, 4U * 4096);
+  EXPECT_LE(sent, 4U * 4096 + 2 * 256);
+  closeWith(*queue);
+}
+
 TEST_F(ServiceConnectionTest, LargeEventsThatComeAllAtOnceAreLeftInTheServiceLikeOthers) {
   auto queue = std::make_shared<ManualLoop>();
   manager_ = makeConnectionManager(loop_, std::make_unique<TestConnector>(*this), {.clientName = "slow"}, queue);
