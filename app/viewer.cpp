@@ -9,10 +9,14 @@
 #include <cstring>
 #include <memory>
 #include <ostream>
+#include <string>
+#include <system_error>
 
 #include "app/application.h"
 #include "platform/console_log.h"
+#include "platform/file_descriptor.h"
 #include "platform/system_log.h"
+#include "platform/time_zone.h"
 #include "ui/open_page.h"
 #include "ui/print_front.h"
 #include "ui/terminal/terminal_front.h"
@@ -47,11 +51,16 @@ bool chooseLogs(const ViewerOptions& options, FrontKind front, std::ostream& err
   return true;
 }
 
+// The toolkit aborts without them.
+constexpr std::size_t descriptorsOfAWindow = 64;
+
 std::unique_ptr<Front> makeFront(FrontKind kind, const MakeWindow& makeWindow, std::string& error) {
   switch (kind) {
     case FrontKind::Window:
-      if (makeWindow) return makeWindow();
-      error = "this build has no window; --terminal and --print show the pages without one";
+      if (makeWindow && mayOpenDescriptors(descriptorsOfAWindow)) return makeWindow();
+      error = makeWindow ? "a window needs " + std::to_string(descriptorsOfAWindow) +
+                               " more open files than this process may have; raise the limit (ulimit -n)"
+                         : "this build has no window; --terminal and --print show the pages without one";
       return nullptr;
     case FrontKind::Terminal:
       return terminal::TerminalFront::make(error);
@@ -63,9 +72,9 @@ std::unique_ptr<Front> makeFront(FrontKind kind, const MakeWindow& makeWindow, s
 
 }  // namespace
 
-int runViewer(const ViewerOptions& options, const MakeWindow& makeWindow, std::ostream& errors) {
-  // A reader that goes away is an end, not an accident.
-  std::signal(SIGPIPE, SIG_IGN);
+namespace {
+
+int show(const ViewerOptions& options, const MakeWindow& makeWindow, std::ostream& errors) {
   const auto kind = chooseFront(frontCircumstances(options.front, makeWindow != nullptr));
   if (!chooseLogs(options, kind, errors)) return 1;
   std::string error;
@@ -81,6 +90,21 @@ int runViewer(const ViewerOptions& options, const MakeWindow& makeWindow, std::o
       print->waitUntil([&session] { return session.isFilled(); });
     }
   });
+}
+
+}  // namespace
+
+int runViewer(const ViewerOptions& options, const MakeWindow& makeWindow, std::ostream& errors) {
+  // A reader that goes away is an end, not an accident.
+  std::signal(SIGPIPE, SIG_IGN);
+  if (const auto trouble = settleTimeZone()) errors << *trouble << "\n";
+  try {
+    return show(options, makeWindow, errors);
+  } catch (const std::system_error& error) {
+    // No descriptors or no threads are left to this process.
+    errors << "the pages cannot be shown: " << error.what() << "\n";
+    return 1;
+  }
 }
 
 }  // namespace probeview

@@ -3,12 +3,13 @@
 
 #include <algorithm>
 #include <charconv>
-#include <fstream>
 #include <span>
 #include <utility>
 #include <vector>
 
+#include "platform/file_beginning.h"
 #include "platform/serial_queue.h"
+#include "radix/link.h"
 #include "values/printer.h"
 
 namespace probeview {
@@ -22,18 +23,6 @@ constexpr std::int64_t configurationPayloadType = 0;
 constexpr std::string_view blockName = "-[RadixWrapper listen]_block_invoke";
 
 Value widened(std::int32_t number) { return static_cast<std::int64_t>(number); }
-
-// The whole content, byte for byte; absent when the file cannot be read.
-std::optional<Value> readWholeFile(const std::string& path) {
-  std::ifstream file(path, std::ios::binary);
-  std::vector<char> content;
-  char block[4096];
-  while (file.read(block, sizeof block) || file.gcount() > 0)
-    content.insert(content.end(), block, block + file.gcount());
-  // The end of the file is how reading is meant to end; a folder fails otherwise.
-  if (!file.eof()) return std::nullopt;
-  return Value::bytes({reinterpret_cast<const std::uint8_t*>(content.data()), content.size()});
-}
 
 void appendInteger(std::int32_t number, std::string& out) { printNumber(static_cast<std::int64_t>(number), out); }
 
@@ -116,11 +105,12 @@ RadixWrapper::~RadixWrapper() = default;
 
 bool RadixWrapper::addTelemConfigForAppId(std::string_view appId, const std::string& protofFilePath) {
   if (appId != applicationId) return false;
-  const std::optional<Value> payload = readWholeFile(protofFilePath);
-  if (!payload) return false;
+  // One byte more than could ever be sent is enough to be refused with the limit.
+  const FileBeginning content = readBeginning(protofFilePath, radix::longestFrame + 1);
+  if (!content.bytes) return false;
   return perform("-[RadixWrapper addTelemConfigForAppId:andProtofFilePath:]", radix::kCommandAddConfiguration,
                  {{radix::kKeyAppID, radix::serviceAppId},
-                  {radix::kKeyPayload, *payload},
+                  {radix::kKeyPayload, Value::bytes(*content.bytes)},
                   {radix::kKeyPayloadType, configurationPayloadType}});
 }
 

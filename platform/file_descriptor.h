@@ -1,9 +1,12 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include <fcntl.h>
 #include <unistd.h>
 
+#include <cstddef>
 #include <utility>
+#include <vector>
 
 namespace probeview {
 
@@ -29,5 +32,16 @@ class FileDescriptor {
  private:
   int number_ = -1;
 };
+
+// Whether the process may still open so many descriptors, for toolkits that abort where they get none.
+inline bool mayOpenDescriptors(std::size_t count) {
+  std::vector<FileDescriptor> all;
+  all.reserve(count);
+  while (all.size() < count) {
+    all.emplace_back(::open("/dev/null", O_RDONLY | O_CLOEXEC));
+    if (!all.back()) return false;
+  }
+  return true;
+}
 
 }  // namespace probeview

@@ -1,6 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "platform/time_zone.h"
 
+#include <sys/stat.h>
+
+#include <cstdlib>
 #include <ctime>
 #include <limits>
 #include <utility>
@@ -75,6 +78,23 @@ ZonePeriod FixedTimeZone::periodAt(std::int64_t) const { return period_; }
 const TimeZone& deviceTimeZone() {
   static const auto* zone = new DeviceTimeZone;
   return *zone;
+}
+
+std::optional<std::string> settleTimeZone() {
+  const char* setting = std::getenv("TZ");
+  if (setting == nullptr) return std::nullopt;
+  std::string path = setting;
+  if (path.starts_with(':')) path.erase(0, 1);
+  if (path.empty()) return std::nullopt;
+  if (!path.starts_with('/')) {
+    const char* folder = std::getenv("TZDIR");
+    path = std::string(folder != nullptr && *folder != '\0' ? folder : "/usr/share/zoneinfo") + "/" + path;
+  }
+  struct stat status;
+  // What is not there is a rule, such as CET-1, or nothing; a folder cannot be read, but it keeps nobody.
+  if (::stat(path.c_str(), &status) != 0 || S_ISREG(status.st_mode) || S_ISDIR(status.st_mode)) return std::nullopt;
+  ::setenv("TZ", "UTC0", 1);
+  return "TZ names " + path + ", which is no regular file; times are shown in UTC";
 }
 
 }  // namespace probeview

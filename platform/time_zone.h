@@ -4,6 +4,7 @@
 #pragma once
 
 #include <cstdint>
+#include <optional>
 #include <string>
 
 namespace probeview {
@@ -37,5 +38,10 @@ class FixedTimeZone final : public TimeZone {
 // The zone that the machine is set to (TZ, else /etc/localtime). A change of the setting, as by a traveller, is noticed
 // when a new period is asked for; periods are at most a minute long. Any thread.
 const TimeZone& deviceTimeZone();
+
+// Looks at what TZ names before the system's library reads it: a file that is no regular one, such as a pipe, could
+// keep the program for ever. Then TZ becomes UTC, and the answer says so in a line for people. At start-up, before
+// other threads.
+std::optional<std::string> settleTimeZone();
 
 }  // namespace probeview

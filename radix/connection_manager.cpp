@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "radix/connection_manager.h"
 
+#include <algorithm>
 #include <atomic>
 #include <deque>
 #include <map>
@@ -21,6 +22,11 @@ using probeview::Task;
 using probeview::TaskQueue;
 using probeview::Value;
 using probeview::Worker;
+
+// Whoever reads a file to send it may have stopped behind the limit.
+std::string sizeText(std::size_t size) {
+  return (size > longestFrame ? "more than " : "") + std::to_string(std::min(size, longestFrame));
+}
 
 Value number(std::int64_t value) { return value; }
 
@@ -170,7 +176,7 @@ class ConnectionManager final : public Manager {
       std::string reason =
           (command == kCommandAddConfiguration || command == kCommandSetBaseConfiguration ? "the configuration has "
                                                                                           : "the command has ") +
-          std::to_string(given) + " bytes; at most " + std::to_string(longestFrame - (size - given)) +
+          sizeText(given) + " bytes; at most " + std::to_string(longestFrame - (size - given)) +
           " fit into one frame";
       if (command == kCommandAddConfiguration) {
         worker_.post([connection = connection_, reason] { connection->refuseConfiguration(reason); });

@@ -347,6 +347,8 @@ Trailer ageTrailer(std::chrono::nanoseconds age) {
 }
 
 bool decodeFrame(std::span<const std::uint8_t> bytes, FrameHandler& handler) {
+  // An unknown frame says something that is not understood; this one says nothing at all.
+  if (bytes.empty()) return false;
   wire::Frame frame;
   PBDataReader reader(bytes);
   if (!frame.readFrom(reader)) return false;

@@ -130,7 +130,8 @@ class FrameHandler {
   virtual void onSources(Sources) {}
 };
 
-// Hands the content to the handler. False when the bytes are no frame; nothing has been handed over then.
+// Hands the content to the handler. False when the bytes are no frame, as no bytes are; nothing has been handed over
+// then.
 bool decodeFrame(std::span<const std::uint8_t> bytes, FrameHandler& handler);
 
 // Dictionaries of commands and replies, with their order and the exact type of each value. Entries of types that the

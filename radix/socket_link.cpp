@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "radix/socket_link.h"
 
+#include <poll.h>
 #include <sys/socket.h>
 
 #include <algorithm>
@@ -102,8 +103,8 @@ class SocketLink final : public Link {
         ended = errno != EAGAIN && errno != EWOULDBLOCK;
         break;
       }
-      // This kind of socket reports its end as an empty record; nobody sends one.
-      if (size == 0) {
+      // This kind of socket reports its end as an empty record; whether it is one, only the socket's state says.
+      if (size == 0 && hasPeerGone()) {
         ended = true;
         break;
       }
@@ -121,6 +122,11 @@ class SocketLink final : public Link {
       if (!alive) return;
     }
     if (ended) close();
+  }
+
+  bool hasPeerGone() const {
+    pollfd socket{socket_.number(), POLLRDHUP, 0};
+    return ::poll(&socket, 1, 0) > 0;
   }
 
   void close() {

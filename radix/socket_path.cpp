@@ -56,6 +56,10 @@ SocketPath userSocketPath(const SocketSurroundings& surroundings, bool create) {
   return {folder + "/radixd.sock", {}};
 }
 
+std::string socketPathTrouble(const std::string& path) {
+  return path.empty() ? "the socket's path is empty; name one, or leave the option away for the usual socket" : "";
+}
+
 std::vector<std::string> clientSocketPaths(const SocketSurroundings& surroundings) {
   if (surroundings.namedSocket) return {*surroundings.namedSocket};
   std::vector<std::string> paths;

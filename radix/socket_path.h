@@ -36,6 +36,10 @@ struct SocketPath {
 // that last folder is made where it is missing.
 SocketPath userSocketPath(const SocketSurroundings& surroundings, bool create);
 
+// Why what a command line names cannot be a socket's path; empty if it may be one. An empty path, as a script gives it
+// whose variable is not set, names nothing and must not stand for the usual socket.
+std::string socketPathTrouble(const std::string& path);
+
 // Where a client looks, in this order: the socket that RADIXD_SOCKET names and no other; else the user's, the system's.
 std::vector<std::string> clientSocketPaths(const SocketSurroundings& surroundings);
 

@@ -29,7 +29,7 @@ class ServiceLog {
 };
 
 // Hands on so many lines a minute and no more, so that nobody fills a disk who comes, is logged and goes again and
-// again; then says how many were left out.
+// again; then says how many were left out. What a program says at its very end is not written through this.
 class BoundedLines final : public LineSink {
  public:
   static constexpr std::size_t mostInAMinute = 1000;

@@ -47,7 +47,8 @@ void describe(CLI::App& program, Options& options) {
       .add_option("--socket", options.socket,
                   "Where to listen; otherwise $XDG_RUNTIME_DIR/radixd.sock (the system's service listens at\n"
                   "/run/radixd/radix.sock)")
-      ->type_name("PATH");
+      ->type_name("PATH")
+      ->check(radix::socketPathTrouble);
   program
       .add_option("--source", options.sources,
                   "What feeds the service, may be given several times: scenario[:NAME][,seed=N][,speed=N] (the\n"
@@ -131,8 +132,20 @@ int serve(const Options& options, ServiceLog& log) {
   }
   for (auto& source : sources) service.addSource(std::move(source));
   loop.run();
-  log.write(LogLevel::Info, "ending");
   return 0;
+}
+
+// With no more lines a minute than anybody needs.
+int serveWithin(const Options& options, LineSink& sink, LogLevel level) {
+  // Who wants to see everything is given everything.
+  BoundedLines bounded(sink, systemClock());
+  ServiceLog log(level == LogLevel::Debug ? sink : bounded, level);
+  try {
+    return serve(options, log);
+  } catch (const std::exception& error) {
+    log.write(LogLevel::Error, std::string("cannot begin: ") + error.what());
+    return failure;
+  }
 }
 
 }  // namespace
@@ -149,15 +162,10 @@ int runRadixd(std::span<const std::string> arguments, LineSink& sink) {
     return program.exit(error) == 0 ? 0 : usageError;
   }
   const LogLevel level = logLevel(options.logLevel).value_or(LogLevel::Info);
-  // Who wants to see everything is given everything.
-  BoundedLines bounded(sink, systemClock());
-  ServiceLog log(level == LogLevel::Debug ? sink : bounded, level);
-  try {
-    return serve(options, log);
-  } catch (const std::exception& error) {
-    log.write(LogLevel::Error, std::string("cannot begin: ") + error.what());
-    return failure;
-  }
+  const int status = serveWithin(options, sink, level);
+  // The last line comes also when there were too many before it.
+  if (status == 0) ServiceLog(sink, level).write(LogLevel::Info, "ending");
+  return status;
 }
 
 }  // namespace probeview

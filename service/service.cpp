@@ -114,7 +114,7 @@ void Service::addSource(std::unique_ptr<MetricSource> source) {
 
 void Service::accept(std::unique_ptr<radix::Link> link, Peer peer) {
   // Those who were refused stay for a moment; a crowd of them is not waited for.
-  if (sessions_.size() >= 2 * settings_.mostClients) {
+  if (sessions_.size() >= 2 * settings_.mostClients + reserve(peer)) {
     if (isWorthTelling(++closedAtOnce_)) {
       log_.write(LogLevel::Warning, "a connection of process " + std::to_string(peer.process) +
                                         " was closed: there are too many already (" + std::to_string(closedAtOnce_) +
@@ -132,9 +132,10 @@ std::size_t Service::clientCount() const {
       std::count_if(sessions_.begin(), sessions_.end(), [](const auto& session) { return session->isActive(); }));
 }
 
-std::optional<std::string> Service::refusal(const Session&) {
-  if (clientCount() < settings_.mostClients) return std::nullopt;
-  return "there are already " + std::to_string(settings_.mostClients) + " clients, more are not served";
+std::optional<std::string> Service::refusal(const Session& session) {
+  const std::size_t clients = clientCount();
+  if (clients < settings_.mostClients + reserve(session.peer())) return std::nullopt;
+  return "there are already " + std::to_string(clients) + " clients, more are not served";
 }
 
 Reply Service::perform(Session& session, const radix::Command& command) {

@@ -30,8 +30,10 @@ class Service final : Session::Host {
     std::string name = "radixd " PROBEVIEW_VERSION;
     std::uint32_t version = radix::protocolVersion;
     std::uint32_t oldestVersion = radix::oldestProtocolVersion;
-    // Clients that are served at once; those past it are told so.
+    // Clients that are served at once; those past it are told so. Of connections there may be twice as many.
     std::size_t mostClients = 128;
+    // Beside both, so many of the service's own user and root: others cannot keep them out.
+    std::size_t keptForOwn = 16;
     // How long a client may take to greet, and to go away after it was refused.
     std::chrono::milliseconds greetingTime{5000};
     std::chrono::milliseconds leavingTime{1000};
@@ -54,6 +56,8 @@ class Service final : Session::Host {
  private:
   friend class StatusReport;
 
+  // How many more than usual there may be for this one.
+  std::size_t reserve(const Peer& peer) const { return peer.isOwn ? settings_.keptForOwn : 0; }
   std::optional<std::string> refusal(const Session& session) override;
   radix::Reply perform(Session& session, const radix::Command& command) override;
   void deliveryChanged(Session& session, bool switchedOn) override;

@@ -30,7 +30,9 @@ struct Peer {
   pid_t process = 0;
   uid_t user = 0;
   // Why it may not connect; it is told so and let go.
-  std::optional<std::string> refusal;
+  std::optional<std::string> refusal{};
+  // The service's own user or root, for whom room is kept beside that of the others.
+  bool isOwn = false;
 };
 
 // The conversation with one client: greets it, hands its commands to the service, sends it what it wants.

@@ -36,6 +36,11 @@ bool isSameFile(const struct stat& left, const struct stat& right) {
   return left.st_dev == right.st_dev && left.st_ino == right.st_ino;
 }
 
+void removeIfSame(const std::string& path, const struct stat& made) {
+  struct stat present;
+  if (::lstat(path.c_str(), &present) == 0 && isSameFile(made, present)) ::unlink(path.c_str());
+}
+
 // Holds the lock of a socket's path for as long as it is open; without it two services that start at once could each
 // take the other for a dead one. Not open, with errno, when it cannot be had (EWOULDBLOCK: somebody has it).
 FileDescriptor lockPath(const std::string& path) {
@@ -73,7 +78,7 @@ std::string removeStale(const std::string& path, const sockaddr_un& address) {
 }  // namespace
 
 std::optional<std::string> Access::refusal(const Credentials& credentials) const {
-  if (credentials.user == 0 || credentials.user == owner) return std::nullopt;
+  if (isOwn(credentials)) return std::nullopt;
   std::string who = "only user " + std::to_string(owner) + " and root";
   if (group) {
     const auto& further = credentials.groups;
@@ -130,12 +135,15 @@ ListeningSocket::Result ListeningSocket::make(const std::string& path, Sharing s
   const int trouble = errno;
   ::umask(before);
   if (bound != 0) return {nullptr, "cannot make a socket at " + path + ": " + std::strerror(trouble)};
+  if (::lstat(path.c_str(), &made->made_) != 0 || !S_ISSOCK(made->made_.st_mode)) {
+    return {nullptr, "the socket at " + path + " was taken away while it was made; name another --socket"};
+  }
   made->path_ = path;
   if (::listen(made->socket_.number(), SOMAXCONN) != 0) {
     return {nullptr, "cannot listen at " + path + ": " + systemError()};
   }
   made->access_.owner = ::geteuid();
-  if (sharing == Sharing::Group) made->access_.group = ::getegid();
+  if (sharing == Sharing::Group) made->access_.group = made->made_.st_gid;
   return {std::move(made), {}};
 }
 
@@ -170,8 +178,9 @@ ListeningSocket::Result ListeningSocket::adopt(int descriptor) {
 
 ListeningSocket::~ListeningSocket() {
   // In this order: whoever gets the lock next finds nothing to be replaced.
-  if (!path_.empty()) ::unlink(path_.c_str());
-  if (lock_ && !lockPath_.empty()) ::unlink(lockPath_.c_str());
+  if (!path_.empty()) removeIfSame(path_, made_);
+  struct stat lock;
+  if (lock_ && !lockPath_.empty() && ::fstat(lock_.number(), &lock) == 0) removeIfSame(lockPath_, lock);
 }
 
 std::vector<int> handedOverSockets() {
@@ -224,7 +233,8 @@ void SocketListener::acceptAll() {
     }
     Peer peer;
     if (const auto credentials = credentials_(connection.number())) {
-      peer = {credentials->process, credentials->user, socket_->access().refusal(*credentials)};
+      peer = {credentials->process, credentials->user, socket_->access().refusal(*credentials),
+              socket_->access().isOwn(*credentials)};
     } else {
       peer.refusal = "the system does not say who connects";
     }

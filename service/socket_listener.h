@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include <sys/stat.h>
 #include <sys/types.h>
 
 #include <functional>
@@ -32,6 +33,8 @@ struct Access {
 
   // Why not; absent if it may.
   std::optional<std::string> refusal(const Credentials& credentials) const;
+  // Whether it is the service's own user or root, for whom some room is kept.
+  bool isOwn(const Credentials& credentials) const { return credentials.user == 0 || credentials.user == owner; }
 };
 
 // Asks the system who is at the other end. Tests put their own answer in its place. Absent when the system gives none.
@@ -46,7 +49,8 @@ class ListeningSocket {
     std::string error;  // what, where and what to do
   };
 
-  // Whose the socket is: the user's alone (mode 0600), or the process's group's, too (0660), as a system's service is.
+  // Whose the socket is: the user's alone (mode 0600), or its group's, too (0660), as a system's service is. That group
+  // is the one that the system gave the socket's file, which a folder may decide.
   enum class Sharing { User, Group };
 
   // Makes the socket at the path. What a service that is no more has left there is replaced; a service that lives, and
@@ -55,7 +59,8 @@ class ListeningSocket {
   // Takes over an open descriptor.
   static Result adopt(int descriptor);
 
-  // Removes the socket it made from its path; leaves alone what it was handed.
+  // Removes the socket and the lock that it made from their paths; leaves alone what it was handed, and what somebody
+  // else has put in their place.
   ~ListeningSocket();
 
   int descriptor() const { return socket_.number(); }
@@ -69,6 +74,7 @@ class ListeningSocket {
   FileDescriptor lock_;
   std::string path_;
   std::string lockPath_;
+  struct stat made_ {};  // the socket's file
   Access access_;
 };
 

@@ -1,16 +1,12 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/config_command.h"
 
-#include <fcntl.h>
-#include <unistd.h>
-
-#include <cerrno>
-#include <cstring>
 #include <memory>
 #include <ostream>
 #include <string>
 
-#include "platform/file_descriptor.h"
+#include "platform/file_beginning.h"
+#include "radix/link.h"
 #include "radix/service_commands.h"
 #include "tools/service_client.h"
 
@@ -18,32 +14,19 @@ namespace probeview {
 
 namespace {
 
-// False, with the reason in errno, when the file cannot be read.
-bool readFile(const std::string& path, std::string& content) {
-  const FileDescriptor file(::open(path.c_str(), O_RDONLY | O_CLOEXEC));
-  if (!file) return false;
-  char block[4096];
-  while (true) {
-    const ssize_t size = ::read(file.number(), block, sizeof block);
-    if (size < 0 && errno != EINTR) return false;
-    if (size == 0) return true;
-    if (size > 0) content.append(block, static_cast<std::size_t>(size));
-  }
-}
-
 ExitStatus push(const std::string& path, Tool& tool) {
-  std::string content;
-  if (!readFile(path, content)) {
-    tool.errors << "probectl: cannot read " << path << ": " << std::strerror(errno) << '\n';
+  // What is more the client library refuses, with the limit.
+  const FileBeginning content = readBeginning(path, radix::longestFrame + 1);
+  if (!content.bytes) {
+    tool.errors << "probectl: cannot read " << path << ": " << content.error << '\n';
     return ExitStatus::Failure;
   }
   ServiceClient client(tool);
-  return client.perform(
-      radix::kCommandSetBaseConfiguration,
-      {{radix::kKeyAppID, radix::serviceAppId},
-       {radix::kKeyPayload, Value::bytes({reinterpret_cast<const std::uint8_t*>(content.data()), content.size()})},
-       {radix::kKeyPayloadType, std::int64_t{0}}},
-      nullptr, path);
+  return client.perform(radix::kCommandSetBaseConfiguration,
+                        {{radix::kKeyAppID, radix::serviceAppId},
+                         {radix::kKeyPayload, Value::bytes(*content.bytes)},
+                         {radix::kKeyPayloadType, std::int64_t{0}}},
+                        nullptr, path);
 }
 
 ExitStatus clear(Tool& tool) {

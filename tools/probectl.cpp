@@ -6,7 +6,11 @@
 
 #include <cstdlib>
 #include <iostream>
+#include <system_error>
 #include <vector>
+
+#include "platform/time_zone.h"
+#include "radix/socket_path.h"
 
 namespace probeview {
 
@@ -34,8 +38,10 @@ std::unique_ptr<CLI::App> makeProbectlGrammar(Tool& tool) {
       std::make_unique<CLI::App>("Looks into the metrics of the phone's radio, live or by hand.", "probectl");
   program->set_version_flag("--version", std::string("probectl ") + PROBEVIEW_VERSION, "Show the version and exit");
   program->set_help_flag("-h,--help", "Show this help and exit; also after a subcommand");
-  program->add_option("--socket", tool.socketPath,
-                      "The service's socket; otherwise $RADIXD_SOCKET, the user's, then the system's");
+  program
+      ->add_option("--socket", tool.socketPath,
+                   "The service's socket; otherwise $RADIXD_SOCKET, the user's, then the system's")
+      ->check(radix::socketPathTrouble);
   program->require_subcommand(1);
   program->get_formatter()->column_width(36);
   program->footer(
@@ -60,8 +66,15 @@ int runProbectl(std::span<const std::string> arguments, std::istream& input, std
     const int status = program->exit(error, output, errors);
     return finished(tool, status == 0 ? ExitStatus::Success : ExitStatus::UsageError);
   }
+  if (const auto trouble = settleTimeZone()) tool.errors << "probectl: " << *trouble << '\n';
   if (tool.socketPath) setenv("RADIXD_SOCKET", tool.socketPath->c_str(), 1);
-  return finished(tool, tool.run());
+  try {
+    return finished(tool, tool.run());
+  } catch (const std::system_error& error) {
+    // No descriptors or no threads are left to this process.
+    tool.errors << "probectl: cannot begin: " << error.what() << '\n';
+    return static_cast<int>(ExitStatus::Failure);
+  }
 }
 
 }  // namespace probeview

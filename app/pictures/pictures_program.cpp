@@ -7,10 +7,20 @@
 
 #include "app/application.h"
 #include "platform/console_log.h"
+#include "platform/file_descriptor.h"
 #include "platform/system_log.h"
+#include "platform/time_zone.h"
+#include "radix/socket_path.h"
 #include "ui/qt/pictures.h"
 
 namespace probeview {
+
+namespace {
+
+// The toolkit aborts without them.
+constexpr std::size_t descriptorsNeeded = 64;
+
+}  // namespace
 
 int runPicturesProgram(int argc, char** argv, std::ostream& output, std::ostream& errors) {
   CLI::App program(
@@ -25,7 +35,8 @@ int runPicturesProgram(int argc, char** argv, std::ostream& output, std::ostream
   auto* socket = program
                      .add_option("--socket", socketPath,
                                  "The service's socket; otherwise $RADIXD_SOCKET, the user's, then the system's")
-                     ->type_name("PATH");
+                     ->type_name("PATH")
+                     ->check(radix::socketPathTrouble);
   program
       .add_option("--page", options.pageKeys,
                   "A category page, such as \"LTE Serving Cell Info\"; may be given several times (default: three "
@@ -44,6 +55,12 @@ int runPicturesProgram(int argc, char** argv, std::ostream& output, std::ostream
   options.light = look != "dark";
   options.dark = look != "light";
   if (*socket) setenv("RADIXD_SOCKET", socketPath.c_str(), 1);
+  if (const auto trouble = settleTimeZone()) errors << *trouble << "\n";
+  if (!mayOpenDescriptors(descriptorsNeeded)) {
+    errors << "the pictures need " << descriptorsNeeded
+           << " more open files than this process may have; raise the limit (ulimit -n)\n";
+    return 1;
+  }
   // The picture is the only output.
   setConsoleLog(*new DiscardingSink);
   setSystemLog(*new SystemLog("probeview", SystemLog::Echo::None));

@@ -90,6 +90,78 @@ TEST(Programs, ALogFileThatIsAPipeWithoutAReaderIsRefusedInsteadOfWaitedFor) {
             "the log file " + log + " cannot be written: nobody reads this pipe; name another with --log\n");
 }
 
+TEST(Programs, WithHardlyAnyDescriptorsEachSaysSoAndEndsWithStatusOne) {
+#ifdef __SANITIZE_ADDRESS__
+  GTEST_SKIP() << "the sanitizer opens a pipe to look at memory and reports a fault of its own when it gets none";
+#endif
+  const TemporaryFolder folder;
+  const std::string socket = folder.path() + "/radixd.sock";
+  const std::string commands[] = {
+      RADIXD " --socket " + socket,
+      probectl + " --socket " + socket + " status",
+      probectl + " --socket " + socket + " watch",
+      probectl + " --socket " + socket + " query K_SIM_FILE_INFO",
+      probectl + " --socket " + socket + " config clear",
+      probectl + " --socket " + socket + " pages",
+      probeview + " --print",
+      "script -qec '" + probeview + " --terminal' /dev/null",
+      "QT_QPA_PLATFORM=offscreen " + probeview + " --window",
+      PICTURES " " + folder.path() + "/pages.png",
+  };
+  for (const std::string& command : commands) {
+    for (const char* limit : {"4", "6", "8"}) {
+      const bool needsPseudoTerminal = command.starts_with("script");
+      // The pseudo-terminal has its own needs.
+      const std::string limited = needsPseudoTerminal
+                                      ? "script -qec 'ulimit -n " + std::string(limit) + "; exec " + probeview +
+                                            " --terminal' /dev/null"
+                                      : "ulimit -n " + std::string(limit) + "; exec env " + command;
+      const auto shown =
+          run("export RADIXD_SOCKET=" + socket + " TERM=xterm; timeout 20 bash -c \"" + limited + "\" 2>&1");
+      // With eight some find what they need, and wait for the service as they always do.
+      if (shown.status == 124) continue;
+      EXPECT_EQ(shown.status, 1) << limited << shown.output;
+      EXPECT_NE(shown.output, "") << limited;
+      EXPECT_EQ(shown.output.find("terminate called"), std::string::npos) << shown.output;
+    }
+  }
+}
+
+TEST(Programs, ASocketWithAnEmptyPathIsRefused) {
+  for (const std::string& command : {probectl + " --socket '' status", PICTURES " x.png --socket ''" + std::string()}) {
+    const auto shown = run(command + " 2>&1");
+    EXPECT_EQ(shown.status, 2) << command;
+    EXPECT_NE(shown.output.find("the socket's path is empty"), std::string::npos) << shown.output;
+  }
+}
+
+TEST(Programs, ATimeZoneOrAConfigurationThatIsAPipeWithoutAWriterHangsNoProgram) {
+  RadixdProcess radixd("scenario:city,seed=1");
+  ASSERT_TRUE(radixd.start());
+  const TemporaryFolder folder;
+  const std::string pipe = folder.path() + "/pipe";
+  ASSERT_EQ(::mkfifo(pipe.c_str(), 0600), 0);
+  const std::string zone = "TZ=" + pipe + " timeout 60 ";
+  const std::string told = "TZ names " + pipe + ", which is no regular file; times are shown in UTC\n";
+  const auto shown = run(zone + probeview + " --print --log " + folder.path() + "/log 2>&1 >/dev/null");
+  EXPECT_EQ(shown.status, 0);
+  EXPECT_EQ(shown.output.find(told), 0u) << shown.output;
+  const auto page = run(zone + probectl + " pages LTE RRC State 2>&1");
+  EXPECT_EQ(page.status, 0);
+  EXPECT_EQ(page.output.find("probectl: " + told), 0u) << page.output;
+  EXPECT_NE(page.output.find(" UTC\n"), std::string::npos) << page.output;
+  const auto pushed = run("timeout 60 " + probectl + " config push " + pipe + " 2>&1");
+  EXPECT_EQ(pushed.status, 1);
+  EXPECT_EQ(pushed.output, "probectl: cannot read " + pipe + ": it is a pipe, and nobody writes to it\n");
+  // What somebody writes is read to its end, and of what never ends no more than is refused.
+  const auto piped = run("echo '[metrics]' | timeout 60 " + probectl + " config push /dev/stdin 2>&1");
+  EXPECT_EQ(piped.status, 0) << piped.output;
+  const auto endless = run("timeout 60 " + probectl + " config push /dev/zero 2>&1");
+  EXPECT_EQ(endless.status, 1);
+  EXPECT_NE(endless.output.find("the configuration has more than 131072 bytes; at most "), std::string::npos)
+      << endless.output;
+}
+
 TEST(Programs, AReaderThatGoesAwayEndsThePrintingInPeace) {
   RadixdProcess radixd("scenario:city,seed=1");
   ASSERT_TRUE(radixd.start());

@@ -77,6 +77,11 @@ TEST_F(SocketPathTest, AFolderOfSomebodyElseIsNotUsed) {
   EXPECT_THAT(userSocketPath(surroundings_, true).error, HasSubstr("not ours alone"));
 }
 
+TEST_F(SocketPathTest, AnEmptyPathOnACommandLineIsNoSocket) {
+  EXPECT_NE(socketPathTrouble(""), "");
+  EXPECT_EQ(socketPathTrouble("radixd.sock"), "");
+}
+
 TEST_F(SocketPathTest, AClientTriesTheNamedSocketAloneElseTheUsersThenTheSystems) {
   surroundings_.runtimeDirectory = "/run/user/77";
   EXPECT_THAT(clientSocketPaths(surroundings_), ElementsAre("/run/user/77/radixd.sock", "/run/radixd/radix.sock"));

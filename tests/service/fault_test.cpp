@@ -234,6 +234,41 @@ TEST_F(Faults, AHundredAndTwentyEightClientsAreServedAndOneMoreIsToldSo) {
   EXPECT_EQ(greeted()->hello->refusalStatus, 0);
 }
 
+TEST_F(Faults, SixteenClientsAndConnectionsMoreAreKeptForTheServicesOwnUserAndRoot) {
+  const auto connectOwn = [this] {
+    auto [near, far] = radix::makeInProcessLinks(loop_);
+    service_.accept(std::move(far), {.isOwn = true});
+    return std::make_unique<RawClient>(std::move(near));
+  };
+  std::deque<std::unique_ptr<RawClient>> crowd;
+  for (int number = 0; number < 127; ++number) crowd.push_back(greeted(std::string(64, 'n')));
+  EXPECT_NE(greeted("late")->hello->refusalStatus, 0);
+  std::deque<std::unique_ptr<RawClient>> own;
+  for (int number = 0; number < 17; ++number) {
+    own.push_back(connectOwn());
+    own.back()->say(radix::Hello{.name = std::string(64, 'o')});
+  }
+  loop_.run();
+  EXPECT_EQ(service_.clientCount(), 128U + 16);
+  EXPECT_EQ(own[15]->hello->refusalStatus, 0);
+  EXPECT_EQ(own[16]->hello->refusal, "there are already 144 clients, more are not served");
+  // What the service has to say of so many fits into one frame.
+  EXPECT_EQ(status().find("clients")->list()->size(), 144U);
+  own.clear();
+  crowd.clear();
+  loop_.advance(seconds(2));
+
+  // One connection is the manager's.
+  for (int number = 0; number < 255; ++number) crowd.push_back(connectRaw());
+  const auto late = connectRaw();
+  for (int number = 0; number < 16; ++number) own.push_back(connectOwn());
+  const auto ownLate = connectOwn();
+  loop_.run();
+  EXPECT_TRUE(late->closed);
+  for (const auto& client : own) EXPECT_FALSE(client->closed);
+  EXPECT_TRUE(ownLate->closed);
+}
+
 TEST_F(Faults, TwoHundredAndFiftySixConnectionsAreKeptAndOneMoreIsClosedWithoutAWord) {
   std::vector<std::unique_ptr<RawClient>> crowd;
   for (int number = 0; number < 255; ++number) crowd.push_back(connectRaw());

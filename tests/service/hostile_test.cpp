@@ -90,6 +90,13 @@ TEST_P(HostileClients, AMalformedFrameEndsItsSenderWithAReason) {
   expectOthersServed();
 }
 
+TEST_P(HostileClients, AFrameOfNoBytesIsToldFromTheEndAndEndsItsSenderWithAReason) {
+  const auto client = greeted();
+  client->sayBytes({});
+  expectRefused(*client, Status::MalformedFrame, "");
+  world_->onService([this] { EXPECT_EQ(world_->log().count("has gone after"), 0U); });
+}
+
 TEST_P(HostileClients, WhoeverDoesNotGreetFirstIsRefused) {
   const auto client = connect();
   client->say(radix::Delivery{true});
@@ -300,7 +307,7 @@ TEST_P(HostileClients, ASourceThatFloodsDoesNotKeepClientsFromTheirCommands) {
 }
 
 TEST_P(HostileClients, ClientsUpToTheLimitAreServedAndOneMoreIsToldSo) {
-  make({.mostClients = 4});
+  make({.mostClients = 4, .keptForOwn = 0});
   std::vector<std::unique_ptr<RawClient>> crowd;
   for (int number = 0; number < 3; ++number) {
     crowd.push_back(greeted());

@@ -375,6 +375,43 @@ TEST_F(Radixd, GoesOnAndEndsWhenItsLogIsAPipeThatNobodyReads) {
   EXPECT_EQ(radixd.waitForEnd(), 0);
 }
 
+// Connects as a program would that knows nothing of ours; the number of the descriptor, or -1.
+int connectPlainly(const std::string& path) {
+  const int socket = ::socket(AF_UNIX, SOCK_SEQPACKET | SOCK_CLOEXEC, 0);
+  sockaddr_un address{};
+  address.sun_family = AF_UNIX;
+  std::memcpy(address.sun_path, path.data(), path.size());
+  if (::connect(socket, reinterpret_cast<const sockaddr*>(&address), sizeof address) == 0) return socket;
+  ::close(socket);
+  return -1;
+}
+
+TEST_F(Radixd, ItsLastLineComesAlsoAfterMoreLinesThanAMinuteMayHave) {
+  RadixdProcess radixd(arguments());
+  ASSERT_TRUE(radixd.waitForLog("listening"));
+  // Each comes and goes with a line.
+  const auto hello = radix::encode(radix::Hello{.name = "guest"});
+  for (int number = 0; number < 600; ++number) {
+    const FileDescriptor guest(connectPlainly(socket_));
+    ASSERT_TRUE(guest);
+    ::send(guest.number(), hello->data(), hello->size(), MSG_NOSIGNAL);
+    char answer[4096];
+    ASSERT_GT(::recv(guest.number(), answer, sizeof answer, 0), 0);
+  }
+  radixd.send(SIGTERM);
+  EXPECT_EQ(radixd.waitForEnd(), 0);
+  const std::string& log = radixd.log();
+  EXPECT_LE(std::count(log.begin(), log.end(), '\n'), 1002);
+  EXPECT_THAT(log, HasSubstr(" lines were left out here, as there were more than 1000 in a minute\n"));
+  EXPECT_TRUE(log.ends_with("\nradixd: info: ending\n"));
+}
+
+TEST_F(Radixd, ASocketWithAnEmptyPathIsRefused) {
+  RadixdProcess radixd({"--socket", "", "--source", "trace:" + trace_});
+  EXPECT_EQ(radixd.waitForEnd(), 2);
+  EXPECT_THAT(radixd.log(), HasSubstr("the socket's path is empty"));
+}
+
 TEST_F(Radixd, SleepsWhileNobodyIsThere) {
   RadixdProcess radixd(arguments());
   ASSERT_TRUE(radixd.waitForLog("can fill"));
@@ -399,17 +436,6 @@ TEST_F(Radixd, SleepsWhileNobodyIsThere) {
   moment = loop_.after(std::chrono::seconds(1), [&] { late = true; });
   loop_.runUntil([&] { return late; }, patience);
   EXPECT_EQ(switches(), before);
-}
-
-// Connects as a program would that knows nothing of ours; the number of the descriptor, or -1.
-int connectPlainly(const std::string& path) {
-  const int socket = ::socket(AF_UNIX, SOCK_SEQPACKET | SOCK_CLOEXEC, 0);
-  sockaddr_un address{};
-  address.sun_family = AF_UNIX;
-  std::memcpy(address.sun_path, path.data(), path.size());
-  if (::connect(socket, reinterpret_cast<const sockaddr*>(&address), sizeof address) == 0) return socket;
-  ::close(socket);
-  return -1;
 }
 
 TEST_F(Radixd, AClientThatIsKilledWhileItTalksLeavesTheOthersServed) {

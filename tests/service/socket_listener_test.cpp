@@ -85,6 +85,35 @@ TEST_F(ListeningSocketTest, LeavesNothingBehind) {
   EXPECT_FALSE(exists(path_ + ".lock"));
 }
 
+TEST_F(ListeningSocketTest, ItsGroupIsTheOneThatTheFileHasAndNotTheProcesss) {
+  if (::geteuid() != 0) GTEST_SKIP() << "only root may give a folder to a group of its choice";
+  constexpr gid_t other = 54321;
+  const std::string shared = folder_.path() + "/shared";
+  ASSERT_EQ(::mkdir(shared.c_str(), 0700), 0);
+  ASSERT_EQ(::chown(shared.c_str(), static_cast<uid_t>(-1), other), 0);
+  // What is made in this folder gets the folder's group.
+  ASSERT_EQ(::chmod(shared.c_str(), 02750), 0);
+  const auto result = ListeningSocket::make(shared + "/radixd.sock", ListeningSocket::Sharing::Group);
+  ASSERT_TRUE(result.socket) << result.error;
+  EXPECT_EQ(statusOf(shared + "/radixd.sock").st_gid, other);
+  EXPECT_EQ(result.socket->access().group, other);
+}
+
+TEST_F(ListeningSocketTest, WhatSomebodyElseHasPutInItsPlaceIsLeftThere) {
+  auto first = ListeningSocket::make(path_);
+  ASSERT_TRUE(first.socket);
+  ASSERT_EQ(::unlink(path_.c_str()), 0);
+  ASSERT_EQ(::unlink((path_ + ".lock").c_str()), 0);
+  auto second = ListeningSocket::make(path_);
+  ASSERT_TRUE(second.socket) << second.error;
+  first.socket.reset();
+  EXPECT_TRUE(exists(path_));
+  EXPECT_TRUE(exists(path_ + ".lock"));
+  second.socket.reset();
+  EXPECT_FALSE(exists(path_));
+  EXPECT_FALSE(exists(path_ + ".lock"));
+}
+
 TEST_F(ListeningSocketTest, ASecondOneAtALiveSocketIsRefused) {
   const auto first = ListeningSocket::make(path_);
   ASSERT_TRUE(first.socket);
@@ -227,6 +256,27 @@ TEST_F(ListenerTest, AForeignUsersConnectionIsRefusedWithAReasonAndLogged) {
   own->say(radix::Hello{.name = "own"});
   ASSERT_TRUE(loop_.runUntil([&] { return own->hello.has_value(); }, patience));
   EXPECT_EQ(own->hello->refusalStatus, 0);
+}
+
+TEST_F(ListenerTest, TheServicesOwnUserAndRootAreKnownAsSuch) {
+  const auto made = ListeningSocket::make(path_ + "2");
+  ASSERT_TRUE(made.socket);
+  EXPECT_TRUE(made.socket->access().isOwn({1, ::geteuid(), 50, {}}));
+  EXPECT_TRUE(made.socket->access().isOwn({1, 0, 0, {}}));
+  EXPECT_FALSE(made.socket->access().isOwn({1, ::geteuid() + 1, ::getegid(), {}}));
+  std::vector<bool> own;
+  path_ += "3";
+  auto socket = ListeningSocket::make(path_);
+  SocketListener listener(
+      loop_, service_.log(), std::move(socket.socket), [this](int one) { return credentials(one); },
+      [&own](auto, const Peer& peer) { own.push_back(peer.isOwn); });
+  ASSERT_TRUE(listener.start());
+  const auto first = connect();
+  ASSERT_TRUE(loop_.runUntil([&] { return own.size() == 1; }, patience));
+  foreign_ = Credentials{4711, ::geteuid() + 1, 12345, {}};
+  const auto second = connect();
+  ASSERT_TRUE(loop_.runUntil([&] { return own.size() == 2; }, patience));
+  EXPECT_EQ(own, (std::vector<bool>{true, false}));
 }
 
 TEST_F(ListenerTest, AConnectionWhoseUserTheSystemDoesNotTellIsRefused) {

@@ -182,7 +182,7 @@ TEST_F(ServiceCommands, AConfigurationThatIsRefusedOrCannotBeReadEndsWithStatusO
   EXPECT_THAT(refused.errors, HasSubstr("line 1"));
   std::ofstream(path) << std::string(200000, '#');
   EXPECT_THAT(probectl({"config", "push", path}).errors,
-              StartsWith("probectl: " + path + ": the configuration has 200000 bytes; at most "));
+              StartsWith("probectl: " + path + ": the configuration has more than 131072 bytes; at most "));
   std::ofstream(path) << "[metrics]\nK_NOBODY_KNOWS = 5\n";
   const Outcome noted = probectl({"config", "push", path});
   EXPECT_EQ(noted.status, 0);
