@@ -100,6 +100,15 @@ TEST_F(RadixWrapperTest, AFileLargerThanOneReadIsSentWhole) {
   EXPECT_EQ(manager_->sent[0].find("kKeyPayload")->bytes()->size(), content.size());
 }
 
+TEST_F(RadixWrapperTest, OfWhatHasNoEndNoMoreIsReadThanIsRefusedAndTheRefusalIsLogged) {
+  manager_->answer = {5, "too large"};
+  EXPECT_FALSE(wrapper_.addTelemConfigForAppId("probeview", "/dev/zero"));
+  ASSERT_EQ(manager_->sent.size(), 1u);
+  EXPECT_EQ(manager_->sent[0].find("kKeyPayload")->bytes()->size(), 128u * 1024 + 1);
+  EXPECT_EQ(systemLog_.lines,
+            (Lines{"-[RadixWrapper addTelemConfigForAppId:andProtofFilePath:]: error=5 msg=too large"}));
+}
+
 TEST_F(RadixWrapperTest, AnEmptyButExistingFileIsSentAsAnEmptyDataValue) {
   EXPECT_TRUE(wrapper_.addTelemConfigForAppId("probeview", file("")));
   EXPECT_EQ(manager_->calls,
