@@ -373,6 +373,7 @@ TEST(ConsoleLog, AProgramMayChooseAnotherSink) {
   };
   static Collected collected;
   setConsoleLog(collected);
+  collected.lines.clear();
   consoleLog().line("Querying SIM files");
   EXPECT_EQ(collected.lines, (Writes{"Querying SIM files"}));
 }

@@ -787,7 +787,7 @@ TEST_P(Contract, WhatWasClearedOrSwitchedOffIsNotRestored) {
 }
 
 TEST_P(Contract, AClientPastTheLimitIsRefusedWithAReasonAndTheOthersAreServed) {
-  make({.mostClients = 3});
+  make({.mostClients = 3, .keptForOwn = 0});
   for (int number = 0; number < 3; ++number) {
     ASSERT_EQ(perform(connect(), radix::kCommandShowStatus).status, 0);
   }
