@@ -186,7 +186,11 @@ TEST(Frames, UnknownFramesAndFieldsAreIgnored) {
   recorder.said.clear();
   EXPECT_TRUE(decodeFrame(Bytes{0x2A, 0x02, 0x08, 0x07}, recorder));
   EXPECT_EQ(recorder.said, "");
-  EXPECT_TRUE(decodeFrame(Bytes{}, recorder));
+}
+
+TEST(Frames, NoBytesAreNoFrame) {
+  Recorder recorder;
+  EXPECT_FALSE(decodeFrame(Bytes{}, recorder));
   EXPECT_EQ(recorder.said, "");
 }
 
