@@ -73,8 +73,8 @@ class RadixWrapper {
   static const std::shared_ptr<TaskQueue>& queue();
 
   // Pushes the whole content of the file as this client's configuration. False, with nothing sent and nothing logged,
-  // for an application other than "probeview" and for a file that cannot be read. Of a file that is too large no more is
-  // read than shows that it is; the client library refuses it.
+  // for an application other than "probeview" and for a file that cannot be read. Of a file that is too large no more
+  // is read than shows that it is; the client library refuses it.
   bool addTelemConfigForAppId(std::string_view appId, const std::string& protofFilePath);
   // Clears this client's configuration.
   bool removeTelemConfigForAppid(std::string_view appId);

@@ -176,8 +176,7 @@ class ConnectionManager final : public Manager {
       std::string reason =
           (command == kCommandAddConfiguration || command == kCommandSetBaseConfiguration ? "the configuration has "
                                                                                           : "the command has ") +
-          sizeText(given) + " bytes; at most " + std::to_string(longestFrame - (size - given)) +
-          " fit into one frame";
+          sizeText(given) + " bytes; at most " + std::to_string(longestFrame - (size - given)) + " fit into one frame";
       if (command == kCommandAddConfiguration) {
         worker_.post([connection = connection_, reason] { connection->refuseConfiguration(reason); });
       }
