@@ -9,6 +9,10 @@ set(CMAKE_RUNTIME_OUTPUT_DIRECTORY ${CMAKE_BINARY_DIR}/bin)
 find_program(PROBEVIEW_CCACHE ccache)
 if(PROBEVIEW_CCACHE AND NOT CMAKE_CXX_COMPILER_LAUNCHER)
   set(CMAKE_CXX_COMPILER_LAUNCHER ${PROBEVIEW_CCACHE})
+  # Compiled headers are kept in the cache only by who promises that they hold no time of day.
+  if(PROBEVIEW_QUICK_COLD)
+    list(PREPEND CMAKE_CXX_COMPILER_LAUNCHER ${CMAKE_COMMAND} -E env CCACHE_SLOPPINESS=pch_defines,time_macros)
+  endif()
 endif()
 
 # Linking some sixty test programs is a good part of a build; mold does it several times as fast as the default linker.
@@ -16,6 +20,13 @@ endif()
 find_program(PROBEVIEW_MOLD mold)
 if(PROBEVIEW_MOLD AND NOT CMAKE_CROSSCOMPILING)
   add_link_options(-fuse-ld=mold)
+endif()
+
+# A build that begins anew spends its time on the same headers and templates again and again. The builds that nobody works
+# in compile each room as a few large files instead; in the everyday build a changed file costs that file alone, and each
+# file must name every header that it uses.
+if(PROBEVIEW_QUICK_COLD)
+  set(CMAKE_UNITY_BUILD ON)
 endif()
 
 find_package(Threads REQUIRED)

@@ -20,7 +20,7 @@ void neighbourMeasurement(HandlerTurn& turn) {
   turn.collect("lte_ncell_meas", turn.gsm().eUtraNbrMeas, lte);
 }
 
-constexpr MetricHandler handlers[] = {
+constexpr MetricHandler gsmTable[] = {
     // Without the "is" of the others.
     {K_GSM_SCELL_INFO, DisplayDictionary::myGSMScellInfoDict, "Received GSM Serving Cell Info ", formatTimestampAndLog},
     {K_GSM_IDLE_CONFIG, DisplayDictionary::myGSMIdleConfigInfoDict, "Received GSM Idle Config Info is ",
@@ -37,6 +37,6 @@ constexpr MetricHandler handlers[] = {
 
 }  // namespace
 
-std::span<const MetricHandler> gsmHandlers() { return handlers; }
+std::span<const MetricHandler> gsmHandlers() { return gsmTable; }
 
 }  // namespace probeview

@@ -63,7 +63,7 @@ void carrierAggregation(HandlerTurn& turn) {
   turn.collect("scc_list", turn.lte().CAStatusList, carrier);
 }
 
-constexpr MetricHandler handlers[] = {
+constexpr MetricHandler lteTable[] = {
     {K_LTE_RRC_STATE, DisplayDictionary::myLTERRCStateDict, "Current RRC state is ", formatTimestampAndLog},
     {K_LTE_CDRX_CONFIG, DisplayDictionary::myLTECDRXConfigDict, "Current CDRX Config is ", formatTimestampAndLog},
     {K_LTE_SCELL_INFO, DisplayDictionary::myLTESCellInfoDict, "Current Serving Cell Info is ", servingCellInfo},
@@ -80,6 +80,6 @@ constexpr MetricHandler handlers[] = {
 
 }  // namespace
 
-std::span<const MetricHandler> lteHandlers() { return handlers; }
+std::span<const MetricHandler> lteHandlers() { return lteTable; }
 
 }  // namespace probeview

@@ -27,7 +27,7 @@ void simFiles(HandlerTurn& turn) {
   turn.collect("ef_list", turn.common().simContents, {}, {});
 }
 
-constexpr MetricHandler handlers[] = {
+constexpr MetricHandler nasTable[] = {
     {K_CELLULAR_MM_INFO, DisplayDictionary::myCellularMMCommonInfoDict,
      "Received MM Common Info Dict is : ", formatTimestampAndLog},
     {K_CELLULAR_MM_CTXT, DisplayDictionary::myMMContextDict, "Received MM Context Info is ", formatTimestampAndLog},
@@ -40,6 +40,6 @@ constexpr MetricHandler handlers[] = {
 
 }  // namespace
 
-std::span<const MetricHandler> nasHandlers() { return handlers; }
+std::span<const MetricHandler> nasHandlers() { return nasTable; }
 
 }  // namespace probeview

@@ -38,7 +38,7 @@ void neighbourMeasurement(HandlerTurn& turn) {
   turn.collect("meas_lte_result", turn.umts().eUtraNbrMeas, lte);
 }
 
-constexpr MetricHandler handlers[] = {
+constexpr MetricHandler umtsTable[] = {
     {K_UMTS_SCELL_MEAS, DisplayDictionary::myUMTSCellMeasDict, "Received UMTS Serving Cell Meas is ",
      servingCellMeasurement},
     {K_UMTS_TX_POWER, DisplayDictionary::myUMTSTxPowerDict, "Received Tx Power is ", txPower},
@@ -55,6 +55,6 @@ constexpr MetricHandler handlers[] = {
 
 }  // namespace
 
-std::span<const MetricHandler> umtsHandlers() { return handlers; }
+std::span<const MetricHandler> umtsHandlers() { return umtsTable; }
 
 }  // namespace probeview

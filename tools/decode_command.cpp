@@ -14,7 +14,7 @@ namespace probeview {
 
 namespace {
 
-struct Options {
+struct DecodeOptions {
   bool batch = false;
   std::string reference;
   std::string hex;
@@ -30,7 +30,7 @@ std::string valueForAPerson(const Value& value) {
   return std::ranges::none_of(bare, isControlCharacter) ? bare : printed(value);
 }
 
-ExitStatus decodeForAPerson(const Options& options, Tool& tool) {
+ExitStatus decodeForAPerson(const DecodeOptions& options, Tool& tool) {
   const std::optional<std::vector<std::uint8_t>> bytes = parseHex(options.hex);
   if (!bytes) {
     tool.errors << "probectl: " << quotedExcerpt(options.hex)
@@ -99,7 +99,7 @@ ExitStatus runBatch(Tool& tool) {
 
 void addDecodeCommand(CLI::App& program, Tool& tool) {
   CLI::App* command = program.add_subcommand("decode", "Decode payloads by hand");
-  auto options = std::make_shared<Options>();
+  auto options = std::make_shared<DecodeOptions>();
   CLI::Option* reference = command->add_option("CLASS|METRIC", options->reference,
                                                "A message class, a metric, or a metric's identifier (decimal or 0x…)");
   CLI::Option* hex = command->add_option("HEX", options->hex, "The payload in hexadecimal, - for an empty one");

@@ -13,12 +13,12 @@ namespace probeview {
 
 namespace {
 
-struct Options {
+struct PagesOptions {
   std::vector<std::string> key;
   std::string logFile;
 };
 
-ExitStatus showPages(const Options& options, Tool& tool) {
+ExitStatus showPages(const PagesOptions& options, Tool& tool) {
   ViewerOptions viewer;
   viewer.pagesOnly = true;
   if (!options.logFile.empty()) viewer.logFile = options.logFile;
@@ -41,7 +41,7 @@ ExitStatus showPages(const Options& options, Tool& tool) {
 
 void addPagesCommand(CLI::App& program, Tool& tool) {
   CLI::App* command = program.add_subcommand("pages", "Show the viewer's pages as text");
-  auto options = std::make_shared<Options>();
+  auto options = std::make_shared<PagesOptions>();
   command->add_option("KEY", options->key, "The page to show, as LTE Serving Cell Info; without it, all");
   command
       ->add_option("--log", options->logFile, "Write the console log of every metric to this file; else it is dropped")

@@ -18,12 +18,12 @@ namespace {
 // How long a source may take; a modem reads files from a card for it.
 constexpr std::chrono::seconds answerDeadline{5};
 
-struct Options {
+struct QueryOptions {
   std::string metric;
   RecordText::Options text;
 };
 
-ExitStatus query(const Options& options, Tool& tool) {
+ExitStatus query(const QueryOptions& options, Tool& tool) {
   const std::optional<std::int64_t> metric = metricOnCommandLine(options.metric);
   if (!metric) {
     tool.errors << "probectl: " << quotedExcerpt(options.metric) << " is no metric and no metric's identifier\n";
@@ -61,7 +61,7 @@ ExitStatus query(const Options& options, Tool& tool) {
 
 void addQueryCommand(CLI::App& program, Tool& tool) {
   CLI::App* command = program.add_subcommand("query", "Ask the service to report one metric now");
-  auto options = std::make_shared<Options>();
+  auto options = std::make_shared<QueryOptions>();
   command->add_option("METRIC", options->metric, "A metric, or a metric's identifier (decimal or 0x…)")->required();
   command->add_flag("--json", options->text.json, "One JSON object instead of text, as watch prints it");
   command->add_flag("--personal", options->text.personal,

@@ -16,7 +16,7 @@ namespace probeview {
 
 namespace {
 
-struct Options {
+struct WatchOptions {
   RecordText::Options text;
   std::uint64_t count = 0;  // 0: no end
 };
@@ -52,7 +52,7 @@ class ServiceNotes {
   std::uint64_t lost_ = 0;
 };
 
-ExitStatus watch(const Options& options, Tool& tool) {
+ExitStatus watch(const WatchOptions& options, Tool& tool) {
   ServiceClient client(tool, {.observes = true});
   client.loop().onSignals({SIGINT, SIGTERM}, [&client](int) { client.loop().stop(); });
   RecordText text(options.text);
@@ -81,7 +81,7 @@ ExitStatus watch(const Options& options, Tool& tool) {
 
 void addWatchCommand(CLI::App& program, Tool& tool) {
   CLI::App* command = program.add_subcommand("watch", "Print each metric as it arrives from the service");
-  auto options = std::make_shared<Options>();
+  auto options = std::make_shared<WatchOptions>();
   command->add_flag("--json", options->text.json, "One JSON object a line instead of text");
   command->add_flag("--personal", options->text.personal,
                     "Show IMSI, TMSI, GUTI, addresses and SIM contents, which are … otherwise");

@@ -9,7 +9,7 @@ namespace probeview {
 
 namespace {
 
-constexpr std::size_t step = 64;
+constexpr std::size_t stepSize = 64;
 constexpr std::size_t shelfCount = 32;
 // How many bytes a thread keeps: enough for the dictionaries of the largest message.
 constexpr std::size_t mostKept = keepsMemory ? std::size_t{256} << 10 : 0;
@@ -44,10 +44,10 @@ struct Keeper {
 thread_local const Keeper keeper;
 
 // 0 for up to one step, 1 for up to two; beyond the shelves for what is larger, and for nothing at all.
-std::size_t shelfOf(std::size_t size) noexcept { return (size - 1) / step; }
+std::size_t shelfOf(std::size_t size) noexcept { return (size - 1) / stepSize; }
 
 [[gnu::noinline]] void* takeNewMemory(std::size_t size) {
-  return ::operator new(shelfOf(size) < shelfCount ? (shelfOf(size) + 1) * step : size);
+  return ::operator new(shelfOf(size) < shelfCount ? (shelfOf(size) + 1) * stepSize : size);
 }
 
 [[gnu::noinline]] void letMemoryGo(void* memory, std::size_t size) noexcept {
@@ -63,13 +63,13 @@ void* takeMemory(std::size_t size) {
   if (shelf >= shelfCount || shelves.bySize[shelf] == nullptr) return takeNewMemory(size);
   Piece* piece = shelves.bySize[shelf];
   shelves.bySize[shelf] = piece->next;
-  shelves.room += (shelf + 1) * step;
+  shelves.room += (shelf + 1) * stepSize;
   return piece;
 }
 
 void giveMemoryBack(void* memory, std::size_t size) noexcept {
   const std::size_t shelf = shelfOf(size);
-  const std::size_t kept = (shelf + 1) * step;
+  const std::size_t kept = (shelf + 1) * stepSize;
   if (shelf >= shelfCount || shelves.room < kept) return letMemoryGo(memory, size);
   shelves.room -= kept;
   shelves.bySize[shelf] = new (memory) Piece{shelves.bySize[shelf]};

@@ -17,8 +17,6 @@ namespace {
 
 using IntakeTest = StoreTest;
 
-Wire timed(std::uint64_t time = someTime) { return Wire().varint(1, time); }
-
 std::size_t presentDictionaries(const MetricValidator& store) {
   std::size_t count = 0;
   for (std::size_t index = 0; index < displayDictionaryCount; ++index) {

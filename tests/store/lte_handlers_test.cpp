@@ -1,8 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 #include <gtest/gtest.h>
 
-#include <limits>
-
 #include "messages/metric_identifiers.h"
 #include "tests/store/store_fixture.h"
 
@@ -11,10 +9,7 @@ namespace {
 
 using LteHandlers = StoreTest;
 
-constexpr std::int32_t lowest = std::numeric_limits<std::int32_t>::min();
 constexpr std::uint32_t pastSigned = 0x80000000;  // one past the largest signed 32-bit integer
-
-Wire timed() { return Wire().varint(1, someTime); }
 
 TEST_F(LteHandlers, BeforeAnyMetricEveryListHoldsThePlaceholderAndTheTwentyKeysAreEmpty) {
   const LTE& lte = store_.myLTE();

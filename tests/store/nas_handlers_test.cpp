@@ -9,8 +9,6 @@ namespace {
 
 using NasHandlers = StoreTest;
 
-Wire timed() { return Wire().varint(1, someTime); }
-
 TEST_F(NasHandlers, BeforeTheFirstMetricBothListsHoldThePlaceholder) {
   EXPECT_EQ(printed(store_.myCommon().activeBearer), placeholder);
   EXPECT_EQ(printed(store_.myCommon().simContents), placeholder);

@@ -4,6 +4,7 @@
 #include <gtest/gtest.h>
 
 #include <cstdint>
+#include <limits>
 #include <optional>
 #include <stdexcept>
 #include <string>
@@ -63,6 +64,11 @@ inline Dictionary metricEvent(std::int64_t metricID, const Wire& payload) {
 // 2024-03-05 12:00:00.123 UTC, and how it reads.
 inline constexpr std::uint64_t someTime = 1709640000123;
 inline constexpr std::string_view someTimeText = "2024-03-05 12:00:00 UTC";
+
+inline constexpr std::int32_t lowest = std::numeric_limits<std::int32_t>::min();
+
+// A payload that begins with the time, which is field 1 of all metrics.
+inline Wire timed(std::uint64_t time = someTime) { return Wire().varint(1, time); }
 
 // A store that is fed directly.
 class StoreTest : public testing::Test {

@@ -1,8 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 #include <gtest/gtest.h>
 
-#include <limits>
-
 #include "messages/metric_identifiers.h"
 #include "tests/store/store_fixture.h"
 
@@ -11,10 +9,6 @@ namespace {
 
 using UmtsHandlers = StoreTest;
 using GsmHandlers = StoreTest;
-
-constexpr std::int32_t lowest = std::numeric_limits<std::int32_t>::min();
-
-Wire timed() { return Wire().varint(1, someTime); }
 
 TEST_F(UmtsHandlers, BeforeTheFirstMetricEachListHoldsThePlaceholderAndTheFourteenKeysAreEmpty) {
   const UMTS& umts = store_.myUMTS();

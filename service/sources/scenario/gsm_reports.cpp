@@ -9,7 +9,7 @@ namespace probeview::scenario {
 namespace {
 
 // System information counts some differences in steps.
-constexpr std::uint32_t kDecibelsPerStep = 2;
+constexpr std::uint32_t kGsmDecibelsPerStep = 2;
 
 // The power control level of the largest power in the band (3GPP TS 45.005, 4.1.1).
 std::uint32_t largestPowerLevel(const Carrier& carrier) { return carrier.band == 1800 ? 0 : 5; }
@@ -128,7 +128,7 @@ void report(const Phone& phone, KCellularGsmGprsConfig& message) {
   message.setSpPgCy(true);
   message.setNco(0);  // the phone chooses its cells itself
   message.setNom(2);  // circuit and packet services page apart
-  message.setCrHyst(GsmSelection::kReselectHysteresis / kDecibelsPerStep);
+  message.setCrHyst(GsmSelection::kReselectHysteresis / kGsmDecibelsPerStep);
   message.setAccThr(6);
   message.setExtUplTbfSupported(true);
   message.setPriorityClass(0);

@@ -16,7 +16,7 @@ std::uint32_t bandwidthIndex(const Carrier& carrier) {
 }
 
 // System information counts levels in steps of 2 dB (3GPP TS 36.331, 6.3.4: Q-RxLevMin, ReselectionThreshold).
-constexpr int kDecibelsPerStep = 2;
+constexpr int kLteDecibelsPerStep = 2;
 
 void fill(RsrpRsrqSinr& values, const Network& network, const LteSample& sample) {
   values.setPhyCellId(network.cells[sample.cell].physicalIdentity);
@@ -78,27 +78,27 @@ void report(const Phone& phone, KCellularLteSelReselCellInfo& message) {
   if (serving.band == 3) message.addMultiBandInfo(9);
   message.setImsEmergencySupport(network.hasVoiceOverIms(*phone.lte().serving) ? 1 : 0);
   message.setAcBarringForEmergency(0);
-  message.setQRxLevMin(LteSelection::kQRxLevMin / kDecibelsPerStep);
+  message.setQRxLevMin(LteSelection::kQRxLevMin / kLteDecibelsPerStep);
   message.setQQualMin(LteSelection::kQQualMin);
   message.setQHyst(LteSelection::kHysteresis);
-  message.setSNonIntraSearchP(LteSelection::kNonIntraSearchP / kDecibelsPerStep);
+  message.setSNonIntraSearchP(LteSelection::kNonIntraSearchP / kLteDecibelsPerStep);
   message.setSNonIntraSearchQ(LteSelection::kNonIntraSearchQ);
-  message.setSIntraSearchP(LteSelection::kIntraSearchP / kDecibelsPerStep);
+  message.setSIntraSearchP(LteSelection::kIntraSearchP / kLteDecibelsPerStep);
   message.setSIntraSearchQ(LteSelection::kIntraSearchQ);
-  message.setThreshServingLowP(LteSelection::kServingLowP / kDecibelsPerStep);
+  message.setThreshServingLowP(LteSelection::kServingLowP / kLteDecibelsPerStep);
   message.setPriorityOperatingFreq(serving.priority);
   std::set<std::uint32_t> listed{serving.channel};
   for (const Carrier& carrier : network.carriers) {
     if (carrier.technology != Technology::kLte || !listed.insert(carrier.channel).second) continue;
     NbrEutra& neighbour = message.addNbrEutra();
     neighbour.setEarfcn(carrier.channel);
-    neighbour.setQRxlevMin(LteSelection::kQRxLevMin / kDecibelsPerStep);
+    neighbour.setQRxlevMin(LteSelection::kQRxLevMin / kLteDecibelsPerStep);
     neighbour.setQQualMin(LteSelection::kQQualMin);
     neighbour.setQOffset(0);
     neighbour.setPmax(LteSelection::kMaximumPower);
     neighbour.setDlBw(bandwidthIndex(carrier));
-    neighbour.setThresXHighP(LteSelection::kCandidateHighP / kDecibelsPerStep);
-    neighbour.setThresXLowP(LteSelection::kCandidateLowP / kDecibelsPerStep);
+    neighbour.setThresXHighP(LteSelection::kCandidateHighP / kLteDecibelsPerStep);
+    neighbour.setThresXLowP(LteSelection::kCandidateLowP / kLteDecibelsPerStep);
     neighbour.setThresXHighQ(LteSelection::kCandidateHighQ);
     neighbour.setThresXLowQ(LteSelection::kCandidateLowQ);
     neighbour.setPriority(carrier.priority);

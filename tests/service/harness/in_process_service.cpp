@@ -11,7 +11,7 @@ namespace probeview {
 namespace {
 
 // How long a test's own time may run until something must have happened.
-constexpr std::chrono::seconds patience{60};
+constexpr std::chrono::seconds servicePatience{60};
 
 class InProcessService final : public TestService {
  public:
@@ -32,7 +32,7 @@ class InProcessService final : public TestService {
   std::shared_ptr<TaskQueue> queue() override { return {std::shared_ptr<void>(), &loop_}; }
 
   bool until(const std::function<bool()>& condition) override {
-    const auto deadline = loop_.monotonicTime() + patience;
+    const auto deadline = loop_.monotonicTime() + servicePatience;
     while (!condition()) {
       if (loop_.runOne()) continue;
       const auto next = loop_.untilNextTimer();

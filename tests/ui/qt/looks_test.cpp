@@ -30,9 +30,9 @@ class WindowLooks : public testing_ui::WindowTest {
   double number(const char* name) { return theme().property(name).toDouble(); }
   QQuickItem* whole() { return window().contentItem(); }
 
-  void setLook(bool dark, double textScale) {
+  void setLook(bool dark, double scale) {
     theme().setProperty("dark", dark);
-    theme().setProperty("textScale", textScale);
+    theme().setProperty("textScale", scale);
     rest();
   }
 
