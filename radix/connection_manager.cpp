@@ -55,11 +55,10 @@ ObjectHandle makeEventObject(const Event& event, const EventHold& hold) {
 using Handlers = std::map<std::string, EventHandler, std::less<>>;
 
 // The way of the events from the connection to the handlers. Shared with the tasks on the handlers' queue, which may
-// run after the manager has gone.
+// run after the manager has gone, or never. It does not own that queue: a queue whose tasks own it would never go.
 class EventRoad : public std::enable_shared_from_this<EventRoad> {
  public:
-  EventRoad(std::shared_ptr<TaskQueue> queue, Worker& worker)
-      : queue_(std::move(queue)), waiting_(std::make_shared<WaitingEvents>(worker)) {}
+  explicit EventRoad(Worker& worker) : waiting_(std::make_shared<WaitingEvents>(worker)) {}
 
   // Callers register one after the other; nobody registers for the same manager from two threads at once.
   void setHandler(std::string_view event, EventHandler handler) {
@@ -71,19 +70,21 @@ class EventRoad : public std::enable_shared_from_this<EventRoad> {
 
   // Once this has returned from switching off, no event begins to be handed over. What the service sent before it knew
   // of that is kept for the next switching on: it is sent once only, and switching off and on again loses nothing.
-  void setOn(bool on) {
+  void setOn(bool on, TaskQueue& queue) {
     on_ = on;
-    if (on && waiting_->any()) queue_->post([self = shared_from_this()] { self->handOver(); });
+    if (on && waiting_->any()) queue.post([self = shared_from_this()] { self->handOver(); });
   }
+  // The handlers go, too: they may own what owns the queue.
   void close() {
     closed_ = true;
     waiting_->close();
+    handlers_.set(nullptr);
   }
 
   // On the worker.
-  void deliver(std::vector<Event> events, const std::shared_ptr<ServiceConnection>& connection) {
+  void deliver(TaskQueue& queue, std::vector<Event> events, const std::shared_ptr<ServiceConnection>& connection) {
     EventHold hold = waiting_->add(events, connection);
-    queue_->post([self = shared_from_this(), batch = Batch{std::move(events), std::move(hold)}]() mutable {
+    queue.post([self = shared_from_this(), batch = Batch{std::move(events), std::move(hold)}]() mutable {
       self->batches_.push_back(std::move(batch));
       self->handOver();
     });
@@ -125,7 +126,6 @@ class EventRoad : public std::enable_shared_from_this<EventRoad> {
     found->second(makeEventObject(event, hold), event.group);
   }
 
-  std::shared_ptr<TaskQueue> queue_;
   std::shared_ptr<WaitingEvents> waiting_;
   probeview::Guarded<std::shared_ptr<const Handlers>> handlers_;
   std::atomic<bool> on_ = false;
@@ -140,7 +140,8 @@ class ConnectionManager final : public Manager {
   ConnectionManager(Worker& worker, std::unique_ptr<Connector> connector, ServiceConnection::Identity identity,
                     std::shared_ptr<TaskQueue> queue)
       : worker_(worker),
-        road_(std::make_shared<EventRoad>(std::move(queue), worker)),
+        queue_(std::move(queue)),
+        road_(std::make_shared<EventRoad>(worker)),
         state_(std::make_shared<probeview::Guarded<ConnectionState>>()) {
     ConnectionState initial;
     initial.since = worker.clock().wallTime();
@@ -149,8 +150,9 @@ class ConnectionManager final : public Manager {
     connection_ = std::make_shared<ServiceConnection>(
         worker, std::move(connector), std::move(identity),
         ServiceConnection::Events{.events =
-                                      [road = road_, holder](std::vector<Event> events) {
-                                        if (const auto here = holder->lock()) road->deliver(std::move(events), here);
+                                      [road = road_, handlersQueue = queue_, holder](std::vector<Event> events) {
+                                        const auto here = holder->lock();
+                                        if (here) road->deliver(*handlersQueue, std::move(events), here);
                                       },
                                   .state = [state = state_](const ConnectionState& now) { state->set(now); },
                                   .notice = [](const std::string& text) { probeview::systemLog().line(text); }});
@@ -197,13 +199,13 @@ class ConnectionManager final : public Manager {
   }
 
   void eventsOn() override {
-    road_->setOn(true);
+    road_->setOn(true, *queue_);
     worker_.post([connection = connection_] { connection->setDelivery(true); });
   }
 
   void eventsOff() override {
     // Nothing is handed over from here on, whatever is still on its way.
-    road_->setOn(false);
+    road_->setOn(false, *queue_);
     worker_.post([connection = connection_] { connection->setDelivery(false); });
   }
 
@@ -214,6 +216,7 @@ class ConnectionManager final : public Manager {
   static constexpr std::chrono::nanoseconds lateness = std::chrono::milliseconds(100);
 
   Worker& worker_;
+  std::shared_ptr<TaskQueue> queue_;
   std::shared_ptr<EventRoad> road_;
   std::shared_ptr<probeview::Guarded<ConnectionState>> state_;
   std::shared_ptr<ServiceConnection> connection_;
