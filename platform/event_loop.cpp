@@ -104,24 +104,22 @@ EventLoop::EventLoop()
 }
 
 EventLoop::~EventLoop() {
-  // Tasks that never ran may own watches and timers of this loop: they go while it is still whole.
-  running_.clear();
+  // Tasks that never ran may own watches and timers of this loop, and post more as they go: all that while it is whole.
   std::deque<Task> left;
-  {
+  left.swap(running_);
+  do {
+    left.clear();
     const std::lock_guard lock(inbox_->mutex);
     left.swap(inbox_->tasks);
-  }
-  left.clear();
+  } while (!left.empty());
   signalWatch_.reset();
 }
 
 void EventLoop::post(Task task) {
-  bool wasEmpty;
-  {
-    const std::lock_guard lock(inbox_->mutex);
-    wasEmpty = inbox_->tasks.empty();
-    inbox_->tasks.push_back(std::move(task));
-  }
+  // Woken under the lock: once it is free, the task may run and end this loop, and its descriptors with it.
+  const std::lock_guard lock(inbox_->mutex);
+  const bool wasEmpty = inbox_->tasks.empty();
+  inbox_->tasks.push_back(std::move(task));
   // One wake-up for all that gathers until the loop looks; the loop itself looks before it sleeps.
   if (wasEmpty && runner_.load(std::memory_order_relaxed) != std::this_thread::get_id()) {
     const std::uint64_t one = 1;

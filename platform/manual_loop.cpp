@@ -39,19 +39,19 @@ ManualLoop::ManualLoop(std::chrono::milliseconds wallTime)
     : inbox_(std::make_unique<Inbox>()), wallOffset_(wallTime - now_) {}
 
 ManualLoop::~ManualLoop() {
-  // Tasks that never ran may own timers of this loop.
+  // Tasks that never ran may own timers of this loop, and post more as they go.
   std::deque<Task> left;
-  {
+  do {
+    left.clear();
     const std::lock_guard lock(inbox_->mutex);
     left.swap(inbox_->tasks);
-  }
+  } while (!left.empty());
 }
 
 void ManualLoop::post(Task task) {
-  {
-    const std::lock_guard lock(inbox_->mutex);
-    inbox_->tasks.push_back(std::move(task));
-  }
+  // Signalled under the lock: once it is free, the task may run and end this loop, and the signal with it.
+  const std::lock_guard lock(inbox_->mutex);
+  inbox_->tasks.push_back(std::move(task));
   inbox_->filled.notify_one();
 }
 

@@ -18,10 +18,9 @@ namespace {
 class ThreadGate final : public Gate {
  public:
   void open() override {
-    {
-      const std::lock_guard lock(mutex_);
-      open_ = true;
-    }
+    // Signalled under the lock: once it is free, who waited may go, and take the gate along.
+    const std::lock_guard lock(mutex_);
+    open_ = true;
     opened_.notify_all();
   }
   bool wait(std::chrono::nanoseconds atMost) override {
