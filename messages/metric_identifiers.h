@@ -45,9 +45,11 @@ inline constexpr std::int64_t K_SIM_FILE_INFO = 0x3C0013;
 
 struct MetricIdentifier {
   std::int64_t id;
-  std::string_view name;             // of the constant, such as "K_LTE_RRC_STATE"
-  const MessageDescriptor* message;  // what its payload holds; null for the two that have no class
-  bool isHandled;                    // whether the store takes it
+  std::string_view name;  // of the constant, such as "K_LTE_RRC_STATE"
+  // What its payload is decoded as; null for the two that are left alone. For K_LTE_RLF there is no class;
+  // K_LTE_SCELL_MEAS has one, KCellularLteServingCellMeasurement, which nothing uses.
+  const MessageDescriptor* message;
+  bool isHandled;  // whether the store takes it
 };
 
 // The 31 metrics; the order is fixed.

@@ -86,8 +86,10 @@ void PBDataWriterWriteSubmessage(PBDataWriter& writer, const PBCodable& message,
 
 void PBDataWriterPlaceMark(PBDataWriter& writer, PBWriterMark& mark, std::uint32_t fieldNumber) {
   std::uint8_t* out = writer.reserve(wire::longestVarint + 1);
-  out =
-      wire::writeVarint(out, std::uint64_t{fieldNumber} << 3 | static_cast<unsigned>(wire::WireType::LengthDelimited));
+  if (fieldNumber != PBDataWriterNoField) {
+    out = wire::writeVarint(out,
+                            std::uint64_t{fieldNumber} << 3 | static_cast<unsigned>(wire::WireType::LengthDelimited));
+  }
   writer.commit(out);
   mark.offset = writer.size();
   writer.commit(out + 1);

@@ -198,7 +198,8 @@ const std::uint8_t* FieldRun::decodeNumbers(PBRepeatedInt32& list, std::uint64_t
                          [&](std::uint32_t element) { list.add(wire::unZigZag(element), blockOf(decoding)); });
 }
 
-// Goes on where decodeExpected() has stopped.
+// Decodes the rest of a record, fields in any order: goes on where decodeInOrder() or decodeTail() has stopped, and after
+// each field takes those that follow it in the order of their numbers by decodeExpected().
 const std::uint8_t* TableWalker::decodeOthers(PBCodable& message, const MessageDescriptor& descriptor,
                                               DecodingProgress progress, const std::uint8_t* limit,
                                               Decoding& decoding) {

@@ -8,7 +8,7 @@
 //     PB_MESSAGE(KCellularLteTxPower)
 //     PB_FIELD(1, "timestamp",     timestamp,    Timestamp,    uint64);
 //     PB_LIST (2, "tx_power_info", txPowerInfos, TxPowerInfos, txPowerInfo, TxPowerInfo,
-//     repeated<message<TxPowerInfo>>);
+//              repeated<message<TxPowerInfo>>);
 //   };
 //
 // and, in one source file, PB_DEFINE(KCellularLteTxPower). The accessors that the rows make:
@@ -16,7 +16,8 @@
 //   PB_FIELD   a number or truth value: timestamp(), setTimestamp(value), hasTimestamp(), setHasTimestamp(present).
 //              A field that is not present reads as 0; its last value is back when it is made present again.
 //   PB_OBJECT  bytes, a text or a single nested message: guti(), setGuti(value), hasGuti(); setGuti(nullptr) takes it
-//              away. Absent bytes and texts read as empty, an absent message as null.
+//              away, and setGuti({}), which may mean that or an empty value, does not compile. Absent bytes and texts
+//              read as empty, an absent message as null.
 //   PB_LIST    nested messages: txPowerInfos() to walk through them, setTxPowerInfos(list), clearTxPowerInfos(),
 //              addTxPowerInfo(handle or message), addTxPowerInfo() for a new one, txPowerInfosCount(),
 //              txPowerInfoAtIndex(index). Handles share, messages are copied.
@@ -39,6 +40,9 @@ template <unsigned Number>
 struct FieldNumber {};
 
 namespace detail {
+
+// What {} may be as well as a null pointer. Without it {} would be one: no class can be made of {} as directly.
+enum class EmptyBraces {};
 
 // The key as it is printed, with all around it, is one constant, so that it is printed by copying; the name lies in it.
 consteval std::string_view nameIn(std::string_view printedKey) {
@@ -188,6 +192,7 @@ consteval MessageDescriptor describeMessage(std::string_view name) {
     type::set(_##property, std::move(value), block());                     \
   }                                                                        \
   void set##Property(std::nullptr_t) noexcept { _##property.clear(); }     \
+  void set##Property(::probeview::detail::EmptyBraces) = delete;           \
   bool has##Property() const noexcept { return _##property.isPresent(); }  \
   PB_ROW(number, key, property, type)
 

@@ -142,6 +142,21 @@ TEST(Writer, WithTheFieldNumberAllOnesAValueStandsWithoutAKey) {
             "026869");
 }
 
+TEST(Writer, WithTheFieldNumberAllOnesASubmessageAndARecordStandWithoutAKey) {
+  TxPowerInfo info;
+  info.setSubframeIndex(3);
+  PBDataWriter writer;
+  PBDataWriterWriteSubmessage(writer, info, PBDataWriterNoField);
+  PBWriterMark mark;
+  PBDataWriterPlaceMark(writer, mark, PBDataWriterNoField);
+  PBDataWriterWriteUint32Field(writer, 5, PBDataWriterNoField);
+  PBDataWriterRecallMark(writer, mark);
+  PBDataWriter expected;
+  PBDataWriterWriteDataField(expected, encoded(info), PBDataWriterNoField);
+  PBDataWriterWriteDataField(expected, bytesOf("05"), PBDataWriterNoField);
+  EXPECT_EQ(hexOf(writer.bytes()), hexOf(expected.bytes()));
+}
+
 TEST(Writer, ARecordsLengthIsFilledInHoweverLongItIs) {
   for (const std::size_t size : {0U, 127U, 128U, 16383U, 16384U}) {
     const Bytes content(size, 0x55);
