@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/decode_command.h"
 
+#include <CLI/CLI.hpp>
 #include <algorithm>
 #include <ostream>
 

@@ -4,6 +4,7 @@
 #include <poll.h>
 #include <unistd.h>
 
+#include <CLI/CLI.hpp>
 #include <cstdlib>
 #include <iostream>
 #include <system_error>

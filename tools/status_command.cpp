@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/status_command.h"
 
+#include <CLI/CLI.hpp>
 #include <memory>
 #include <ostream>
 #include <string>

@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/store_command.h"
 
+#include <CLI/CLI.hpp>
+
 #include "tools/batch.h"
 #include "tools/store_session.h"
 

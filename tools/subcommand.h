@@ -15,11 +15,15 @@
 // understood, so that an error further on leaves nothing half done.
 #pragma once
 
-#include <CLI/CLI.hpp>
 #include <functional>
 #include <iosfwd>
 #include <optional>
 #include <string>
+
+// Only the files that describe a command line include its library, which takes the compiler seconds each time.
+namespace CLI {
+class App;
+}
 
 namespace probeview {
 

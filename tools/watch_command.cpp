@@ -3,6 +3,7 @@
 
 #include <signal.h>
 
+#include <CLI/CLI.hpp>
 #include <chrono>
 #include <cstdint>
 #include <memory>

@@ -3,6 +3,7 @@
 // The manual pages and the completion know every subcommand and option that the programs have.
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
+#include <CLI/CLI.hpp>
 
 #include <memory>
 #include <regex>
