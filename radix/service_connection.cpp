@@ -162,6 +162,7 @@ void ServiceConnection::finish(Waiting waiting, Status status, std::string messa
   } else if (command.name == kCommandClearConfiguration) {
     // Wanted or not by the service: who clears a configuration does not want it back on the next connection.
     configuration_.reset();
+    unjudgedConfiguration_ = 0;
     setConfigurationOutcome(ConfigurationOutcome::NotPushed);
   }
   // Last: whoever waits for it may ask at once what has become of it.

@@ -358,6 +358,19 @@ TEST_F(ServiceConnectionTest, AConfigurationThatIsRefusedOnlyWhenRestoredIsNotTr
   EXPECT_THAT(current().commands, IsEmpty());
 }
 
+TEST_F(ServiceConnectionTest, ALateAnswerToAConfigurationThatHasBeenClearedSinceSaysNothingAnyMore) {
+  for (const auto status : {Status::Ok, Status::BadConfiguration}) {
+    restart();
+    loop_.run();
+    EXPECT_NE(push("[metrics]\n").status, 0);
+    EXPECT_NE(perform(kCommandClearConfiguration).status, 0);
+    current().answer(0, static_cast<std::int32_t>(status), "late");
+    loop_.run();
+    EXPECT_EQ(Connection(manager_).configuration, ConfigurationOutcome::NotPushed);
+    EXPECT_EQ(Connection(manager_).configurationTrouble, "");
+  }
+}
+
 TEST_F(ServiceConnectionTest, AServiceThatGoesWhileNothingIsAskedJustWentAway) {
   loop_.run();
   mood_ = Mood::Silent;
