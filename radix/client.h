@@ -34,8 +34,8 @@ inline constexpr char kKeyTriggerType[] = "kKeyTriggerType";  // 64-bit integer
 // Events of this service also say when and by whom they were measured.
 inline constexpr char kKeyTime[] = "kKeyTime";      // 64-bit integer, milliseconds since 1970-01-01 UTC
 inline constexpr char kKeyOrigin[] = "kKeyOrigin";  // text, such as "scenario:city"
-// How old the record was when it left the service, by a clock that is never set: 64-bit integer, milliseconds, 0 to
-// longestSpan. Absent when the service is older than this key.
+// How old the record is, by a clock that is never set: when it left the service, and what it has waited for its handler
+// since. 64-bit integer, milliseconds, 0 to longestSpan. Absent when the service is older than this key.
 inline constexpr char kKeyAge[] = "kKeyAge";
 // How often its source reports the metric as things are: 64-bit integer, milliseconds, 0 to longestSpan; 0: on change,
 // or because it was asked for. Absent when the service is older than this key.

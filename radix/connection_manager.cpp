@@ -3,6 +3,7 @@
 
 #include <algorithm>
 #include <atomic>
+#include <chrono>
 #include <deque>
 #include <map>
 #include <utility>
@@ -30,7 +31,8 @@ std::string sizeText(std::size_t size) {
 
 Value number(std::int64_t value) { return value; }
 
-ObjectHandle makeEventObject(const Event& event, const EventHold& hold) {
+// The event as it is handed over, so long after it has come.
+ObjectHandle makeEventObject(const Event& event, std::chrono::nanoseconds waited, const EventHold& hold) {
   Dictionary content;
   if (event.kind == EventKind::Trigger) {
     content.reserve(5);
@@ -46,7 +48,10 @@ ObjectHandle makeEventObject(const Event& event, const EventHold& hold) {
   content.append(kKeyTime, number(event.time));
   content.append(kKeyOrigin, Value::text(event.origin));
   if (event.kind == EventKind::Metric) {
-    if (event.age) content.append(kKeyAge, number(event.age->count()));
+    if (event.age) {
+      const auto age = *event.age + std::chrono::duration_cast<std::chrono::milliseconds>(waited);
+      content.append(kKeyAge, number(std::min(age, longestSpan).count()));
+    }
     if (event.period) content.append(kKeyPeriod, number(event.period->count()));
   }
   return std::make_shared<Object>(std::move(content), hold);
@@ -58,7 +63,7 @@ using Handlers = std::map<std::string, EventHandler, std::less<>>;
 // run after the manager has gone, or never. It does not own that queue: a queue whose tasks own it would never go.
 class EventRoad : public std::enable_shared_from_this<EventRoad> {
  public:
-  explicit EventRoad(Worker& worker) : waiting_(std::make_shared<WaitingEvents>(worker)) {}
+  explicit EventRoad(Worker& worker) : waiting_(std::make_shared<WaitingEvents>(worker)), clock_(worker.clock()) {}
 
   // Callers register one after the other; nobody registers for the same manager from two threads at once.
   void setHandler(std::string_view event, EventHandler handler) {
@@ -84,7 +89,8 @@ class EventRoad : public std::enable_shared_from_this<EventRoad> {
   // On the worker.
   void deliver(TaskQueue& queue, std::vector<Event> events, const std::shared_ptr<ServiceConnection>& connection) {
     EventHold hold = waiting_->add(events, connection);
-    queue.post([self = shared_from_this(), batch = Batch{std::move(events), std::move(hold)}]() mutable {
+    queue.post([self = shared_from_this(),
+                batch = Batch{std::move(events), std::move(hold), clock_.monotonicTime()}]() mutable {
       self->batches_.push_back(std::move(batch));
       self->handOver();
     });
@@ -95,6 +101,7 @@ class EventRoad : public std::enable_shared_from_this<EventRoad> {
   struct Batch {
     std::vector<Event> events;
     EventHold hold;
+    std::chrono::nanoseconds arrived{};  // on the clock that only goes forward
     std::size_t handedOver = 0;
   };
 
@@ -111,22 +118,23 @@ class EventRoad : public std::enable_shared_from_this<EventRoad> {
       Batch& batch = batches_.front();
       while (batch.handedOver < batch.events.size() && !closed_) {
         if (!on_) return;
-        hand(batch.events[batch.handedOver++], batch.hold);
+        hand(batch.events[batch.handedOver++], batch);
       }
       batches_.pop_front();
     }
   }
 
-  void hand(const Event& event, const EventHold& hold) const {
+  void hand(const Event& event, const Batch& batch) const {
     // Asked for each event: the handler before it may have registered another one.
     const auto handlers = handlers_.get();
     if (!handlers) return;
     const auto found = handlers->find(event.kind == EventKind::Trigger ? kEventTrigger : kEventMetric);
     if (found == handlers->end() || !found->second) return;
-    found->second(makeEventObject(event, hold), event.group);
+    found->second(makeEventObject(event, clock_.monotonicTime() - batch.arrived, batch.hold), event.group);
   }
 
   std::shared_ptr<WaitingEvents> waiting_;
+  const probeview::Clock& clock_;
   probeview::Guarded<std::shared_ptr<const Handlers>> handlers_;
   std::atomic<bool> on_ = false;
   std::atomic<bool> closed_ = false;

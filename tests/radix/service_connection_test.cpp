@@ -443,6 +443,32 @@ TEST_F(ServiceConnectionTest, EventsThatAreStillOnTheirWayAfterEventsOffWaitForT
   EXPECT_THAT(metrics, ElementsAre(1, 2));
 }
 
+TEST_F(ServiceConnectionTest, AnEventThatWaitsForItsHandlerGrowsOlder) {
+  std::vector<std::optional<std::int64_t>> ages;
+  RegisterEventHandler(manager_, kEventMetric, [&](const ObjectHandle& event, Group) {
+    const Dictionary content = nativeDictionary(*event);
+    const Value* age = content.find(kKeyAge);
+    ages.push_back(age != nullptr ? age->int64() : std::nullopt);
+  });
+  EventsOn(manager_);
+  loop_.run();
+  const auto say = [&](std::chrono::nanoseconds age) {
+    std::vector<std::uint8_t> bytes = *encode(Event{.metricId = 1});
+    const Trailer trailer = ageTrailer(age);
+    bytes.insert(bytes.end(), trailer.bytes.begin(), trailer.bytes.begin() + trailer.size);
+    current().sayBytes(bytes);
+  };
+  EventsOff(manager_);
+  say(seconds(5));
+  say(longestSpan);
+  current().say(Event{.metricId = 1});
+  loop_.advance(seconds(180));
+  EXPECT_THAT(ages, IsEmpty());
+  EventsOn(manager_);
+  loop_.run();
+  EXPECT_THAT(ages, ElementsAre(185'000, longestSpan.count(), std::nullopt));
+}
+
 TEST_F(ServiceConnectionTest, AHandlerMaySwitchEventsOffAndOnInTheMiddleOfABatchAndLosesNothing) {
   std::vector<std::int64_t> metrics;
   RegisterEventHandler(manager_, kEventMetric, [&](const ObjectHandle& event, Group) {
