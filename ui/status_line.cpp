@@ -157,7 +157,9 @@ Status StatusLine::filled(const ServiceStatus& service, const Record& record) co
   // How old the values are, not when they were measured: a replayed drive may be years old and yet alive.
   const auto age = ageText(ageOf(record));
   const auto origin = shown(record.origin, longestOrigin);
-  const auto line = origin.empty() ? "Last record " + age + " ago" : origin + " · " + age + " ago";
+  // Of a record whose age nobody tells, no more is known than when it came.
+  const auto since = (record.age ? "" : "received ") + age + " ago";
+  const auto line = (origin.empty() ? "Last record " : origin + " · ") + since;
   if (service.connection.sources && !record.origin.empty()) {
     const auto* source = sourceNamed(*service.connection.sources, record.origin);
     if (source == nullptr) return {StatusKind::Ended, line + " · no longer a source"};

@@ -51,7 +51,7 @@ class StatusLines : public testing::Test {
   // A record arrives now, so old already.
   void receive(std::int64_t metric, const std::string& origin,
                std::optional<std::chrono::milliseconds> period = std::nullopt,
-               std::optional<std::chrono::milliseconds> age = std::nullopt) {
+               std::optional<std::chrono::milliseconds> age = std::chrono::milliseconds(0)) {
     ServiceStatus::LastRecord record;
     record.metricId = metric;
     record.origin = origin;
@@ -95,6 +95,14 @@ TEST_F(StatusLines, TheAgeOfARecordIsHowOldItWasWhenItLeftTheServiceAndWhatHasGo
   clock.setWallTime(clock.wallTime() - 48h);
   clock.advance(60s);
   EXPECT_EQ(onLists().text, "trace:drive.csv · 4 min ago") << "whatever happens to the time of day";
+}
+
+TEST_F(StatusLines, OfARecordWhoseAgeTheServiceDoesNotTellItSaysOnlyWhenItWasReceived) {
+  receive(rrcState, "scenario:city", std::nullopt, std::nullopt);
+  clock.advance(400ms);
+  EXPECT_EQ(onPage({rrcState}), (Status{StatusKind::Live, "scenario:city · received 0.4 s ago"}));
+  receive(rrcState, "", std::nullopt, std::nullopt);
+  EXPECT_EQ(onPage({rrcState}), (Status{StatusKind::Live, "Last record received 0.0 s ago"}));
 }
 
 TEST_F(StatusLines, OnAPageItSpeaksOfTheMetricThatFillsThePageAndOnTheListsOfTheLastRecordOfAll) {
