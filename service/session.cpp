@@ -104,7 +104,7 @@ void Session::forgetAnswer(std::size_t source, std::int64_t metricId) {
 
 bool Session::settlesQuery(std::size_t source, std::int64_t metricId, std::uint64_t number,
                            std::chrono::nanoseconds now) {
-  std::erase_if(awaited_, [now](const AwaitedAnswer& one) { return now > one.until; });
+  std::erase_if(awaited_, [now](const AwaitedAnswer& one) { return one.number == 0 && now > one.until; });
   const auto found = std::find_if(awaited_.begin(), awaited_.end(), [&](const AwaitedAnswer& one) {
     return one.source == source && one.metricId == metricId && one.number == 0;
   });

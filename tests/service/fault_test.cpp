@@ -63,6 +63,12 @@ class Faults : public ::testing::Test, protected radix::Connector {
     return client;
   }
 
+  static radix::Command query(std::int64_t metric) {
+    return {.sequence = 1,
+            .name = radix::kCommandQueryMetric,
+            .arguments = radix::encodeDictionary({{radix::kKeyMetricID, metric}})};
+  }
+
   static radix::Command push(const std::string& text) {
     return {
         .sequence = 1,
@@ -550,6 +556,42 @@ TEST_F(Faults, AnAnswerThatComesAfterHalfAMinuteIsNone) {
     emit();
     loop_.advance(milliseconds(1));
     EXPECT_EQ(client->events.size(), late.count() == 0 ? 1U : 0U);
+  }
+}
+
+TEST_F(Faults, AnAnswerThatCameWhileEventsWereOffIsThereHoweverLongTheyStayOff) {
+  script_->onQuery = [](std::int64_t) { return true; };
+  const auto client = greeted("asks", false);
+  client->say(query(K_LTE_RRC_STATE));
+  loop_.run();
+  script_->emit(K_LTE_RRC_STATE, {0x10, 1}, milliseconds(1));
+  loop_.advance(minutes(10));
+  script_->emit(K_LTE_TX_POWER, {}, milliseconds(2));
+  loop_.advance(milliseconds(1));
+  ASSERT_TRUE(client->events.empty());
+  client->say(radix::Delivery{true});
+  loop_.advance(milliseconds(1));
+  ASSERT_EQ(client->events.size(), 1U);
+  EXPECT_EQ(client->events[0].time, 1);
+}
+
+TEST_F(Faults, TwoHundredAndFiftySixQuestionsMayBeOpenAndOneMoreTakesThePlaceOfTheOldest) {
+  script_->onQuery = [](std::int64_t) { return true; };
+  const auto silent = std::make_shared<ScriptedSource::Script>();
+  silent->metrics = {K_LTE_TX_POWER};
+  silent->onQuery = script_->onQuery;
+  service_.addSource(std::make_unique<ScriptedSource>(silent));
+  for (const int others : {255, 256}) {
+    const auto client = greeted("asks", false);
+    client->say(radix::Delivery{true});
+    client->say(query(K_LTE_RRC_STATE));
+    for (int number = 0; number < others; ++number) {
+      client->say(query(K_LTE_TX_POWER));
+      loop_.run();
+    }
+    emit();
+    loop_.advance(milliseconds(1));
+    EXPECT_EQ(client->events.size(), others == 255 ? 1U : 0U);
   }
 }
 
