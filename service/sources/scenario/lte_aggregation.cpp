@@ -26,8 +26,9 @@ void LteModem::aggregate(const Circumstances& c) {
           continue;
         }
         if (secondaries.size() == kMostSecondaries) break;
-        secondaries.push_back({cell, SecondaryState::kDeactivated, c.surroundings.strength(cell),
-                               c.surroundings.quality(cell), c.surroundings.interferenceRatio(cell),
+        secondaries.push_back({cell, static_cast<std::uint32_t>(secondaries.size()) + 1, SecondaryState::kDeactivated,
+                               c.surroundings.strength(cell), c.surroundings.quality(cell),
+                               c.surroundings.interferenceRatio(cell),
                                std::min(c.surroundings.carrierPower(cell), 0.0)});
         changed = true;
       }

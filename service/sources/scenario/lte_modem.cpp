@@ -53,7 +53,7 @@ void LteModem::serve(CellIndex cell, const Circumstances& c) {
 }
 
 void LteModem::enter(CellIndex cell, Manner manner, const Circumstances& c) {
-  state_.samples.clear();
+  samples_.clear();
   forgetDeconfigured(c);
   if (manner == Manner::kHandover) {
     change(LteConnection::kAttemptingInboundMobility, LteCause::kNotApplicable, c);
@@ -97,7 +97,7 @@ void LteModem::measure(const Circumstances& c) {
 
 // Between two measurements the level wavers with the multipath around the phone.
 void LteModem::sample(const Circumstances& c) {
-  if (!state_.samples.empty() && state_.samples.back().cell != *state_.serving) state_.samples.clear();
+  if (!samples_.empty() && samples_.back().cell != *state_.serving) samples_.clear();
   LteSample sample;
   sample.cell = *state_.serving;
   for (std::size_t antenna = 0; antenna < 2; ++antenna) {
@@ -107,9 +107,11 @@ void LteModem::sample(const Circumstances& c) {
     sample.rsrq[antenna] = std::clamp(state_.rsrq + 0.4 * waver, kWorstRsrq, kBestRsrq);
     sample.sinr[antenna] = std::clamp(state_.sinr + waver, kWorstSinr, kBestSinr);
   }
-  if (state_.samples.size() == kSamples) state_.samples.erase(state_.samples.begin());
-  state_.samples.push_back(sample);
-  if (state_.samples.size() >= kFewestSamples && c.measured) c.facts.learn(Fact::kLteSamples, c.now);
+  if (samples_.size() == kSamples) samples_.erase(samples_.begin());
+  samples_.push_back(sample);
+  if (samples_.size() < kFewestSamples || !c.measured) return;
+  state_.samples = samples_;
+  c.facts.learn(Fact::kLteSamples, c.now);
 }
 
 // 3GPP TS 36.213, 5.1.1.1 and 5.1.2.1: what makes up for the path loss, within what the phone can do.

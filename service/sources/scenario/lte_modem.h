@@ -44,6 +44,7 @@ enum class SecondaryState : std::int32_t { kDeconfigured = 0, kDeactivated = 1, 
 
 struct SecondaryCarrier {
   CellIndex cell = 0;
+  std::uint32_t index = 1;  // from 1; stays as long as the carrier is there, whatever becomes of the others
   SecondaryState state = SecondaryState::kDeactivated;
   double rsrp = 0, rsrq = 0, sinr = 0, rssi = 0;
 };
@@ -72,7 +73,7 @@ struct LteState {
   std::optional<CellIndex> serving;  // the cell that serves, or the last one that did
   double rsrp = 0, rsrq = 0, sinr = 0;
   NeighbourLists neighbours;
-  std::vector<LteSample> samples;  // the last ten at most, the oldest first
+  std::vector<LteSample> samples;  // the ten at most of the last report, the oldest first
   std::vector<TransmitPower> transmitPowers;
   std::vector<SecondaryCarrier> secondaries;
   unsigned transmissionMode = 3;
@@ -138,6 +139,7 @@ class LteModem {
   Milliseconds executesAt_ = 0;
   std::optional<Departure> leaving_;  // a departure that has been ordered
   unsigned nextSubframe_ = 0;
+  std::vector<LteSample> samples_;  // those of the serving cell up to now, ten at most, the oldest first
 };
 
 }  // namespace probeview::scenario

@@ -165,11 +165,10 @@ void report(const Phone& phone, KCellularLteComponentCarrierInfo& message) {
 
 void report(const Phone& phone, KCellularLteCarrierAggregationStatus& message) {
   const Network& network = phone.network();
-  std::uint32_t index = 1;
   for (const SecondaryCarrier& entry : phone.lte().secondaries) {
     const Carrier& carrier = network.carrierOf(entry.cell);
     SecondaryComponentCarrier& listed = message.addSccList();
-    listed.setIndex(index++);
+    listed.setIndex(entry.index);
     listed.setState(static_cast<std::int32_t>(entry.state));
     listed.setPci(network.cells[entry.cell].physicalIdentity);
     listed.setDlEarfcn(carrier.channel);

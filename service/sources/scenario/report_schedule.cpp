@@ -105,9 +105,13 @@ std::optional<Milliseconds> ReportSchedule::due(const Report& report, const Fact
   } else if (report.nature == Nature::kMeasurement) {
     entry.next = now + static_cast<Milliseconds>(static_cast<double>(kMeasurementPeriod) * speed_);
   }
-  // What held when it was told last is not told as if it had ended before.
-  entry.toldUntil = std::max(entry.toldUntil, measuredAt);
-  return entry.toldUntil;
+  return tellAs(report, measuredAt);
+}
+
+Milliseconds ReportSchedule::tellAs(const Report& report, Milliseconds measuredAt) {
+  Milliseconds& toldUntil = entries_[static_cast<std::size_t>(report.fact)].toldUntil;
+  toldUntil = std::max(toldUntil, measuredAt);
+  return toldUntil;
 }
 
 }  // namespace probeview::scenario

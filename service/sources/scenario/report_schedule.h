@@ -32,6 +32,9 @@ class ReportSchedule {
   // Whether the fact is to be reported now; if so, it counts as reported. The answer's time is the simulated time at
   // which the reported values were measured.
   std::optional<Milliseconds> due(const Report& report, const Facts& facts, Milliseconds now);
+  // The simulated time as which values measured at that one are told, now and from now on: what held when it was told
+  // last, on its turn or because somebody asked, is not told as if it had ended before.
+  Milliseconds tellAs(const Report& report, Milliseconds measuredAt);
 
  private:
   struct Entry {

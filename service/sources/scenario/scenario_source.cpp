@@ -84,7 +84,8 @@ class ScenarioSource final : public MetricSource {
     const Facts::Entry& fact = story_->facts()[found->fact];
     if (fact.learnt < 0) return false;
     if (!listening_) anchor();  // while the drive rests, now is the time of day
-    emit(*found, fact.holds && found->nature == Nature::kState ? story_->now() : fact.learnt);
+    const bool isSoNow = fact.holds && found->nature == Nature::kState;
+    emit(*found, schedule_.tellAs(*found, isSoNow ? story_->now() : fact.learnt));
     return true;
   }
 

@@ -39,6 +39,8 @@ std::string_view nameOf(Rule rule) {
       return "the primary carrier is the serving cell's";
     case Rule::kCarriersAreDistinct:
       return "component carriers are distinct";
+    case Rule::kSecondaryKeepsItsIndex:
+      return "a secondary carrier keeps the index with which it was configured";
     case Rule::kSecondaryNeverNamesThePrimary:
       return "a secondary carrier never names the primary's EARFCN";
     case Rule::kSecondaryOnlyWhileConnected:

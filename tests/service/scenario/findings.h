@@ -32,6 +32,7 @@ enum class Rule : std::size_t {
   kLtePowerWhileSending,
   kCarriersAreThoseOfTheServingCell,
   kCarriersAreDistinct,
+  kSecondaryKeepsItsIndex,
   kSecondaryNeverNamesThePrimary,
   kSecondaryOnlyWhileConnected,
   kDeconfiguredHasNoMeasurements,

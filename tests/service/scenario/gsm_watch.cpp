@@ -53,7 +53,7 @@ void GsmWatch::see(const MetricRecord& record) {
       const auto message = decoded<KCellularGsmGprsConfig>(record);
       together_.told(2, record.time);
       findings_.expectBetween(Rule::kGsmRanges, message.rac(), 0, 255);
-      findings_.expectBetween(Rule::kGsmRanges, message.nco(), 0, 3);
+      findings_.expectBetween(Rule::kGsmRanges, message.nco(), 0, 2);
       findings_.expectBetween(Rule::kGsmRanges, message.nom(), 1, 3);
       findings_.expectBetween(Rule::kGsmRanges, message.crHyst(), 0, 7);
       return;

@@ -1,5 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 #include <algorithm>
+#include <utility>
 
 #include "messages/lte_messages.h"
 #include "tests/service/scenario/drive.h"
@@ -162,11 +163,17 @@ void LteWatch::seeCarriers(const MetricRecord& record) {
 
 void LteWatch::seeAggregation(const MetricRecord& record) {
   const auto message = decoded<KCellularLteCarrierAggregationStatus>(record);
-  secondaries_.clear();
+  const std::vector<Secondary> before = std::exchange(secondaries_, {});
   std::set<std::uint32_t> channels, indices;
   for (const SecondaryComponentCarrier& carrier : message.sccLists()) {
     const CellName cell{carrier.dlEarfcn(), carrier.pci()};
-    secondaries_.push_back({cell, carrier.state()});
+    secondaries_.push_back({cell, carrier.state(), carrier.index()});
+    for (const Secondary& earlier : before) {
+      // What has been deconfigured may be configured anew as another one.
+      const bool isNew = earlier.state == SecondaryState::SCC_STATE_DECONFIGURED && carrier.state() != earlier.state;
+      if (!how_.everyChange || earlier.cell != cell || isNew) continue;
+      findings_.expect(Rule::kSecondaryKeepsItsIndex, carrier.index() == earlier.index);
+    }
     findings_.expect(Rule::kCarriersAreDistinct,
                      channels.insert(cell.first).second && indices.insert(carrier.index()).second);
     if (!how_.soak) {

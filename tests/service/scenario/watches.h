@@ -84,6 +84,7 @@ class LteWatch {
   struct Secondary {
     CellName cell;
     std::int32_t state = 0;
+    std::uint32_t index = 0;
   };
 
   Findings& findings_;
