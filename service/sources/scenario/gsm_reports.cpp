@@ -17,6 +17,11 @@ std::uint32_t largestPowerLevel(const Carrier& carrier) { return carrier.band ==
 }  // namespace
 
 void report(const Phone& phone, KCellularGsmScellInfo& message) {
+  if (phone.gsm().connection == GsmConnection::kInactive) {
+    // The cell that was left serves no more.
+    message.setState(KCellularGsmScellInfo::State::NON_DEDICATED_STATE);
+    return;
+  }
   const CellIndex serving = *phone.gsm().serving;
   const Cell& cell = phone.network().cells[serving];
   const Carrier& carrier = phone.network().carrierOf(serving);

@@ -75,6 +75,8 @@ std::string_view nameOf(Rule rule) {
       return "the serving GSM cell is no neighbour of its own";
     case Rule::kGsmMeasurementIsThatOfTheMode:
       return "GSM measures as its mode does";
+    case Rule::kGsmWithoutACellIsNotDedicated:
+      return "GSM that no cell serves has no dedicated channel";
     case Rule::kMobilityRanges:
       return "values of mobility management lie within their ranges";
     case Rule::kTmsiIsTheVisitorRegisters:

@@ -50,6 +50,7 @@ enum class Rule : std::size_t {
   kGsmChannelInBand,
   kGsmNeighbourIsNotTheServingCell,
   kGsmMeasurementIsThatOfTheMode,
+  kGsmWithoutACellIsNotDedicated,
   kMobilityRanges,
   kTmsiIsTheVisitorRegisters,
   kPacketTmsiIsTheServingNodes,

@@ -20,15 +20,27 @@ bool inBand(std::uint32_t arfcn, std::int32_t band) {
 
 }  // namespace
 
-bool GsmWatch::isOver() const { return states_.now() == State::NON_DEDICATED_STATE && stateTime_ >= latest_; }
+bool GsmWatch::isOver() const {
+  return !servesCell_ && states_.now() == State::NON_DEDICATED_STATE && stateTime_ >= latest_;
+}
 
 void GsmWatch::see(const MetricRecord& record) {
   latest_ = std::max(latest_, record.time);
   switch (record.metricId) {
     case K_GSM_SCELL_INFO: {
       const auto message = decoded<KCellularGsmScellInfo>(record);
-      const CellName cell{message.arfcn(), message.bsic()};
       const auto before = states_.now();
+      servesCell_ = message.hasCellId();
+      if (!servesCell_) {
+        findings_.expect(Rule::kGsmWithoutACellIsNotDedicated,
+                         message.state() == State::NON_DEDICATED_STATE && !message.hasArfcn() && !message.hasLac());
+        if (!how_.soak && before == State::DEDICATED_STATE) findings_.reach("GSM > NON_DEDICATED");
+        states_.becomes(message.state(), record.time);
+        stateTime_ = record.time;
+        serving_.reset();
+        return;
+      }
+      const CellName cell{message.arfcn(), message.bsic()};
       if (!how_.soak && before && message.state() != before) {
         findings_.reach(message.state() == State::DEDICATED_STATE ? "GSM > DEDICATED" : "GSM > NON_DEDICATED");
       }

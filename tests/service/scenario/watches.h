@@ -131,7 +131,7 @@ class GsmWatch {
   void see(const MetricRecord& record);
   void settle(Moment time);
 
-  // Whether the last that was told is that no channel is dedicated.
+  // Whether the last that was told is that no channel is dedicated and no cell serves.
   bool isOver() const;
   Moment overSince() const { return stateTime_; }
 
@@ -144,6 +144,7 @@ class GsmWatch {
   StateHistory states_;
   Moment stateTime_{};
   Moment latest_{};
+  bool servesCell_ = false;
   std::optional<CellName> serving_;
   std::optional<Moment> cellChangedAt_;
   Together together_{3};
