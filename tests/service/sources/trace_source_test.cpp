@@ -2,17 +2,11 @@
 #include "service/sources/trace_source.h"
 
 #include <gmock/gmock.h>
-#include <gtest/gtest.h>
-#include <unistd.h>
-
-#include <filesystem>
-#include <fstream>
 
 #include "messages/lte_messages.h"
 #include "messages/metric_identifiers.h"
 #include "messages/runtime/data_reader.h"
-#include "platform/manual_loop.h"
-#include "tests/service/sources/trace_rows.h"
+#include "tests/service/sources/trace_source_fixture.h"
 #include "values/printer.h"
 
 namespace probeview {
@@ -21,60 +15,8 @@ namespace {
 using std::chrono::milliseconds;
 using std::chrono::seconds;
 using ::testing::ElementsAre;
-using ::testing::HasSubstr;
 using ::testing::IsEmpty;
 using ::testing::SizeIs;
-
-class Sink final : public MetricSink {
- public:
-  void emit(MetricRecord record) override { records.push_back(std::move(record)); }
-  void conditionChanged(SourceCondition condition) override { phases.push_back(condition.phase); }
-  std::vector<MetricRecord> records;
-  std::vector<SourceCondition::Phase> phases;
-};
-
-class Lines final : public LineSink {
- public:
-  void line(std::string_view text) override { lines.emplace_back(text); }
-  std::vector<std::string> lines;
-};
-
-class TraceSourceTest : public ::testing::Test {
- protected:
-  void SetUp() override {
-    folder = std::filesystem::path(::testing::TempDir()) / ("trace_source_test." + std::to_string(getpid()));
-    std::filesystem::create_directories(folder);
-  }
-  void TearDown() override {
-    source.reset();
-    std::filesystem::remove_all(folder);
-  }
-
-  std::string write(const std::string& content, const std::string& name = "drive.csv") {
-    std::ofstream(folder / name, std::ios::binary) << content;
-    return (folder / name).string();
-  }
-  // Starts a source on rows of our own.
-  void start(const std::string& rows, const std::string& options = "") {
-    SourceResult result = makeTraceSource(write(traceHeader + rows) + options);
-    ASSERT_EQ(result.error, "");
-    source = std::move(result.source);
-    source->start(SourceContext{loop, loop, log}, sink);
-  }
-  void listen() {
-    source->setListening(true);
-    loop.advance(milliseconds(0));
-  }
-  static std::string measurement(const std::string& time, int level) {
-    return TraceLine{.time = "2024.03.05_" + time, .mode = "LTE", .level = std::to_string(level)}.text();
-  }
-
-  std::filesystem::path folder;
-  ManualLoop loop;
-  Sink sink;
-  Lines log;
-  std::unique_ptr<MetricSource> source;
-};
 
 TEST_F(TraceSourceTest, IsNamedAfterItsFile) {
   start(measurement("12.00.00", -90));
@@ -351,60 +293,6 @@ TEST_F(TraceSourceTest, ManyRowsThatAreDueTogetherLeaveTheLoopToItsOtherWork) {
   listen();
   EXPECT_THAT(sink.records, SizeIs(640));
   EXPECT_EQ(scheduler.turns, 10);
-}
-
-TEST_F(TraceSourceTest, BadRowsAreToldWithTheirLinesWhenTheSourceStarts) {
-  start("bad\n" + measurement("12.00.00", -90));
-  EXPECT_THAT(log.lines, ElementsAre("line 2: has 1 fields, not 26; row skipped"));
-}
-
-TEST_F(TraceSourceTest, ThatCellsCannotBeCheckedIsSaidOnceHoweverOftenTheFileIsPlayed) {
-  SourceResult result =
-      makeTraceSource(write("Timestamp,NetworkMode,RSRP,RSRQ,SNR,State,LACHEX,RAWCELLID,NRxRSRP,NRxRSRQ\n"
-                            "2024.03.05_12.00.00,LTE,-,-,-,-,1A,25601,-,-\n") +
-                      ",loop");
-  ASSERT_EQ(result.error, "");
-  source = std::move(result.source);
-  source->start(SourceContext{loop, loop, log}, sink);
-  listen();
-  loop.advance(seconds(60));
-  EXPECT_THAT(sink.records, SizeIs(61));
-  EXPECT_THAT(log.lines,
-              ElementsAre("there is no column NODEHEX and CELLHEX, so cell identities cannot be checked; they "
-                          "are taken as they stand"));
-}
-
-TEST_F(TraceSourceTest, ManyBadRowsAreToldInFewLines) {
-  std::string rows = measurement("12.00.00", -90);
-  for (int count = 0; count < 100; ++count) rows += "bad\n";
-  start(rows);
-  ASSERT_THAT(log.lines, SizeIs(21));
-  EXPECT_EQ(log.lines.back(), "and 80 more problems like these");
-}
-
-TEST_F(TraceSourceTest, AFileThatIsNoSuchLogIsRefusedWithWhatIsWrong) {
-  const std::string path = write("hello\n");
-  const SourceResult result = makeTraceSource(path);
-  EXPECT_EQ(result.source, nullptr);
-  EXPECT_THAT(result.error, HasSubstr("trace file " + path + " is no drive-test log: line 1 must name the columns"));
-  EXPECT_THAT(makeTraceSource("/no/such/file.csv").error,
-              "trace file /no/such/file.csv cannot be read: No such file or directory");
-}
-
-TEST_F(TraceSourceTest, ArgumentsThatAreNotUnderstoodAreRefused) {
-  const std::string path = write(traceHeader + measurement("12.00.00", -90));
-  for (const char* speed : {"0", "-1", "", "fast", "1x", "nan", "inf", "1e9"}) {
-    const SourceResult result = makeTraceSource(path + ",speed=" + speed);
-    EXPECT_EQ(result.source, nullptr);
-    EXPECT_THAT(result.error, HasSubstr("a speed is a number from 0.001 to 100000")) << speed;
-  }
-  EXPECT_THAT(makeTraceSource("").error, HasSubstr("it names no file"));
-  EXPECT_THAT(makeTraceSource("loop").error, HasSubstr("trace file loop cannot be read"));
-}
-
-TEST_F(TraceSourceTest, AFilesNameMayHaveCommas) {
-  const std::string path = write(traceHeader + measurement("12.00.00", -90), "a,b.csv");
-  EXPECT_EQ(makeTraceSource(path + ",speed=2,loop").error, "");
 }
 
 }  // namespace
