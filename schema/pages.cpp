@@ -242,7 +242,10 @@ Page metricsPage() {
       if (facts != nullptr && !facts->dictionary.empty()) {
         out += " Display dictionary `" + std::string(facts->dictionary) + "`.";
       }
-      if (facts != nullptr && !facts->pages.empty()) out += " Pages: " + std::string(facts->pages) + ".";
+      if (facts != nullptr && !facts->pages.empty()) {
+        if (out.back() != '\n') out += ' ';
+        out += "Pages: " + std::string(facts->pages) + ".";
+      }
       if (out.back() != '\n') out += "\n\n";
       appendFields(out, *message);
     }
