@@ -9,6 +9,7 @@
 #include <cstring>
 #include <memory>
 #include <ostream>
+#include <string_view>
 
 #include "app/application.h"
 #include "platform/console_log.h"
@@ -21,10 +22,19 @@ namespace probeview {
 
 namespace {
 
+// Names standard output, where it is to have the log beside or instead of pages.
+constexpr std::string_view standardOutput = "-";
+
 // The logs live as long as the process: wrapper and store keep referring to them.
 bool chooseLogs(const ViewerOptions& options, FrontKind front, std::ostream& errors) {
-  const bool pagesOnly = options.pagesOnly || front == FrontKind::Terminal;
-  if (options.logFile) {
+  const bool isTerminal = front == FrontKind::Terminal;
+  if (options.logFile == standardOutput) {
+    if (isTerminal) {
+      errors << "the console log would be written across the pages in the terminal; name a file with --log\n";
+      return false;
+    }
+    setConsoleLog(*new ConsoleLog(STDOUT_FILENO));
+  } else if (options.logFile) {
     const int file = ::open(options.logFile->c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0600);
     if (file < 0) {
       errors << "the log file " << *options.logFile << " cannot be written: " << std::strerror(errno)
@@ -32,10 +42,11 @@ bool chooseLogs(const ViewerOptions& options, FrontKind front, std::ostream& err
       return false;
     }
     setConsoleLog(*new ConsoleLog(file));
-  } else if (pagesOnly) {
+  } else if (options.pagesOnly || front != FrontKind::Window) {
+    // Who asks for pages is not given a log as well.
     setConsoleLog(*new DiscardingSink);
   }
-  if (pagesOnly) setSystemLog(*new SystemLog("probeview", SystemLog::Echo::None));
+  if (options.pagesOnly || isTerminal) setSystemLog(*new SystemLog("probeview", SystemLog::Echo::None));
   return true;
 }
 

@@ -9,6 +9,7 @@
 #include <vector>
 
 #include "platform/serial_queue.h"
+#include "values/plain_text.h"
 #include "values/printer.h"
 
 namespace probeview {
@@ -151,7 +152,8 @@ bool RadixWrapper::perform(std::string_view operation, std::string_view command,
   line += ": error=";
   appendInteger(result.status, line);
   line += " msg=";
-  line += result.message;
+  // The words are the service's.
+  appendOnOneLine(result.message, line);
   shared_->systemLog.line(line);
   return result.status == 0;
 }

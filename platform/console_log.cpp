@@ -10,6 +10,7 @@
 #include <vector>
 
 #include "platform/fatal_error.h"
+#include "values/plain_text.h"
 
 namespace probeview {
 
@@ -65,7 +66,7 @@ ConsoleLog::~ConsoleLog() {
 
 void ConsoleLog::line(std::string_view text) {
   if (closed_) return;
-  held_ += text;
+  appendOnOneLine(text, held_);
   held_ += '\n';
   if (openGroups_ == 0) flush();
 }

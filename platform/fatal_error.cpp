@@ -8,6 +8,8 @@
 #include <utility>
 #include <vector>
 
+#include "values/plain_text.h"
+
 namespace probeview {
 
 namespace {
@@ -35,7 +37,7 @@ void fatalError(std::string_view reason) {
   for (const auto& flush : flushes()) flush();
   if (observer()) observer()(reason);
   std::string text = "probeview: stopped: ";
-  text += reason;
+  appendOnOneLine(reason, text);
   text += '\n';
   // Nothing can be done about a standard error that is closed.
   [[maybe_unused]] const ssize_t written = ::write(STDERR_FILENO, text.data(), text.size());

@@ -9,6 +9,9 @@
 #include <atomic>
 #include <climits>
 #include <csignal>
+#include <string>
+
+#include "values/plain_text.h"
 
 namespace probeview {
 
@@ -28,6 +31,8 @@ SystemLog::SystemLog(const char* identity, Echo echo) : echo_(echo) {
 }
 
 void SystemLog::line(std::string_view text) {
+  const std::string shown = onOneLine(text);
+  text = shown;
   const int size = static_cast<int>(std::min<std::size_t>(text.size(), INT_MAX));
   ::syslog(LOG_NOTICE, "%.*s", size, text.data());
   if (echo_ == Echo::None) return;

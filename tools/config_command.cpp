@@ -13,6 +13,7 @@
 #include "platform/file_descriptor.h"
 #include "radix/service_commands.h"
 #include "tools/service_client.h"
+#include "values/plain_text.h"
 
 namespace probeview {
 
@@ -34,7 +35,7 @@ bool readFile(const std::string& path, std::string& content) {
 ExitStatus push(const std::string& path, Tool& tool) {
   std::string content;
   if (!readFile(path, content)) {
-    tool.errors << "probectl: cannot read " << path << ": " << std::strerror(errno) << '\n';
+    tool.errors << "probectl: cannot read " << onOneLine(path) << ": " << std::strerror(errno) << '\n';
     return ExitStatus::Failure;
   }
   ServiceClient client(tool);

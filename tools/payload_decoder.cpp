@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/payload_decoder.h"
 
+#include <algorithm>
+#include <iterator>
 #include <memory>
 
 #include "messages/metric_identifiers.h"
@@ -8,6 +10,8 @@
 #include "messages/runtime/codable.h"
 #include "messages/runtime/data_reader.h"
 #include "messages/runtime/data_writer.h"
+#include "tools/names.h"
+#include "values/near_matches.h"
 #include "values/plain_text.h"
 
 namespace probeview {
@@ -23,7 +27,10 @@ const MessageDescriptor* findClass(std::string_view reference, std::string& erro
     if (identifier) metric = metricWithId(*identifier);
   }
   if (metric == nullptr) {
-    error = quotedExcerpt(reference) + " is no message class, no metric and no metric's identifier";
+    std::vector<std::string_view> names = metricNames();
+    std::ranges::copy(classNames(), std::back_inserter(names));
+    error = quotedExcerpt(reference) + " is no message class, no metric and no metric's identifier" +
+            didYouMean(reference, names);
     return nullptr;
   }
   if (metric->message == nullptr) error = std::string(metric->name) + " has no message class";

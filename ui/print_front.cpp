@@ -8,6 +8,7 @@
 #include <ostream>
 
 #include "ui/page_snapshot.h"
+#include "values/plain_text.h"
 
 namespace probeview {
 
@@ -31,7 +32,7 @@ int PrintFront::run(NavigationStack& navigation, const StatusSource& status) {
 bool PrintFront::hasFailed() const {
   const std::string reason = failure_ ? failure_() : std::string();
   if (reason.empty()) return false;
-  *errors_ << reason << "\n";
+  *errors_ << onOneLine(reason) << "\n";
   return true;
 }
 

@@ -12,6 +12,7 @@
 #include "platform/console_log.h"
 #include "platform/fatal_error.h"
 #include "platform/system_log.h"
+#include "tests/support/harmless.h"
 
 namespace probeview {
 namespace {
@@ -52,6 +53,20 @@ TEST(ConsoleLog, ALineOnItsOwnIsWrittenAtOnce) {
   log.line("pushing metric file");
   log.line("");
   EXPECT_EQ(watch.writes(), (Writes{"pushing metric file\n", "\n"}));
+}
+
+TEST(ConsoleLog, ALineStaysALineAndSteersNoTerminal) {
+  const WriteWatch watch;
+  ConsoleLog log(watch.writingEnd());
+  log.line(
+      "apn \xc2\x9b"
+      "31m\x1b[2J\nb");
+  log.line(hostileText());
+  const Writes writes = watch.writes();
+  ASSERT_EQ(writes.size(), 2u);
+  EXPECT_EQ(writes[0], "apn \\u{9b}31m\\u{1b}[2J\\nb\n");
+  EXPECT_TRUE(areHarmless(writes[1]));
+  EXPECT_EQ(writes[1].find('\n'), writes[1].size() - 1);
 }
 
 TEST(ConsoleLog, TheLinesOfAGroupLeaveInOneWrite) {
