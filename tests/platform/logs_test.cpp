@@ -202,9 +202,11 @@ TEST(SystemLog, EachLineIsEchoedToStandardErrorInOneWrite) {
   const int before = ::dup(STDERR_FILENO);
   ASSERT_GE(::dup2(watch.writingEnd(), STDERR_FILENO), 0);
   SystemLog("probeview").line("-[RadixWrapper listen]: listening for %s events");
+  SystemLog("probeview").line("dict=[\"apn\": \"\u009b31m\"]\n\x1b[2J");
   ::dup2(before, STDERR_FILENO);
   ::close(before);
-  EXPECT_EQ(watch.writes(), (Writes{"-[RadixWrapper listen]: listening for %s events\n"}));
+  EXPECT_EQ(watch.writes(), (Writes{"-[RadixWrapper listen]: listening for %s events\n",
+                                    "dict=[\"apn\": \"\\u{9b}31m\"]\\n\\u{1b}[2J\n"}));
 }
 
 TEST(SystemLog, SurvivesAClosedStandardError) {

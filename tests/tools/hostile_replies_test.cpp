@@ -11,6 +11,7 @@
 
 #include "messages/metric_identifiers.h"
 #include "tests/support/harmless.h"
+#include "tests/support/output_of.h"
 #include "tests/tools/hostile_service.h"
 #include "tests/tools/run_probectl.h"
 #include "tools/status_command.h"
@@ -173,6 +174,21 @@ TEST_F(HostileTexts, OfARecordReachNoTerminalAndItsTimeMayBeAny) {
     EXPECT_TRUE(nlohmann::json::accept(json.output)) << json.output;
     EXPECT_EQ(nlohmann::json::parse(json.output).at("time"), time);
   }
+}
+
+TEST_F(HostileTexts, OfCellsOriginsAndRepliesReachNoTerminalOrLogOfTheViewer) {
+  const HostileService service(
+      {.message = hostileText(),
+       .content = {{"sources", List{Dictionary{{"metric_ids", List{std::int64_t{K_CELLULAR_ACTIVE_BEARER}}}}}}},
+       .events = {event(hostileText(), 0)}});
+  const std::string pages = outputOf(PROBECTL " --socket " + service.path() + " pages LTE Active Bearers 2>&1");
+  EXPECT_TRUE(areHarmless(pages)) << pages;
+  EXPECT_THAT(pages, HasSubstr("\\u{1b}[2J\ufffd\n"));
+  // The pages, the console log and the system log, which is echoed.
+  const std::string all = outputOf("RADIXD_SOCKET=" + service.path() + " " PROBEVIEW " --print --log - 2>&1");
+  EXPECT_TRUE(areHarmless(all)) << all;
+  EXPECT_THAT(all, HasSubstr(": error=0 msg=\\u{1b}[2J"));
+  EXPECT_THAT(all, HasSubstr("\nprobeview › LTE › Active Bearers\n"));
 }
 
 TEST_F(HostileTexts, OfAPayloadReachNoTerminal) {
