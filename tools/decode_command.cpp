@@ -69,7 +69,7 @@ ExitStatus decodeForAPerson(const Options& options, Tool& tool) {
   }
   DecodeResult result = decodePayload(options.reference, *bytes);
   if (!result.payload) {
-    tool.errors << "probectl: " << result.error << '\n';
+    tool.errors << "probectl: " << result.error << result.hint << '\n';
     return ExitStatus::UsageError;
   }
   std::string text;
