@@ -58,8 +58,7 @@ class HostileService {
    private:
     template <typename Sentence>
     void say(const Sentence& sentence) {
-      const radix::FrameBytes frame = radix::encode(sentence);
-      if (link_) link_->send({&frame, 1});
+      if (link_) link_->sendOne(radix::encode(sentence));
     }
     void onFrame(std::span<const std::uint8_t> frame) override { radix::decodeFrame(frame, *this); }
     void onOverlongFrame(std::size_t) override {}
