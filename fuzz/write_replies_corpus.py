@@ -87,7 +87,7 @@ INPUTS = {
     "many_entries": {"clients": (LIST, [(DICTIONARY, {})] * 1100)},
     "event": event(),
     "event_with_a_text_that_steers": event(kKeyMetricID=(INT64, 0x3CD50D),
-                                           kKeyPayload=(BYTES, b"\x12\x07\x1a\x05\x1b[2J\xff"), kKeyOrigin=(TEXT, STEERING)),
+                                           kKeyPayload=(BYTES, b"\x1a\x07\x1a\x05\x1b[2J\xff"), kKeyOrigin=(TEXT, STEERING)),
     "event_at_the_end_of_time": event(kKeyTime=(INT64, MOST)),
     "event_before_time": event(kKeyTime=(INT64, LEAST), kKeyMetricID=(INT64, LEAST)),
     "event_of_foreign_kinds": event(kKeyPayload=(TEXT, "x"), kKeyOrigin=(BYTES, b"x"), kKeyTime=real(1e300)),

@@ -136,7 +136,7 @@ class HostileTexts : public ::testing::Test {
   static radix::Event event(std::string origin, std::int64_t time) {
     // An access point's name with a sequence that clears the screen.
     return {.metricId = K_CELLULAR_ACTIVE_BEARER,
-            .payload = {0x12, 0x07, 0x1A, 0x05, 0x1B, 0x5B, 0x32, 0x4A, 0xFF},
+            .payload = {0x1A, 0x07, 0x1A, 0x05, 0x1B, 0x5B, 0x32, 0x4A, 0xFF},
             .time = time,
             .origin = std::move(origin)};
   }
