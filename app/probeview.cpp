@@ -27,8 +27,8 @@ int runProbeview(int argc, const char* const* argv, const MakeWindow& makeWindow
   terminal->excludes(print);
   program
       .add_option("--log", options.logFile,
-                  "Write the console log of every metric to this file (default: standard output, and nowhere in "
-                  "the terminal)")
+                  "Write the console log of every metric to this file, - for standard output (default: with the window "
+                  "standard output, else nowhere)")
       ->type_name("FILE");
   program.footer(
       "Keys: arrows, Page Up, Page Down, Home and End move, Return opens; Esc, Backspace and Left go back. In the "

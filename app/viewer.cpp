@@ -10,6 +10,7 @@
 #include <memory>
 #include <ostream>
 #include <string>
+#include <string_view>
 #include <system_error>
 
 #include "app/application.h"
@@ -20,6 +21,7 @@
 #include "ui/open_page.h"
 #include "ui/print_front.h"
 #include "ui/terminal/terminal_front.h"
+#include "values/plain_text.h"
 
 namespace probeview {
 
@@ -32,22 +34,32 @@ int openLogFile(const std::string& path) {
   return file;
 }
 
+// Names standard output, where it is to have the log beside or instead of pages.
+constexpr std::string_view standardOutput = "-";
+
 // The logs live as long as the process: wrapper and store keep referring to them.
 bool chooseLogs(const ViewerOptions& options, FrontKind front, std::ostream& errors) {
-  const bool pagesOnly = options.pagesOnly || front == FrontKind::Terminal;
-  if (options.logFile) {
+  const bool isTerminal = front == FrontKind::Terminal;
+  if (options.logFile == standardOutput) {
+    if (isTerminal) {
+      errors << "the console log would be written across the pages in the terminal; name a file with --log\n";
+      return false;
+    }
+    setConsoleLog(*new ConsoleLog(STDOUT_FILENO));
+  } else if (options.logFile) {
     const int file = openLogFile(*options.logFile);
     if (file < 0) {
-      errors << "the log file " << *options.logFile
+      errors << "the log file " << onOneLine(*options.logFile)
              << " cannot be written: " << (errno == ENXIO ? "nobody reads this pipe" : std::strerror(errno))
              << "; name another with --log\n";
       return false;
     }
     setConsoleLog(*new ConsoleLog(file));
-  } else if (pagesOnly) {
+  } else if (options.pagesOnly || front != FrontKind::Window) {
+    // Who asks for pages is not given a log as well.
     setConsoleLog(*new DiscardingSink);
   }
-  if (pagesOnly) setSystemLog(*new SystemLog("probeview", SystemLog::Echo::None));
+  if (options.pagesOnly || isTerminal) setSystemLog(*new SystemLog("probeview", SystemLog::Echo::None));
   return true;
 }
 

@@ -19,10 +19,11 @@ namespace probeview {
 using MakeWindow = std::function<std::unique_ptr<Front>()>;
 
 struct ViewerOptions {
-  std::optional<FrontKind> front;      // absent: whatever suits the circumstances
-  std::optional<std::string> logFile;  // where the console log goes; absent: see below
+  std::optional<FrontKind> front;  // absent: whatever suits the circumstances
+  // Where the console log goes, "-" being standard output; absent: with the window to standard output, else nowhere.
+  std::optional<std::string> logFile;
   std::optional<std::string> pageKey;  // the page to begin with; absent: the launch list
-  // Whether standard output is for pages alone. Else the console log goes there, unless the terminal's pages need it.
+  // Whether standard output is for pages alone, and standard error for what went wrong.
   bool pagesOnly = false;
 };
 

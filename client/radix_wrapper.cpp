@@ -10,6 +10,7 @@
 #include "platform/file_beginning.h"
 #include "platform/serial_queue.h"
 #include "radix/link.h"
+#include "values/plain_text.h"
 #include "values/printer.h"
 
 namespace probeview {
@@ -143,7 +144,8 @@ bool RadixWrapper::perform(std::string_view operation, std::string_view command,
   line += ": error=";
   appendInteger(result.status, line);
   line += " msg=";
-  line += result.message;
+  // The words are the service's.
+  appendOnOneLine(result.message, line);
   shared_->systemLog.line(line);
   return result.status == 0;
 }

@@ -17,6 +17,43 @@ packages_deep="$packages_arm64 clang libclang-rt-14-dev valgrind"
 # The peers that the benchmarks measure against, and what counts their instructions (its header comes with it).
 packages_bench="libprotozero-dev nanopb libnanopb-dev libprotobuf-dev protobuf-compiler valgrind"
 
+# A line on standard output. A reader that has gone away has seen enough: then the script ends, with status_unread.
+status_unread=141
+say() { printf '%s\n' "$*" 2>/dev/null || exit "$status_unread"; }
+
+# Reads the output of something long. On a terminal the last line shows, rewritten in place and wiped at the end; else
+# nothing does.
+show_progress() {
+  local line width
+  if [ ! -t 2 ]; then
+    cat >/dev/null
+    return 0
+  fi
+  width=$(stty size <&2 2>/dev/null | cut -d ' ' -f 2) || true
+  if [ "${width:-0}" -lt 20 ]; then width=80; fi
+  while IFS= read -r line || [ -n "$line" ]; do
+    line=${line//[[:cntrl:]]/ }
+    printf '\r\033[K%s' "${line:0:width-1}" >&2 || true
+  done
+  printf '\r\033[K' >&2 || true
+}
+
+# logged LOG COMMAND…: adds the output to the file and shows on a terminal how far it has come; the command's status.
+logged() {
+  local log=$1
+  shift
+  "$@" 2>&1 </dev/null | tee -a "$log" | show_progress
+  return "${PIPESTATUS[0]}"
+}
+
+# Who holds the lock of the package manager, as a process number; nothing when it is free.
+dpkg_lock=${dpkg_lock:-/var/lib/dpkg/lock-frontend}
+dpkg_lock_holder() {
+  local inode
+  inode=$(stat -c %i "$dpkg_lock" 2>/dev/null) || return 0
+  sed -n "s/^[0-9]*: *[A-Z]* *[A-Z]* *WRITE \([0-9]*\) [0-9a-f]*:[0-9a-f]*:$inode .*/\1/p" /proc/locks | head -n 1 || true
+}
+
 # Installs those of the packages named that are missing.
 install_packages() {
   local missing="" package
@@ -24,8 +61,8 @@ install_packages() {
     dpkg-query -W -f '${db:Status-Status}' "$package" 2>/dev/null | grep -qx installed || missing="$missing $package"
   done
   [ -n "$missing" ] || return 0
-  echo "installing:$missing"
-  local sudo=""
+  say "installing:$missing"
+  local sudo="" holder
   if [ "$(id -u)" != 0 ]; then
     if ! command -v sudo >/dev/null; then
       echo "error: these packages are missing and there is neither root nor sudo to install them:$missing" >&2
@@ -34,12 +71,19 @@ install_packages() {
     sudo=sudo
   fi
   # Another apt may be at work; wait for it rather than fail.
-  local apt="$sudo env DEBIAN_FRONTEND=noninteractive apt-get -o DPkg::Lock::Timeout=300 -qq"
+  holder=$(dpkg_lock_holder)
+  if [ -n "$holder" ]; then
+    echo "waiting for process $holder, which is installing packages, for at most 5 minutes" >&2
+  fi
+  local apt="$sudo env DEBIAN_FRONTEND=noninteractive apt-get -o DPkg::Lock::Timeout=300 -q"
+  local log="$top/build/packages.log"
+  : >"$log"
   # shellcheck disable=SC2086
-  if ! $apt install -y --no-install-recommends $missing >"$top/build/packages.log" 2>&1; then
+  if ! logged "$log" $apt install -y --no-install-recommends $missing; then
     # Most often the lists of packages are old or absent.
+    : >"$log"
     # shellcheck disable=SC2086
-    if ! { $apt update && $apt install -y --no-install-recommends $missing; } >"$top/build/packages.log" 2>&1; then
+    if ! { logged "$log" $apt update && logged "$log" $apt install -y --no-install-recommends $missing; }; then
       tail -n 5 "$top/build/packages.log" >&2
       echo "error: the packages could not be installed; the whole story is in build/packages.log" >&2
       return 1
@@ -52,10 +96,10 @@ stage_name=""
 stage() {
   local now
   now=$(date +%s)
-  if [ -n "$stage_name" ]; then echo "-- $stage_name: $((now - stage_began)) s"; fi
+  if [ -n "$stage_name" ]; then say "-- $stage_name: $((now - stage_began)) s"; fi
   stage_name=$1
   stage_began=$now
-  if [ -n "$1" ]; then echo "== $1"; fi
+  if [ -n "$1" ]; then say "== $1"; fi
 }
 
 # configure_and_build PRESET [CMake arguments]: quiet when all is well, the errors otherwise. Builds everything, or what
@@ -66,14 +110,18 @@ configure_and_build() {
   shift
   # Two builds of one folder at once would write over each other.
   exec 8>"$top/build/$preset.lock"
-  flock 8
-  if ! cmake --preset "$preset" "$@" >"$log" 2>&1; then
+  if ! flock -n 8; then
+    echo "waiting for another build of build/$preset to end" >&2
+    flock 8
+  fi
+  : >"$log"
+  if ! logged "$log" cmake --preset "$preset" "$@"; then
     tail -n 30 "$log" >&2
     echo "error: configuring failed; the whole story is in ${log#"$top"/}" >&2
     return 1
   fi
   # shellcheck disable=SC2086
-  if ! cmake --build "$top/build/$preset" --target $build_targets >>"$log" 2>&1 </dev/null; then
+  if ! logged "$log" cmake --build "$top/build/$preset" --target $build_targets; then
     grep -E 'error|undefined reference|FAILED' "$log" | head -n 30 >&2 || tail -n 10 "$log" >&2
     echo "error: the build failed; the whole story is in ${log#"$top"/}" >&2
     return 1

@@ -8,6 +8,7 @@
 #include <vector>
 
 #include "platform/fatal_error.h"
+#include "values/plain_text.h"
 
 namespace probeview {
 
@@ -62,7 +63,7 @@ ConsoleLog::~ConsoleLog() {
 
 void ConsoleLog::line(std::string_view text) {
   if (closed()) return;
-  held_ += text;
+  appendOnOneLine(text, held_);
   held_ += '\n';
   if (openGroups_ == 0) release();
 }

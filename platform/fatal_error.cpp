@@ -14,6 +14,7 @@
 #include <vector>
 
 #include "platform/log_writer.h"
+#include "values/plain_text.h"
 
 namespace probeview {
 
@@ -61,7 +62,7 @@ void fatalError(std::string_view reason) {
   drainLogs(logsEndTime);
   if (observer()) observer()(reason);
   std::string text = "probeview: stopped: ";
-  text += reason;
+  appendOnOneLine(reason, text);
   text += '\n';
   writeLastLine(text, deadline - std::chrono::steady_clock::now());
   std::abort();

@@ -10,6 +10,8 @@
 #include <string>
 #include <utility>
 
+#include "values/plain_text.h"
+
 namespace probeview {
 
 namespace {
@@ -46,10 +48,10 @@ SystemLog::SystemLog(Logger logger, Echo echo)
 }
 
 void SystemLog::line(std::string_view text) {
-  toLogger_.append(text);
+  std::string line = onOneLine(text);
+  toLogger_.append(line);
   if (!toStandardError_) return;
   // One entry, so that no other process's line comes in between.
-  std::string line(text);
   line += '\n';
   toStandardError_->append(line);
 }

@@ -269,6 +269,10 @@ Page metricsPage() {
 
 }  // namespace
 
+std::string publishedType(const MessageDescriptor& message, const FieldDescriptor& field) {
+  return (isRepeated(field.kind) ? "list of " : "") + protoType(message, field);
+}
+
 std::string unnamedZero(std::string_view enumeration) {
   std::string name;
   for (const char character : enumeration) {

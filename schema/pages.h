@@ -8,6 +8,8 @@
 #include <string_view>
 #include <vector>
 
+#include "messages/runtime/field_descriptor.h"
+
 namespace probeview {
 
 struct Page {
@@ -17,6 +19,10 @@ struct Page {
 
 // The four .proto files and docs/metrics.md.
 std::vector<Page> schemaPages();
+
+// The type of a field of that message as the schema has it: "uint32", "RxInfo", "KCellularLteRrcState.State", "list of
+// sint32".
+std::string publishedType(const MessageDescriptor& message, const FieldDescriptor& field);
 
 // The name of an enumeration's value 0 where the enumeration itself has none: proto3 wants one.
 std::string unnamedZero(std::string_view enumeration);

@@ -5,6 +5,7 @@
 #include <utility>
 
 #include "messages/metric_identifiers.h"
+#include "values/near_matches.h"
 #include "values/plain_text.h"
 #include "values/printer.h"
 
@@ -42,6 +43,7 @@ constexpr std::string_view onChange = "on change";
 // Dots nest one table in another, and the library takes tables apart by recursion; no file that is meant has so many.
 constexpr std::ptrdiff_t mostDots = 4000;
 constexpr std::size_t mostNotes = 100;
+constexpr std::string_view sectionNames[] = {"metrics", "triggers"};
 // A reason may quote a key of the file, which may be as long as the file.
 constexpr std::size_t longestReason = 500;
 
@@ -107,9 +109,21 @@ class Parser {
     toml::parse_result parsed = toml::parse(withoutForeignCharacters(text));
     if (parsed.failed()) {
       const toml::parse_error& error = parsed.error();
-      return refusal(error.source().begin.line, error.source().begin.column, oneLine(error.description()));
+      // The library's descriptions may quote what stands in the file.
+      return refusal(error.source().begin.line, error.source().begin.column, onOneLine(error.description()));
     }
-    for (const auto& [key, node] : inFileOrder(parsed.table())) {
+    const std::vector<Entry> sections = inFileOrder(parsed.table());
+    const auto isKnown = [](const Entry& section) {
+      return std::ranges::find(sectionNames, section.first->str()) != std::end(sectionNames);
+    };
+    // A newer file has sections beside those that we know; one that has others alone was not meant for us.
+    if (!sections.empty() && std::ranges::none_of(sections, isKnown)) {
+      const toml::key& first = *sections.front().first;
+      return refusal(first.source().begin.line, first.source().begin.column,
+                     "there is neither [metrics] nor [triggers] here, only " + shown(first.str()) +
+                         (sections.size() > 1 ? " and others" : "") + didYouMean(first.str(), sectionNames));
+    }
+    for (const auto& [key, node] : sections) {
       if (key->str() == "metrics") {
         readSection(*key, *node, &Parser::readMetric);
       } else if (key->str() == "triggers") {
@@ -220,12 +234,6 @@ class Parser {
       return;
     }
     configuration_.notes.push_back("line " + std::to_string(where.begin.line) + ": " + what);
-  }
-  // The library's descriptions may quote what stands in the file.
-  static std::string oneLine(std::string_view description) {
-    std::string text;
-    appendValidUtf8(description, text);
-    return onOneLine(text);
   }
 
   Configuration configuration_;

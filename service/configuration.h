@@ -12,7 +12,7 @@
 //
 // An empty text is valid and wants no metric at all. A metric, section or key that nobody knows is noted and ignored,
 // so that an older service takes a newer file; what cannot be meant (not TOML, a period of "often", a metric named
-// twice) is refused with its line and column.
+// twice, a text of unknown sections alone) is refused with its line and column.
 #pragma once
 
 #include <cstdint>

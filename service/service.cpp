@@ -190,8 +190,15 @@ Reply Service::queryMetric(Session& session, const Dictionary& arguments) {
   std::vector<std::int64_t> metrics;
   if (const std::int64_t metric = integerArgument(arguments, radix::kKeyMetricID); metric != 0) {
     // An identifier that is no metric's may be that of a trigger: the two look alike to whoever asks.
-    if (!isMetric(metric)) metrics = metricsOfTrigger(session, metric);
-    if (metrics.empty()) metrics.push_back(metric);
+    if (isMetric(metric)) {
+      metrics.push_back(metric);
+    } else {
+      metrics = metricsOfTrigger(session, metric);
+    }
+    if (metrics.empty()) {
+      return answer(Status::CannotFill, hexText(metric) + " is no metric, and no configuration says which metrics a " +
+                                            "trigger of that number stands for: push one with it under [triggers]");
+    }
   } else if (trigger != 0) {
     metrics = metricsOfTrigger(session, trigger);
     if (metrics.empty()) {

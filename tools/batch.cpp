@@ -6,6 +6,7 @@
 #include <ostream>
 
 #include "values/json.h"
+#include "values/plain_text.h"
 #include "values/printer.h"
 
 namespace probeview {
@@ -107,8 +108,7 @@ std::optional<std::vector<std::uint8_t>> parseHex(std::string_view text) {
 
 std::string quotedExcerpt(std::string_view text) {
   constexpr std::size_t longest = 60;
-  std::string out;
-  print(Value::text(text.substr(0, longest)), out);
+  std::string out = onOneLine(printed(Value::text(text.substr(0, longest))));
   if (text.size() > longest) out += "…";
   return out;
 }

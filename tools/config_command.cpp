@@ -10,6 +10,7 @@
 #include "radix/link.h"
 #include "radix/service_commands.h"
 #include "tools/service_client.h"
+#include "values/plain_text.h"
 
 namespace probeview {
 
@@ -19,7 +20,7 @@ ExitStatus push(const std::string& path, Tool& tool) {
   // What is more the client library refuses, with the limit.
   const FileBeginning content = readBeginning(path, radix::longestFrame + 1);
   if (!content.bytes) {
-    tool.errors << "probectl: cannot read " << path << ": " << content.error << '\n';
+    tool.errors << "probectl: cannot read " << onOneLine(path) << ": " << content.error << '\n';
     return ExitStatus::Failure;
   }
   ServiceClient client(tool);

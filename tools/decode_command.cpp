@@ -4,6 +4,8 @@
 #include <CLI/CLI.hpp>
 #include <algorithm>
 #include <ostream>
+#include <string>
+#include <vector>
 
 #include "tools/batch.h"
 #include "tools/payload_decoder.h"
@@ -18,8 +20,36 @@ namespace {
 struct DecodeOptions {
   bool batch = false;
   std::string reference;
-  std::string hex;
+  std::vector<std::string> hex;  // words, as they were pasted
 };
+
+// Bytes from hexadecimal as it is pasted: in any number of words, with or without 0x before each, across line ends. A
+// word with 0x holds whole bytes.
+std::optional<std::vector<std::uint8_t>> parsePastedHex(const std::vector<std::string>& arguments) {
+  if (arguments.size() == 1 && arguments[0] == "-") return parseHex("-");
+  std::string digits;
+  for (const std::string& argument : arguments) {
+    std::string_view rest = argument;
+    while (true) {
+      rest.remove_prefix(std::min(rest.find_first_not_of(" \t\r\n"), rest.size()));
+      if (rest.empty()) break;
+      std::string_view word = rest.substr(0, rest.find_first_of(" \t\r\n"));
+      rest.remove_prefix(word.size());
+      if (word.starts_with("0x") || word.starts_with("0X")) {
+        word.remove_prefix(2);
+        if (word.empty() || word.size() % 2 != 0) return std::nullopt;
+      }
+      digits += word;
+    }
+  }
+  return digits == "-" ? std::nullopt : parseHex(digits);
+}
+
+std::string joined(const std::vector<std::string>& words) {
+  std::string text;
+  for (const std::string& word : words) text += (text.empty() ? "" : " ") + word;
+  return text;
+}
 
 std::string_view asText(const std::vector<std::uint8_t>& bytes) {
   return {reinterpret_cast<const char*>(bytes.data()), bytes.size()};
@@ -27,25 +57,25 @@ std::string_view asText(const std::vector<std::uint8_t>& bytes) {
 
 // A text stands bare unless it holds what would break the line or steer a terminal.
 std::string valueForAPerson(const Value& value) {
-  const std::string bare = bareText(value);
-  return std::ranges::none_of(bare, isControlCharacter) ? bare : printed(value);
+  std::string bare = bareText(value);
+  return onOneLine(bare) == bare ? bare : onOneLine(printed(value));
 }
 
 ExitStatus decodeForAPerson(const DecodeOptions& options, Tool& tool) {
-  const std::optional<std::vector<std::uint8_t>> bytes = parseHex(options.hex);
+  const std::optional<std::vector<std::uint8_t>> bytes = parsePastedHex(options.hex);
   if (!bytes) {
-    tool.errors << "probectl: " << quotedExcerpt(options.hex)
+    tool.errors << "probectl: " << quotedExcerpt(joined(options.hex))
                 << " is no payload: pairs of hexadecimal digits, or - for an empty one\n";
     return ExitStatus::UsageError;
   }
   DecodeResult result = decodePayload(options.reference, *bytes);
   if (!result.payload) {
-    tool.errors << "probectl: " << result.error << '\n';
+    tool.errors << "probectl: " << result.error << result.hint << '\n';
     return ExitStatus::UsageError;
   }
   std::string text;
   for (const Dictionary::Entry& entry : result.payload->dictionary) {
-    appendValidUtf8(entry.key.text(), text);
+    appendOnOneLine(entry.key.text(), text);
     text += ": ";
     text += valueForAPerson(entry.value);
     text += '\n';
@@ -103,7 +133,8 @@ void addDecodeCommand(CLI::App& program, Tool& tool) {
   auto options = std::make_shared<DecodeOptions>();
   CLI::Option* reference = command->add_option("CLASS|METRIC", options->reference,
                                                "A message class, a metric, or a metric's identifier (decimal or 0x…)");
-  CLI::Option* hex = command->add_option("HEX", options->hex, "The payload in hexadecimal, - for an empty one");
+  CLI::Option* hex = command->add_option(
+      "HEX", options->hex, "The payload in hexadecimal, - for an empty one; blanks, line ends and 0x do no harm");
   command
       ->add_flag("--batch", options->batch,
                  "Read lines \"CLASS|METRIC HEX\" from standard input, answer each with a line of JSON")
@@ -119,6 +150,7 @@ void addDecodeCommand(CLI::App& program, Tool& tool) {
       "\n"
       "Examples:\n"
       "  probectl decode K_LTE_RRC_STATE 10031801\n"
+      "  probectl decode K_LTE_RRC_STATE 0x10 0x03 0x18 0x01\n"
       "  probectl decode KCellularLteTxPower -\n"
       "  echo '0x3C4E04 1003' | probectl decode --batch");
   command->callback([options, &tool] {

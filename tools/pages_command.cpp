@@ -5,10 +5,13 @@
 #include <algorithm>
 #include <memory>
 #include <ostream>
+#include <string_view>
 #include <vector>
 
 #include "app/viewer.h"
+#include "tools/batch.h"
 #include "ui/varnet_view_items.h"
+#include "values/near_matches.h"
 
 namespace probeview {
 
@@ -27,13 +30,18 @@ ExitStatus showPages(const PagesOptions& options, Tool& tool) {
     // The key is one text of several words; it may come quoted or not.
     std::string key = options.key.front();
     for (std::size_t word = 1; word < options.key.size(); ++word) key += " " + options.key[word];
-    const auto keys = navigablePageKeys();
-    if (std::find(keys.begin(), keys.end(), key) == keys.end()) {
-      tool.errors << "there is no page \"" << key << "\"; there are:\n";
-      for (const auto& known : keys) tool.errors << "  " << known << "\n";
+    const std::vector<std::string> keys = navigablePageKeys();
+    const auto found =
+        std::ranges::find_if(keys, [&](const std::string& known) { return editDistance(known, key) == 0; });
+    if (found == keys.end()) {
+      const std::vector<std::string_view> names(keys.begin(), keys.end());
+      const std::string near = didYouMean(key, names);
+      tool.errors << "probectl: there is no page " << quotedExcerpt(key) << near
+                  << (near.empty() ? "; there" : " There") << " are:\n";
+      for (const std::string& known : keys) tool.errors << "  " << known << "\n";
       return ExitStatus::UsageError;
     }
-    viewer.pageKey = key;
+    viewer.pageKey = *found;
   }
   return runViewer(viewer, nullptr, tool.errors) == 0 ? ExitStatus::Success : ExitStatus::Failure;
 }
@@ -43,14 +51,16 @@ ExitStatus showPages(const PagesOptions& options, Tool& tool) {
 void addPagesCommand(CLI::App& program, Tool& tool) {
   CLI::App* command = program.add_subcommand("pages", "Show the viewer's pages as text");
   auto options = std::make_shared<PagesOptions>();
-  command->add_option("KEY", options->key, "The page to show, as LTE Serving Cell Info; without it, all");
+  command->add_option("KEY", options->key, "The page to show, as LTE Serving Cell Info, in any case; without it, all");
   command
-      ->add_option("--log", options->logFile, "Write the console log of every metric to this file; else it is dropped")
+      ->add_option("--log", options->logFile,
+                   "Write the console log of every metric to this file, - for standard output; else it is dropped")
       ->type_name("FILE");
   command->footer(
       "In a terminal the pages are live: arrows move, Return opens, Esc goes back, q ends. Elsewhere each page is\n"
       "printed once, when every metric has come or after 15 s.\n\n"
-      "Examples:\n  probectl pages\n  probectl pages LTE Serving Cell Info\n  probectl pages 'UMTS RRC State' | cat");
+      "'probectl names pages' lists the keys.\n\n"
+      "Examples:\n  probectl pages\n  probectl pages lte serving cell info\n  probectl pages 'UMTS RRC State' | cat");
   command->callback([options, &tool] { tool.run = [options, &tool] { return showPages(*options, tool); }; });
 }
 

@@ -23,10 +23,11 @@ struct DecodedPayload {
   CollectedLines log;  // what the decoder had to say
 };
 
-// Where the payload is of no class: why, for a person.
+// Where the payload is of no class: why, and, for a person, which names are near ("; did you mean …?", or empty).
 struct DecodeResult {
   std::optional<DecodedPayload> payload;
   std::string error;
+  std::string hint;
 };
 
 // The reference is a class ("KCellularLteRrcState"), a metric ("K_LTE_RRC_STATE") or its identifier, decimal or 0x….

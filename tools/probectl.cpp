@@ -5,13 +5,19 @@
 #include <unistd.h>
 
 #include <CLI/CLI.hpp>
+#include <algorithm>
 #include <cstdlib>
 #include <iostream>
+#include <sstream>
+#include <string_view>
 #include <system_error>
 #include <vector>
 
 #include "platform/time_zone.h"
 #include "radix/socket_path.h"
+#include "tools/batch.h"
+#include "values/near_matches.h"
+#include "values/plain_text.h"
 
 namespace probeview {
 
@@ -24,6 +30,33 @@ int finished(Tool& tool, ExitStatus status) {
   if (tool.output.good() || readerIsGone(tool)) return static_cast<int>(status);
   tool.errors << "probectl: not all of the answer could be written; is the disk full?\n";
   return static_cast<int>(status == ExitStatus::Success ? ExitStatus::Failure : status);
+}
+
+// Where the command line names a subcommand that there is none of, what to say of it; empty otherwise.
+std::string unknownSubcommand(const CLI::App& program, std::span<const std::string> arguments) {
+  const CLI::App* command = &program;
+  std::string path = program.get_name();
+  for (std::size_t index = 0; index < arguments.size(); ++index) {
+    const std::string& word = arguments[index];
+    if (word.starts_with("-")) {
+      if (word == "--socket") ++index;
+      continue;
+    }
+    const auto subcommands = command->get_subcommands([](const CLI::App*) { return true; });
+    if (subcommands.empty()) return {};
+    const auto found =
+        std::ranges::find_if(subcommands, [&](const CLI::App* each) { return each->get_name() == word; });
+    if (found == subcommands.end()) {
+      std::vector<std::string_view> names;
+      for (const CLI::App* each : subcommands) names.push_back(each->get_name());
+      const std::string near = didYouMean(word, names);
+      return "probectl: there is no subcommand " + quotedExcerpt(word) + (near.empty() ? ";" : near) + " '" + path +
+             " --help' lists all\n";
+    }
+    command = *found;
+    path += " " + word;
+  }
+  return {};
 }
 
 }  // namespace
@@ -64,7 +97,16 @@ int runProbectl(std::span<const std::string> arguments, std::istream& input, std
     program->parse(std::vector<std::string>(arguments.rbegin(), arguments.rend()));
   } catch (const CLI::ParseError& error) {
     // Help and version arrive here too, as errors with status 0.
-    const int status = program->exit(error, output, errors);
+    std::ostringstream said;
+    const int status = program->exit(error, output, said);
+    const std::string unknown = status == 0 ? std::string() : unknownSubcommand(*program, arguments);
+    if (!unknown.empty()) {
+      errors << unknown;
+    } else {
+      // The arguments that it quotes may be names of files, which may hold anything.
+      std::istringstream lines(said.str());
+      for (std::string line; std::getline(lines, line);) errors << onOneLine(line) << '\n';
+    }
     return finished(tool, status == 0 ? ExitStatus::Success : ExitStatus::UsageError);
   }
   if (const auto trouble = settleTimeZone()) tool.errors << "probectl: " << *trouble << '\n';

@@ -8,7 +8,7 @@
 #include <ostream>
 #include <string>
 
-#include "tools/batch.h"
+#include "tools/names.h"
 #include "tools/record_text.h"
 #include "tools/service_client.h"
 
@@ -27,7 +27,7 @@ struct QueryOptions {
 ExitStatus query(const QueryOptions& options, Tool& tool) {
   const std::optional<std::int64_t> metric = metricOnCommandLine(options.metric);
   if (!metric) {
-    tool.errors << "probectl: " << quotedExcerpt(options.metric) << " is no metric and no metric's identifier\n";
+    tool.errors << "probectl: " << unknownMetric(options.metric) << '\n';
     return ExitStatus::UsageError;
   }
   ServiceClient client(tool);

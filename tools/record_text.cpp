@@ -1,6 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/record_text.h"
 
+#include <string_view>
+#include <utility>
+
 #include "messages/metric_identifiers.h"
 #include "messages/runtime/codable.h"
 #include "messages/runtime/data_reader.h"
@@ -20,7 +23,8 @@ std::int64_t integerOf(const Dictionary& event, std::string_view key) {
 }
 
 // What could be decoded of it; absent when nobody knows the metric's messages.
-std::optional<Dictionary> contentOf(const MetricIdentifier* metric, const Dictionary& event) {
+std::optional<Dictionary> contentOf(const Dictionary& event) {
+  const MetricIdentifier* metric = metricWithId(integerOf(event, radix::kKeyMetricID));
   const Value* payload = event.find(radix::kKeyPayload);
   if (metric == nullptr || metric->message == nullptr || payload == nullptr || !payload->bytes()) return std::nullopt;
   const auto message = metric->message->make();
@@ -30,17 +34,65 @@ std::optional<Dictionary> contentOf(const MetricIdentifier* metric, const Dictio
   return message->dictionaryRepresentation();
 }
 
+constexpr std::string_view timestampKey = "timestamp";
+
+// Without the times that change with every record, however deep they lie.
+Value withoutTimestamps(const Value& value) {
+  if (const Dictionary* const dictionary = value.dictionary()) {
+    Dictionary kept;
+    for (const Dictionary::Entry& entry : *dictionary) {
+      if (entry.key.text() != timestampKey) kept.set(entry.key, withoutTimestamps(entry.value));
+    }
+    return kept;
+  }
+  if (const List* const list = value.list()) {
+    List kept;
+    for (const Value& element : *list) kept.append(withoutTimestamps(element));
+    return kept;
+  }
+  return value;
+}
+
 }  // namespace
 
-std::string RecordText::line(const Dictionary& event) {
+std::string RecordText::line(const Dictionary& event) { return line(event, contentOf(event), {}); }
+
+std::optional<std::string> RecordText::changedLine(const Dictionary& event) {
+  const std::int64_t id = integerOf(event, radix::kKeyMetricID);
+  std::optional<Dictionary> content = contentOf(event);
+  const Value* payload = event.find(radix::kKeyPayload);
+  Last now{content.value_or(Dictionary{}), payload != nullptr && payload->bytes() ? printed(*payload) : std::string()};
+  const auto known = last_.find(id);
+  if (known == last_.end()) {
+    if (last_.size() == mostMetrics) last_.clear();
+    last_.emplace(id, std::move(now));
+    return line(event, std::move(content), {});
+  }
+  const Last before = std::exchange(known->second, now);
+  if (!content) return now.payload == before.payload ? std::nullopt : std::optional(line(event, std::nullopt, {}));
+  Dictionary changed;
+  for (const Dictionary::Entry& entry : now.content) {
+    const Value* earlier = before.content.find(entry.key.text());
+    const bool same = earlier != nullptr && withoutTimestamps(*earlier) == withoutTimestamps(entry.value);
+    if (!same && entry.key.text() != timestampKey) changed.set(entry.key, entry.value);
+  }
+  List gone;
+  for (const Dictionary::Entry& entry : before.content) {
+    if (!now.content.contains(entry.key.text()) && entry.key.text() != timestampKey) {
+      gone.append(Value::text(entry.key.text()));
+    }
+  }
+  if (changed.empty() && gone.empty()) return std::nullopt;
+  return line(event, std::move(changed), gone);
+}
+
+std::string RecordText::line(const Dictionary& event, std::optional<Dictionary> content, const List& gone) {
   const std::int64_t id = integerOf(event, radix::kKeyMetricID);
   const std::int64_t time = integerOf(event, radix::kKeyTime);
   const Value* origin = event.find(radix::kKeyOrigin);
   const std::string_view originText = origin != nullptr ? origin->text().value_or("") : "";
   const MetricIdentifier* metric = metricWithId(id);
-  std::optional<Dictionary> content = contentOf(metric, event);
   if (content && !options_.personal) hidePersonalData(*content);
-
   const std::string name = metric != nullptr ? std::string(metric->name) : hexText(id);
 
   std::string text;
@@ -59,21 +111,24 @@ std::string RecordText::line(const Dictionary& event) {
     } else {
       text += "null";
     }
+    if (!gone.empty()) {
+      text += ",\"gone\":";
+      appendJson(gone, text);
+    }
     text += '}';
     return text;
   }
   text = timestamps_.format(static_cast<double>(time));
   text += "  ";
-  // An origin is a file's name, which may hold anything.
-  text += onOneLine(originText);
+  text += originText;
   text += "  " + name + "  ";
   print(content.value_or(Dictionary{}), text);
-  return text;
-}
-
-std::optional<std::int64_t> metricOnCommandLine(std::string_view text) {
-  if (const MetricIdentifier* const metric = metricNamed(text)) return metric->id;
-  return parseInteger64(text);
+  if (!gone.empty()) {
+    text += "  gone: ";
+    print(gone, text);
+  }
+  // An origin is a file's name, which may hold anything, and texts of a network do so, too.
+  return onOneLine(text);
 }
 
 }  // namespace probeview

@@ -1,10 +1,11 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include <cstddef>
 #include <cstdint>
+#include <map>
 #include <optional>
 #include <string>
-#include <string_view>
 
 #include "platform/timestamp_formatter.h"
 #include "values/dictionary.h"
@@ -25,12 +26,24 @@ class RecordText {
   // time in milliseconds since 1970-01-01 UTC. The dictionary of a metric without a message class is empty (null).
   std::string line(const Dictionary& event);
 
+  // The same with those entries alone that differ from the metric's record before, and the keys that have gone
+  // ("gone" in JSON); absent when nothing but timestamps has changed. A metric's first record is shown whole.
+  std::optional<std::string> changedLine(const Dictionary& event);
+
  private:
+  // What a metric's last record held.
+  struct Last {
+    Dictionary content;
+    std::string payload;
+  };
+  // More metrics than there are; a service may make up as many as it likes.
+  static constexpr std::size_t mostMetrics = 256;
+
+  std::string line(const Dictionary& event, std::optional<Dictionary> content, const List& gone);
+
   Options options_;
   TimestampFormatter timestamps_;
+  std::map<std::int64_t, Last> last_;
 };
-
-// The identifier of a metric named on a command line, by its name or its identifier (decimal or 0x…).
-std::optional<std::int64_t> metricOnCommandLine(std::string_view text);
 
 }  // namespace probeview

@@ -6,6 +6,7 @@
 
 #include "radix/service_commands.h"
 #include "radix/status.h"
+#include "values/plain_text.h"
 
 namespace probeview {
 
@@ -23,7 +24,7 @@ ExitStatus ServiceClient::perform(std::string_view command, const Dictionary& ar
   const bool isAway = status == radix::Status::NoService || status == radix::Status::TimedOut;
   const std::string prefix = subject.empty() || isAway ? "probectl: " : "probectl: " + subject + ": ";
   const bool isDone = status == radix::Status::Ok;
-  if (!isDone || !result.message.empty()) tool_.errors << prefix << result.message << '\n';
+  if (!isDone || !result.message.empty()) tool_.errors << onOneLine(prefix + result.message) << '\n';
   if (!isDone) return ExitStatus::Failure;
   if (reply != nullptr && answer) *reply = radix::client::nativeDictionary(*answer);
   return ExitStatus::Success;

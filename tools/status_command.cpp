@@ -8,77 +8,44 @@
 #include <string_view>
 
 #include "radix/service_commands.h"
+#include "tools/reply_reader.h"
 #include "tools/service_client.h"
 #include "values/json.h"
-#include "values/plain_text.h"
-#include "values/printer.h"
 
 namespace probeview {
 
 namespace {
 
-// Where a service says less than this program knows, it shows nothing.
-std::string text(const Dictionary& entry, std::string_view key) {
-  const Value* value = entry.find(key);
-  if (value == nullptr) return "";
-  // Names come from other programs: nothing in them may steer the terminal.
-  return onOneLine(bareText(*value));
-}
-
-bool truth(const Dictionary& entry, std::string_view key) {
-  const Value* value = entry.find(key);
-  return value != nullptr && value->boolean().value_or(false);
-}
-
-std::string oneDecimal(double number) {
-  // Without the process's locale, which may have a comma.
-  const auto tenths = static_cast<std::int64_t>(number * 10 + (number < 0 ? -0.5 : 0.5));
-  std::string shown = tenths < 0 ? "-" : "";
-  const std::int64_t size = tenths < 0 ? -tenths : tenths;
-  return shown + std::to_string(size / 10) + "." + std::to_string(size % 10);
-}
-
-std::string rate(const Dictionary& entry) {
-  const Value* value = entry.find("records_per_second");
-  return oneDecimal(value != nullptr ? value->real().value_or(0) : 0) + "/s";
-}
-
-std::string duration(std::int64_t milliseconds) {
-  const std::int64_t seconds = milliseconds / 1000;
-  if (seconds < 60) return oneDecimal(static_cast<double>(milliseconds) / 1000) + " s";
-  if (seconds < 3600) return std::to_string(seconds / 60) + " min " + std::to_string(seconds % 60) + " s";
-  return std::to_string(seconds / 3600) + " h " + std::to_string(seconds / 60 % 60) + " min";
-}
-
-const List& list(const Dictionary& report, std::string_view key) {
-  static const List none;
-  const Value* value = report.find(key);
-  return value != nullptr && value->list() != nullptr ? *value->list() : none;
-}
-
-void showSource(const Dictionary& source, std::ostream& output) {
-  output << "  " << text(source, "origin") << ": ";
-  if (source.contains("state")) output << text(source, "state") << ", ";
+void showSource(const ReplyReader& source, std::ostream& output) {
+  output << "  " << source.text("origin") << ": ";
+  // What older services do not say.
+  if (source.contains("state")) output << source.text("state") << ", ";
   if (source.contains("rows_read")) {
-    output << text(source, "rows_read") << " rows read, " << text(source, "rows_skipped") << " skipped, ";
+    output << countText(source.count("rows_read")) << " rows read, " << countText(source.count("rows_skipped"))
+           << " skipped, ";
   }
-  output << text(source, "records") << " records, " << rate(source) << ", " << text(source, "withheld")
-         << " withheld, can fill " << text(source, "metrics") << " metrics";
-  const Value* age = source.find("last_record_age_ms");
-  if (age != nullptr && age->int64().value_or(-1) >= 0) {
-    output << ", last record " << duration(*age->int64()) << " old";
+  output << countText(source.count("records")) << " records, " << rateText(source.rate("records_per_second")) << ", "
+         << countText(source.count("withheld")) << " withheld, can fill " << countText(source.count("metrics"))
+         << " metrics";
+  if (const auto age = source.duration("last_record_age_ms")) {
+    output << ", last record " << durationText(age) << " old";
   }
-  if (source.contains("failure")) output << "; " << text(source, "failure");
+  if (source.contains("failure")) output << "; " << source.text("failure");
   output << '\n';
 }
 
-void showClient(const Dictionary& client, std::ostream& output) {
-  output << "  " << text(client, "number") << " '" << text(client, "name") << "' (process " << text(client, "process")
-         << ", user " << text(client, "user") << "): " << (truth(client, "listening") ? "listens" : "does not listen")
-         << ", " << (truth(client, "observes") ? "observes, " : "")
-         << (truth(client, "configured") ? "own configuration" : "no configuration") << ", " << text(client, "records")
-         << " records, " << rate(client) << ", " << text(client, "queued") << " queued, " << text(client, "lost")
-         << " lost\n";
+void showClient(const ReplyReader& client, std::ostream& output) {
+  output << "  " << countText(client.count("number")) << " '" << client.text("name") << "' (process "
+         << client.text("process") << ", user " << client.text("user")
+         << "): " << (client.truth("listening") ? "listens" : "does not listen") << ", "
+         << (client.truth("observes") ? "observes, " : "")
+         << (client.truth("configured") ? "own configuration" : "no configuration") << ", "
+         << countText(client.count("records")) << " records, " << rateText(client.rate("records_per_second")) << ", "
+         << countText(client.count("queued")) << " queued, " << countText(client.count("lost")) << " lost\n";
+}
+
+void showLeftOut(const ReplyReader& report, std::string_view key, std::ostream& output) {
+  if (const std::size_t count = report.entriesLeftOut(key); count > 0) output << "  and " << count << " more\n";
 }
 
 ExitStatus showStatus(bool json, Tool& tool) {
@@ -92,25 +59,26 @@ ExitStatus showStatus(bool json, Tool& tool) {
     tool.output << line << '\n';
     return ExitStatus::Success;
   }
-  const Value* uptime = report.find("uptime_ms");
-  tool.output << text(report, "service") << ", up for " << duration(uptime != nullptr ? uptime->int64().value_or(0) : 0)
-              << '\n';
-  tool.output << "configured: "
-              << (report.contains("configured_metrics") ? text(report, "configured_metrics") + " metrics"
-                                                        : std::string("nothing"))
-              << (truth(report, "base_configuration") ? ", with a base configuration" : "") << '\n';
-  tool.output << "sources:\n";
-  for (const Value& source : list(report, "sources")) {
-    if (source.dictionary() != nullptr) showSource(*source.dictionary(), tool.output);
-  }
-  tool.output << "clients:\n";
-  for (const Value& entry : list(report, "clients")) {
-    if (entry.dictionary() != nullptr) showClient(*entry.dictionary(), tool.output);
-  }
+  showReport(report, tool.output);
   return ExitStatus::Success;
 }
 
 }  // namespace
+
+void showReport(const Dictionary& reply, std::ostream& output) {
+  const ReplyReader report(reply);
+  output << report.text("service") << ", up for " << durationText(report.duration("uptime_ms")) << '\n';
+  output << "configured: "
+         << (report.contains("configured_metrics") ? countText(report.count("configured_metrics")) + " metrics"
+                                                   : std::string("nothing"))
+         << (report.truth("base_configuration") ? ", with a base configuration" : "") << '\n';
+  output << "sources:\n";
+  for (const ReplyReader& source : report.entries("sources")) showSource(source, output);
+  showLeftOut(report, "sources", output);
+  output << "clients:\n";
+  for (const ReplyReader& client : report.entries("clients")) showClient(client, output);
+  showLeftOut(report, "clients", output);
+}
 
 void addStatusCommand(CLI::App& program, Tool& tool) {
   CLI::App* command = program.add_subcommand("status", "Show the service's sources and clients, rates and losses");

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/store_session.h"
 
+#include <algorithm>
 #include <utility>
 
 #include "platform/fatal_error.h"
@@ -129,6 +130,8 @@ std::string StoreSession::answer(std::string_view line) {
 }
 
 std::string StoreSession::perform(std::string_view line) {
+  // Blanks before the command are nothing.
+  line.remove_prefix(std::min(line.find_first_not_of(" \t\r"), line.size()));
   // A page's key is taken as it stands, blanks and all.
   constexpr std::string_view pageCommand = "page ";
   if (line.starts_with(pageCommand)) {

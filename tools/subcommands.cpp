@@ -3,6 +3,8 @@
 
 #include "tools/config_command.h"
 #include "tools/decode_command.h"
+#include "tools/metrics_command.h"
+#include "tools/names.h"
 #include "tools/pages_command.h"
 #include "tools/query_command.h"
 #include "tools/status_command.h"
@@ -15,8 +17,8 @@ namespace {
 
 // One line for each file; nothing else knows which subcommands there are.
 constexpr AddSubcommand subcommands[] = {
-    addStatusCommand, addWatchCommand,  addPagesCommand, addQueryCommand,
-    addConfigCommand, addDecodeCommand, addStoreCommand,
+    addStatusCommand, addWatchCommand,  addPagesCommand, addQueryCommand, addMetricsCommand,
+    addConfigCommand, addDecodeCommand, addStoreCommand, addNamesCommand,
 };
 
 }  // namespace

@@ -4,6 +4,8 @@
 #include <algorithm>
 #include <string_view>
 
+#include "values/plain_text.h"
+
 namespace probeview {
 
 namespace {
@@ -12,13 +14,6 @@ namespace {
 std::size_t characterCount(std::string_view text) {
   return static_cast<std::size_t>(
       std::count_if(text.begin(), text.end(), [](char byte) { return (byte & 0xc0) != 0x80; }));
-}
-
-void appendIndented(std::string_view text, std::size_t indent, std::string& out) {
-  for (const char character : text) {
-    out += character;
-    if (character == '\n') out.append(indent, ' ');
-  }
 }
 
 }  // namespace
@@ -53,19 +48,19 @@ std::string plainText(const PageSnapshot& snapshot) {
   std::size_t labelWidth = 0;
   for (const auto& section : snapshot.sections) {
     for (const auto& row : section.rows) {
-      if (row.text && row.detail) labelWidth = std::max(labelWidth, characterCount(*row.text));
+      if (row.text && row.detail) labelWidth = std::max(labelWidth, characterCount(onOneLine(*row.text)));
     }
   }
   std::string out;
   for (const auto& section : snapshot.sections) {
-    if (section.title) out += *section.title + "\n";
+    if (section.title) out += onOneLine(*section.title) + "\n";
     for (const auto& row : section.rows) {
-      std::string line = "  ";
-      appendIndented(row.text.value_or(""), 2, line);
+      const std::string label = onOneLine(row.text.value_or(""));
+      std::string line = "  " + label;
       if (row.detail) {
-        const std::size_t written = characterCount(row.text.value_or(""));
+        const std::size_t written = characterCount(label);
         line.append((written < labelWidth ? labelWidth - written : 0) + 2, ' ');
-        appendIndented(*row.detail, 2 + labelWidth + 2, line);
+        appendOnOneLine(*row.detail, line);
       }
       line.erase(line.find_last_not_of(' ') + 1);
       out += line + "\n";

@@ -36,7 +36,8 @@ std::string accessibleLabel(const ListCell& cell);
 // The page as plain text, one line per row:
 //   EUTRA Neighbor 0
 //     earfcn  1300
-// Labels are padded to one column per page. A text of several lines is indented under itself; a blank row stays blank.
+// Labels are padded to one column per page; a blank row stays blank. What would end a line or steer a terminal stands
+// as its escape.
 std::string plainText(const PageSnapshot& snapshot);
 
 }  // namespace probeview

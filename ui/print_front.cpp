@@ -9,6 +9,7 @@
 
 #include "platform/console_log.h"
 #include "ui/page_snapshot.h"
+#include "values/plain_text.h"
 
 namespace probeview {
 
@@ -35,7 +36,7 @@ bool PrintFront::hasFailed() const {
   if (reason.empty()) return false;
   // It is the last word also where the logs go to the same place.
   drainLogs(logsEndTime);
-  *errors_ << reason << "\n";
+  *errors_ << onOneLine(reason) << "\n";
   return true;
 }
 

@@ -6,7 +6,6 @@
 #include <vector>
 
 #include "values/plain_text.h"
-#include "values/printer.h"
 
 namespace probeview {
 
@@ -26,9 +25,7 @@ constexpr std::size_t longestReason = 240;
 
 // What another program says, as it may stand in the line.
 std::string shown(std::string_view text, std::size_t longest) {
-  std::string valid;
-  appendValidUtf8(beginningOf(text, longest), valid);
-  const std::string line = onOneLine(valid);
+  const std::string line = onOneLine(beginningOf(text, longest));
   // What stands in place of a character may be longer than it.
   const auto beginning = beginningOf(line, longest);
   const bool isWhole = text.size() <= longest && beginning.size() == line.size();

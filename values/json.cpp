@@ -3,9 +3,20 @@
 
 #include <cmath>
 
+#include "values/plain_text.h"
 #include "values/printer.h"
 
 namespace probeview {
+
+namespace {
+
+void appendEscape(char32_t code, std::string& out) {
+  const char bytes[] = {static_cast<char>(code >> 8), static_cast<char>(code & 0xFF)};
+  out += "\\u";
+  appendHex({bytes, sizeof bytes}, out);
+}
+
+}  // namespace
 
 void appendJsonString(std::string_view text, std::string& out) {
   std::string valid;
@@ -14,8 +25,9 @@ void appendJsonString(std::string_view text, std::string& out) {
     text = valid;
   }
   out += '"';
-  for (const char character : text) {
-    const auto code = static_cast<unsigned char>(character);
+  for (std::size_t index = 0; index < text.size(); ++index) {
+    const char character = text[index];
+    const auto byte = static_cast<unsigned char>(character);
     switch (character) {
       case '"':
         out += "\\\"";
@@ -33,9 +45,15 @@ void appendJsonString(std::string_view text, std::string& out) {
         out += "\\t";
         break;
       default:
-        if (code < 32 || code == 127) {
-          out += "\\u00";
-          appendHex({&character, 1}, out);
+        // The first bytes of the characters that steer; the value is the same with the escape.
+        if (byte < 32 || byte == 127 || byte == 0xC2 || byte == 0xE2) {
+          const auto [code, size] = firstCharacter(text.substr(index));
+          if (isSteering(code)) {
+            appendEscape(code, out);
+          } else {
+            out += text.substr(index, size);
+          }
+          index += size - 1;
         } else {
           out += character;
         }

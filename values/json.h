@@ -16,7 +16,8 @@ namespace probeview {
 void appendJson(const Value& value, std::string& out);
 void appendJson(const List& list, std::string& out);
 void appendJson(const Dictionary& dictionary, std::string& out);
-// A JSON string; bytes that are not UTF-8 become U+FFFD.
+// A JSON string; bytes that are not UTF-8 become U+FFFD. What would steer a terminal (isSteering()) stands as its
+// escape.
 void appendJsonString(std::string_view text, std::string& out);
 
 }  // namespace probeview

@@ -1,6 +1,10 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "values/plain_text.h"
 
+#include <algorithm>
+
+#include "values/printer.h"
+
 namespace probeview {
 
 std::optional<std::int64_t> parseInteger64(std::string_view text) {
@@ -26,18 +30,47 @@ std::string_view beginningOf(std::string_view text, std::size_t longest) {
   return text.substr(0, continues(text[size]) ? longest : size);
 }
 
+Utf8Character firstCharacter(std::string_view text) {
+  const auto lead = static_cast<unsigned char>(text[0]);
+  if (lead < 0x80) return {lead, 1};
+  const std::size_t following = lead >= 0xF0 ? 3 : lead >= 0xE0 ? 2 : 1;
+  char32_t code = lead & (0x3Fu >> following);
+  for (std::size_t index = 1; index <= following; ++index) {
+    code = code << 6 | (static_cast<unsigned char>(text[index]) & 0x3Fu);
+  }
+  return {code, following + 1};
+}
+
+void appendOnOneLine(std::string_view text, std::string& out) {
+  // Most texts are plain.
+  const auto isPlain = [](char character) { return character >= 0x20 && character < 0x7F; };
+  if (std::ranges::all_of(text, isPlain)) {
+    out += text;
+    return;
+  }
+  std::string valid;
+  appendValidUtf8(text, valid);
+  for (std::string_view rest = valid; !rest.empty();) {
+    const auto [code, size] = firstCharacter(rest);
+    if (!isSteering(code)) {
+      out += rest.substr(0, size);
+    } else if (code < 0x80) {
+      // Without the quotation marks.
+      const std::string quoted = printed(Value::text(rest.substr(0, size)));
+      out.append(quoted, 1, quoted.size() - 2);
+    } else {
+      char digits[8];
+      out += "\\u{";
+      out.append(digits, std::to_chars(digits, digits + sizeof digits, static_cast<std::uint32_t>(code), 16).ptr);
+      out += '}';
+    }
+    rest.remove_prefix(size);
+  }
+}
+
 std::string onOneLine(std::string_view text) {
   std::string line;
-  line.reserve(text.size());
-  for (std::size_t index = 0; index < text.size(); ++index) {
-    const auto next = index + 1 < text.size() ? static_cast<unsigned char>(text[index + 1]) : 0;
-    if (text[index] == '\xC2' && next >= 0x80 && next < 0xA0) {
-      line += '?';
-      ++index;
-    } else {
-      line += isControlCharacter(text[index]) ? '?' : text[index];
-    }
-  }
+  appendOnOneLine(text, line);
   return line;
 }
 

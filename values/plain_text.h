@@ -29,17 +29,28 @@ std::optional<std::int64_t> parseInteger64(std::string_view text);
 // "0x7F0013"; a negative number as its two's complement. parseInteger64() reads it back.
 std::string hexText(std::int64_t number);
 
-// Whether the character would end a line or steer a terminal: 0 to 31 and 127.
-constexpr bool isControlCharacter(char character) {
-  const auto code = static_cast<unsigned char>(character);
-  return code < 32 || code == 127;
-}
-
 // The first bytes of a text, at most so many; of UTF-8 no character is cut in two.
 std::string_view beginningOf(std::string_view text, std::size_t longest);
 
-// A text that came from elsewhere, as it may stand in a line for people: "?" in place of each control character, those
-// of U+0080 to U+009F included.
+// A text that came from elsewhere (a peer, a file, a phone) as it may stand in a line for people: whatever goes to a
+// terminal or a log goes through here. What would end the line, steer a terminal or turn the direction of writing
+// stands as its escape, as in printed values ("\n", "\u{1b}", "\u{9b}"); an ill-formed sequence is U+FFFD; all else
+// stays as it is. To do it twice changes nothing more.
 std::string onOneLine(std::string_view text);
+void appendOnOneLine(std::string_view text, std::string& out);
+
+// The character at the beginning of well-formed UTF-8, which is not empty, and the bytes that it takes.
+struct Utf8Character {
+  char32_t code;
+  std::size_t size;
+};
+Utf8Character firstCharacter(std::string_view text);
+
+// Whether a character would end a line, steer a terminal or turn the direction of writing: U+0000 to U+001F, U+007F to
+// U+009F, U+2028 to U+202E, U+2066 to U+2069.
+constexpr bool isSteering(char32_t code) {
+  return code < 0x20 || (code >= 0x7F && code < 0xA0) || (code >= 0x2028 && code <= 0x202E) ||
+         (code >= 0x2066 && code <= 0x2069);
+}
 
 }  // namespace probeview

@@ -16,6 +16,7 @@
 #include "platform/serial_queue.h"
 #include "radix/manager.h"
 #include "radix/object.h"
+#include "tests/support/harmless.h"
 #include "values/printer.h"
 
 namespace probeview {
@@ -120,6 +121,16 @@ TEST_F(RadixWrapperTest, AFileThatIsMissingOrUnreadableIsFalseWithNothingSentAnd
   EXPECT_FALSE(wrapper_.addTelemConfigForAppId("probeview", testing::TempDir()));
   EXPECT_EQ(manager_->calls, Lines{});
   EXPECT_EQ(systemLog_.lines, Lines{});
+}
+
+TEST_F(RadixWrapperTest, WhatTheServiceSaysStaysOnItsLineOfTheLog) {
+  manager_->answer = {3, "line 1\n\x1b[2Jgone\xff"};
+  EXPECT_FALSE(wrapper_.removeTelemConfigForAppid("probeview"));
+  EXPECT_EQ(systemLog_.lines,
+            Lines{"-[RadixWrapper removeTelemConfigForAppid:]: error=3 msg=line 1\\n\\u{1b}[2Jgone\ufffd"});
+  manager_->answer = {3, hostileText()};
+  wrapper_.removeTelemConfigForAppid("probeview");
+  EXPECT_TRUE(isHarmless(systemLog_.lines.back()));
 }
 
 TEST_F(RadixWrapperTest, AQuerySendsItsArgumentsWidenedWithTheirSignInTheirOrder) {

@@ -12,6 +12,7 @@
 #include "platform/console_log.h"
 #include "platform/fatal_error.h"
 #include "platform/system_log.h"
+#include "tests/support/harmless.h"
 
 namespace probeview {
 namespace {
@@ -55,6 +56,22 @@ TEST(ConsoleLog, ALineOnItsOwnIsWrittenAtOnce) {
   log.line("");
   log.flush();
   EXPECT_EQ(watch.writes(), (Writes{"\n"}));
+}
+
+TEST(ConsoleLog, ALineStaysALineAndSteersNoTerminal) {
+  const WriteWatch watch;
+  ConsoleLog log(watch.writingEnd());
+  log.line(
+      "apn \xc2\x9b"
+      "31m\x1b[2J\nb");
+  log.flush();
+  EXPECT_EQ(watch.writes(), (Writes{"apn \\u{9b}31m\\u{1b}[2J\\nb\n"}));
+  log.line(hostileText());
+  log.flush();
+  const Writes writes = watch.writes();
+  ASSERT_EQ(writes.size(), 1u);
+  EXPECT_TRUE(areHarmless(writes[0]));
+  EXPECT_EQ(writes[0].find('\n'), writes[0].size() - 1);
 }
 
 TEST(ConsoleLog, TheLinesOfAGroupLeaveInOneWrite) {
@@ -195,10 +212,15 @@ TEST(SystemLog, EachLineIsEchoedToStandardErrorInOneWrite) {
   const WriteWatch watch;
   const int before = ::dup(STDERR_FILENO);
   ASSERT_GE(::dup2(watch.writingEnd(), STDERR_FILENO), 0);
-  { SystemLog("probeview").line("-[RadixWrapper listen]: listening for %s events"); }
+  {
+    SystemLog log("probeview");
+    log.line("-[RadixWrapper listen]: listening for %s events");
+    log.line("dict=[\"apn\": \"\u009b31m\"]\n\x1b[2J");
+  }
   ::dup2(before, STDERR_FILENO);
   ::close(before);
-  EXPECT_EQ(watch.writes(), (Writes{"-[RadixWrapper listen]: listening for %s events\n"}));
+  EXPECT_EQ(watch.writes(), (Writes{"-[RadixWrapper listen]: listening for %s events\n",
+                                    "dict=[\"apn\": \"\\u{9b}31m\"]\\n\\u{1b}[2J\n"}));
 }
 
 TEST(SystemLog, SurvivesAClosedStandardError) {

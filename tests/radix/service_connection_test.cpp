@@ -351,7 +351,7 @@ TEST_F(ServiceConnectionTest, AConfigurationThatIsRefusedOnlyWhenRestoredIsNotTr
   current().answer(0, 3, "no\nsuch metric");
   loop_.run();
   EXPECT_THAT(log.lines, ElementsAre("the baseband service refuses the configuration that is pushed again: error=3 "
-                                     "msg=no?such metric"));
+                                     "msg=no\\nsuch metric"));
   current().hangUp();
   loop_.advance(milliseconds(100));
   ASSERT_THAT(services_, SizeIs(2));

@@ -1,14 +1,23 @@
 #!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
 """The scripts run, test, fuzz/run and packaging/packages.sh, in a copy of the tree that holds little else."""
+import fcntl
 import os
 import pathlib
+import pty
 import re
 import shutil
+import signal
 import subprocess
 import tempfile
+import time
 import unittest
 
+# A service that listens and then waits to be ended; $1 and $2 are its option and its socket.
+LISTEN = ("exec python3 -c 'import os, socket, sys, time\n"
+          "open(sys.argv[3], \"w\").write(str(os.getpid()))\n"
+          "s = socket.socket(socket.AF_UNIX, socket.SOCK_SEQPACKET); s.bind(sys.argv[2]); time.sleep(60)' "
+          '"$1" "$2" "{calls}.pid"')
 ROOT = pathlib.Path(__file__).resolve().parents[2]
 NEEDED = ["run", "test", "packaging/packages.sh", "fuzz/run", "fuzz/targets.cmake"]
 
@@ -47,11 +56,40 @@ class Scripts(unittest.TestCase):
     def called(self, program: str) -> list[str]:
         return [line for line in self.calls.read_text().splitlines() if line.split(" ")[0] == program]
 
-    def run_script(self, *command: str, **environment: str) -> subprocess.CompletedProcess:
+    def surroundings(self) -> dict[str, str]:
         clean = {name: value for name, value in os.environ.items() if name not in ("DISPLAY", "WAYLAND_DISPLAY")}
-        clean |= {"PATH": f"{self.stubs}:{os.environ['PATH']}", "LC_ALL": "C", "TMPDIR": str(self.calls.parent)} | environment
-        return subprocess.run(command, cwd=self.top, env=clean, stdin=subprocess.DEVNULL, capture_output=True, text=True,
-                              timeout=50)
+        return clean | {"PATH": f"{self.stubs}:{os.environ['PATH']}", "LC_ALL": "C", "TMPDIR": str(self.calls.parent)}
+
+    def run_script(self, *command: str, where: pathlib.Path | None = None,
+                   **environment: str) -> subprocess.CompletedProcess:
+        return subprocess.run(command, cwd=where or self.top, env=self.surroundings() | environment,
+                              stdin=subprocess.DEVNULL, capture_output=True, text=True, timeout=50)
+
+    def begin(self, *command: str, **options) -> subprocess.Popen:
+        """Starts a script and leaves it running, at most as long as the test does."""
+        process = subprocess.Popen(command, cwd=self.top, env=self.surroundings() | options.pop("environment", {}),
+                                   stdin=subprocess.DEVNULL, text=True, **options)
+        self.addCleanup(process.wait)
+        self.addCleanup(process.kill)
+        for stream in (process.stdout, process.stderr):
+            if stream is not None:
+                self.addCleanup(stream.close)
+        return process
+
+    def wait_until(self, condition):
+        deadline = time.monotonic() + 30
+        while not condition():
+            self.assertLess(time.monotonic(), deadline, "it never came to that")
+            time.sleep(0.02)
+
+    def listening_service(self) -> str:
+        return LISTEN.replace("{calls}", str(self.calls))
+
+    def require_nothing_left(self, *processes: pathlib.Path):
+        self.assertEqual(list(self.calls.parent.glob("probeview.*")), [], "the private folder is still there")
+        for noted in processes:
+            process = int(noted.read_text())
+            self.assertFalse(pathlib.Path(f"/proc/{process}").exists(), f"{noted} is still there")
 
     def with_packages(self, commands: str) -> subprocess.CompletedProcess:
         (self.top / "build").mkdir(exist_ok=True)
@@ -155,11 +193,7 @@ class Scripts(unittest.TestCase):
         self.stub("probeview-pictures", "exit 0", built)
 
     def testRunEndsWithTheViewersStatusAndLeavesNothingBehind(self):
-        # A service that listens and then waits to be ended.
-        listen = ("exec python3 -c 'import os, socket, sys, time\n"
-                  "open(sys.argv[3], \"w\").write(str(os.getpid()))\n"
-                  "s = socket.socket(socket.AF_UNIX, socket.SOCK_SEQPACKET); s.bind(sys.argv[2]); time.sleep(60)' "
-                  f'"$1" "$2" "{self.calls}.pid"')
+        listen = self.listening_service()
         for status in (0, 3):
             self.pretend_built(listen, f'[ -S "$RADIXD_SOCKET" ] || exit 9\nexit {status}')
             ended = self.run_script("./run", "--source", "scenario:city,seed=2", "--source=trace:a b.csv", "--terminal")
@@ -174,16 +208,110 @@ class Scripts(unittest.TestCase):
         printed = self.run_script("./run")
         self.assertEqual(printed.returncode, 0, printed.stderr)
         self.assertIn("pages\n", printed.stdout)
-        self.assertEqual(self.called("probeview")[-1], "probeview --print")
+        self.assertEqual(self.called("probeview")[-1], "probeview --print --log -")
         self.assertEqual(len(self.called("probeview-pictures")), 1)
         self.assertTrue(re.search(r"^-- build: \d+ s$", printed.stdout, re.M), printed.stdout)
+
+    def testRunIntoAReaderThatGoesAwayEndsCleanAfterAnyNumberOfLines(self):
+        self.pretend_built(self.listening_service(),
+                           "for line in {1..300}; do echo \"line $line\" 2>/dev/null || exit 0; done")
+        for lines in (1, 2, 3, 4, 5, 100, 1000):
+            # A reader that has gone is told of by a signal, or, where that is ignored, by an error.
+            for ignored in ("", "trap '' PIPE; "):
+                with self.subTest(lines=lines, ignored=ignored):
+                    ended = self.run_script("bash", "-c", f"{ignored}./run | head -n {lines} | wc -l; "
+                                                          'echo "status ${PIPESTATUS[0]}"')
+                    # The stages, the lines of the viewer, the picture.
+                    self.assertEqual(ended.stdout.split(), [str(min(lines, 305)), "status", "0"], ended.stderr)
+                    self.assertEqual(ended.stderr, "")
+                    self.require_nothing_left()
+
+    def testASignalEndsRunWithItsViewerAndItsService(self):
+        viewer = pathlib.Path(f"{self.calls}.viewer")
+        self.pretend_built(self.listening_service(), f'echo $$ >"{viewer}.new"; mv "{viewer}.new" "{viewer}"\nexec sleep 60')
+        for sent, status in ((signal.SIGTERM, 143), (signal.SIGHUP, 129)):
+            for front in (["--terminal"], []):
+                with self.subTest(signal=sent, front=front):
+                    viewer.unlink(missing_ok=True)
+                    run = self.begin("./run", *front, stdout=subprocess.DEVNULL, stderr=subprocess.DEVNULL)
+                    self.wait_until(viewer.exists)
+                    run.send_signal(sent)
+                    self.assertEqual(run.wait(timeout=20), status)
+                    self.require_nothing_left(viewer, pathlib.Path(f"{self.calls}.pid"))
+
+    def testATraceIsNamedFromWhereTheCallerStands(self):
+        self.pretend_built(f'pwd >"{self.calls}.where"\n' + self.listening_service(), "exit 0")
+        elsewhere = self.calls.parent / "else where"
+        elsewhere.mkdir()
+        ended = self.run_script(str(self.top / "run"), "--source", "trace:drive.csv,speed=2", where=elsewhere)
+        self.assertEqual(ended.returncode, 0, ended.stderr)
+        self.assertTrue(self.called("radixd")[-1].endswith(" --source trace:drive.csv,speed=2"))
+        self.assertEqual(pathlib.Path(f"{self.calls}.where").read_text(), f"{elsewhere}\n")
+        self.assertIn("pictures of the window", ended.stdout)
+
+    def testRunPassesWarningsOfTheServiceOnEachOnceAndAtMostTwenty(self):
+        told = ('echo "radixd: info: listening" >&2\n'
+                "for row in {1..30}; do for again in 1 2; do\n"
+                '  echo "radixd: warning: trace:x.csv: line $row: no number" >&2; done; done\n')
+        for count, front in ((30, []), (30, ["--terminal"]), (3, []), (3, ["--terminal"])):
+            with self.subTest(count=count, front=front):
+                self.pretend_built(told.replace("30", str(count)) + self.listening_service(), "exit 0")
+                ended = self.run_script("./run", *front)
+                self.assertEqual(ended.returncode, 0, ended.stderr)
+                expected = [f"radixd: warning: trace:x.csv: line {row}: no number" for row in range(1, count + 1)]
+                if count > 20:
+                    expected[19:] = ["run: further warnings of the service are not shown"]
+                self.assertEqual(ended.stderr.splitlines(), expected)
+                self.require_nothing_left()
+
+    def testProgressIsShownOnATerminalAlone(self):
+        self.stub("cmake", 'case "$1" in --preset) echo "-- configuring" ;; *) echo "[1/2] Building one"; '
+                           'echo "[2/2] Linking all, whose name is far too long for the line of a small terminal" ;; esac')
+        command = ["bash", "-euo", "pipefail", "-c", "top=$PWD; . packaging/packages.sh; configure_and_build release"]
+        (self.top / "build").mkdir()
+        quiet = self.run_script(*command)
+        self.assertEqual((quiet.returncode, quiet.stdout, quiet.stderr), (0, "", ""))
+        ours, theirs = pty.openpty()
+        with open(ours, "rb") as shown:
+            run = self.begin(*command, stderr=theirs, stdout=subprocess.DEVNULL)
+            os.close(theirs)
+            self.assertEqual(run.wait(timeout=30), 0)
+            # All of it waits in the terminal; its other end is closed.
+            text = os.read(shown.fileno(), 65536).decode()
+        self.assertIn("\r\x1b[K-- configuring\r", text)
+        self.assertIn("\r\x1b[K[1/2] Building one\r\x1b[K[2/2] Linking", text)
+        self.assertTrue(text.endswith("\r\x1b[K"), repr(text))
+        self.assertNotIn("\n", text)
+        self.assertLessEqual(max(map(len, re.split(r"\r\x1b\[K", text))), 79)
+        self.assertIn("[1/2] Building one\n", (self.top / "build/release.log").read_text())
+
+    def testWhatIsWaitedForIsSaid(self):
+        (self.top / "build").mkdir()
+        self.stub("cmake")
+        with open(self.top / "build/release.lock", "w") as lock:
+            fcntl.flock(lock, fcntl.LOCK_EX)
+            build = self.begin("bash", "-euo", "pipefail", "-c",
+                               "top=$PWD; . packaging/packages.sh; configure_and_build release", stderr=subprocess.PIPE)
+            self.assertEqual(build.stderr.readline(), "waiting for another build of build/release to end\n")
+            self.assertEqual(self.called("cmake"), [])
+        self.assertEqual(build.wait(timeout=30), 0)
+        self.assertEqual(len(self.called("cmake")), 2)
+        self.pretend_installed()
+        self.stub("id", "echo 0")
+        self.stub("apt-get")
+        held = self.calls.parent / "lock-frontend"
+        install = ("bash", "-euo", "pipefail", "-c", "top=$PWD; . packaging/packages.sh; install_packages three")
+        with open(held, "w") as lock:
+            fcntl.lockf(lock, fcntl.LOCK_EX)
+            waiting = self.run_script(*install, dpkg_lock=str(held))
+        self.assertIn(f"waiting for process {os.getpid()}, which is installing packages", waiting.stderr)
+        self.assertEqual(self.run_script(*install, dpkg_lock=str(held)).stderr, "")
 
     def testRunSaysThatTheServiceDidNotStart(self):
         self.pretend_built('echo "radixd: error: the source cannot be had" >&2; exit 1', "exit 0")
         failed = self.run_script("./run", "--terminal")
         self.assertEqual(failed.returncode, 1)
-        self.assertIn("radixd: error: the source cannot be had", failed.stderr)
-        self.assertIn("run: the service did not start", failed.stderr)
+        self.assertEqual(failed.stderr, "radixd: error: the source cannot be had\nrun: the service did not start\n")
         self.assertEqual(self.called("probeview"), [])
 
 

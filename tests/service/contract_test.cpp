@@ -621,7 +621,9 @@ TEST_P(Contract, AQueryThatNoSourceCanFillIsRefusedWithTheMetricsName) {
   const Result result = query(client, 0, K_LTE_TX_POWER);
   EXPECT_EQ(result.status, static_cast<int>(Status::CannotFill));
   EXPECT_EQ(result.message, "no source can fill K_LTE_TX_POWER (0x3CD302)");
-  EXPECT_EQ(query(client, 0, 77).message, "no source can fill 0x4D");
+  EXPECT_EQ(query(client, 0, 77).message,
+            "0x4D is no metric, and no configuration says which metrics a trigger of that number stands for: push one "
+            "with it under [triggers]");
   EXPECT_EQ(query(client, 0, 0).status, static_cast<int>(Status::BadArguments));
   const Result unknown = query(client, 5, 0);
   EXPECT_EQ(unknown.status, static_cast<int>(Status::CannotFill));
@@ -644,7 +646,11 @@ TEST_P(Contract, AnIdentifierThatIsNoMetricsIsTakenForThatOfATrigger) {
       return true;
     };
   });
-  EXPECT_EQ(query(client, 0, 0x7F0013).message, "no source can fill 0x7F0013");
+  const Result untold = query(client, 0, 0x7F0013);
+  EXPECT_EQ(untold.status, static_cast<int>(Status::CannotFill));
+  EXPECT_EQ(untold.message,
+            "0x7F0013 is no metric, and no configuration says which metrics a trigger of that number stands for: push "
+            "one with it under [triggers]");
   ASSERT_EQ(push(client, "[triggers]\n0x7F0013 = [\"K_SIM_FILE_INFO\"]\n").status, 0);
   EXPECT_EQ(query(client, 0, 0x7F0013).status, 0);
   world_->onService([&] { EXPECT_EQ(asked, std::vector<std::int64_t>{K_SIM_FILE_INFO}); });

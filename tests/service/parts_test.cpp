@@ -104,7 +104,7 @@ TEST(ServiceLog, WritesWhatIsImportantEnoughAndALineStaysALine) {
   log.write(LogLevel::Warning, "b\nradixd: error: forged\x1b[31m");
   log.write(LogLevel::Info, "c");
   EXPECT_EQ(lines.lines,
-            (std::vector<std::string>{"radixd: error: a", "radixd: warning: b?radixd: error: forged?[31m"}));
+            (std::vector<std::string>{"radixd: error: a", "radixd: warning: b\\nradixd: error: forged\\u{1b}[31m"}));
 }
 
 TEST(BoundedLines, AThousandLinesAMinuteAreHandedOnAndOfMoreOnlyTheNumber) {

@@ -7,6 +7,8 @@
 #include <limits>
 #include <sstream>
 
+#include "tools/store_session.h"
+
 namespace probeview {
 namespace {
 
@@ -47,6 +49,15 @@ TEST(BatchWords, AreSplitAtBlanksAndNoMoreThanAreOfUse) {
   EXPECT_THAT(splitWords(" a\tbc  d\r"), ElementsAre("a", "bc", "d"));
   EXPECT_THAT(splitWords(""), ElementsAre());
   EXPECT_EQ(splitWords(std::string(1000, ' ') + "a b c d e f g h i j k").size(), mostWords);
+}
+
+TEST(StoreCommands, BlanksBeforeTheCommandDoNoHarmAndThoseAfterPageAreTheKeys) {
+  StoreSession session;
+  const std::string plain = session.answer("page LTE NAS");
+  EXPECT_TRUE(plain.starts_with("{\"page\":\"LTE NAS\"")) << plain;
+  EXPECT_EQ(session.answer("  \t page LTE NAS"), plain);
+  EXPECT_TRUE(session.answer(" page  LTE NAS ").starts_with("{\"page\":\" LTE NAS \""));
+  EXPECT_EQ(session.answer("\t reset"), "{}");
 }
 
 TEST(BatchHex, EitherCaseAndADashForNothing) {

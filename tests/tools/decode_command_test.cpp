@@ -57,6 +57,28 @@ TEST(DecodeCommand, ATextThatWouldSteerATerminalIsShownEscaped) {
   EXPECT_EQ(probectl({"decode", "BearerContext", "1a03612262"}).output, "apn: a\"b\n");
 }
 
+TEST(DecodeCommand, TakesHexadecimalAsItIsPasted) {
+  using Words = std::vector<std::string>;
+  for (const Words& pasted : {Words{"10 03 18 01"},
+                              {"10", "03", "18", "01"},
+                              {"0x10 0x03\n0X18 0x01\n"},
+                              {"0x10031801"},
+                              {"100", "31801"},
+                              {" 1003\r\n\t1801 "},
+                              {"1003", "0x18", "01"}}) {
+    Words arguments{"decode", "K_LTE_RRC_STATE"};
+    arguments.insert(arguments.end(), pasted.begin(), pasted.end());
+    const Outcome outcome = probectl(arguments);
+    EXPECT_EQ(outcome.status, 0) << outcome.errors;
+    EXPECT_EQ(outcome.output, "state: KLTE_RRC_STATE_CONNECTED\nprev_state: KLTE_RRC_STATE_IDLE\n");
+  }
+  for (const Words& odd : {Words{"0x1", "0x3"}, {"0x"}, {"10 0"}, {"10", "-"}, {"-", "-"}, {" "}, {"1,0"}}) {
+    Words arguments{"decode", "K_LTE_RRC_STATE"};
+    arguments.insert(arguments.end(), odd.begin(), odd.end());
+    EXPECT_EQ(probectl(arguments).status, 2) << odd[0];
+  }
+}
+
 TEST(DecodeCommand, WhatIsNotUnderstoodEndsWithStatusTwo) {
   EXPECT_EQ(probectl({"decode"}).status, 2);
   EXPECT_EQ(probectl({"decode", "K_LTE_RRC_STATE"}).status, 2);

@@ -5,9 +5,12 @@
 #include <gtest/gtest.h>
 #include <CLI/CLI.hpp>
 
+#include <algorithm>
+#include <filesystem>
 #include <memory>
 #include <regex>
 #include <set>
+#include <vector>
 
 #include "messages/metric_identifiers.h"
 #include "tests/support/golden.h"
@@ -85,15 +88,24 @@ TEST(Manual, ProbectlsPageAndCompletionKnowEverySubcommandAndOption) {
   }
 }
 
-TEST(Manual, TheOtherProgramsPagesKnowEveryOption) {
-  const struct {
-    const char* program;
-    const char* page;
-  } cases[] = {{RADIXD, "radixd.8"}, {PROBEVIEW, "probeview.1"}};
-  for (const auto& each : cases) {
-    const std::set<std::string> options = optionsOf(outputOf(std::string(each.program) + " --help"));
+TEST(Manual, TheOtherProgramsPagesAndCompletionsKnowEveryOption) {
+  struct Program {
+    std::string path;
+    std::string name;
+    std::string page;
+  };
+  std::vector<Program> programs{{RADIXD, "radixd", "radixd.8"}, {PROBEVIEW, "probeview", "probeview.1"}};
+#ifdef PICTURES
+  programs.push_back({PICTURES, "probeview-pictures", "probeview-pictures.1"});
+#endif
+  for (const Program& each : programs) {
+    const std::set<std::string> options = optionsOf(outputOf(each.path + " --help"));
     EXPECT_THAT(options, Contains("--version"));
-    for (const std::string& option : options) EXPECT_THAT(manual(each.page), HasSubstr(option)) << each.page;
+    const std::string completion = contentOf("packaging/completion/" + each.name);
+    for (const std::string& option : options) {
+      EXPECT_THAT(manual(each.page), HasSubstr(option)) << each.page;
+      EXPECT_THAT(completion, HasSubstr(option)) << each.name;
+    }
   }
 }
 
@@ -103,24 +115,56 @@ TEST(Manual, EachPageStatesItsExitStatuses) {
   }
 }
 
-TEST(Completion, OffersSubcommandsOptionsAndEveryMetric) {
-  const auto offered = [](const std::string& words) {
-    // The last word is the one that is being typed.
-    return outputOf("bash -c '. packaging/completion/probectl; COMP_WORDS=(" + words +
-                    "); COMP_CWORD=$((${#COMP_WORDS[@]} - 1)); _probectl; echo \"${COMPREPLY[@]}\"' 2>&1");
-  };
-  EXPECT_EQ(offered("probectl \"\""), "status watch pages query config decode store --socket --version --help\n");
-  EXPECT_EQ(offered("probectl st"), "status store\n");
-  EXPECT_EQ(offered("probectl --socket /tmp/x wa"), "watch\n");
-  EXPECT_EQ(offered("probectl watch --p"), "--personal\n");
-  EXPECT_EQ(offered("probectl config \"\""), "push clear --help\n");
-  EXPECT_EQ(offered("probectl config push resources/kiv"), "resources/kiv_test_lte.deviceconfig\n");
-  EXPECT_EQ(offered("probectl query K_SIM"), "K_SIM_FILE_INFO\n");
-  EXPECT_EQ(offered("probectl watch --count \"\""), "\n");
-  const std::string metrics = offered("probectl decode K_");
+// What the completion of a program offers for those words, of which the last is being typed.
+std::string offered(const std::string& program, const std::string& words) {
+  std::string function = "_" + program;
+  std::ranges::replace(function, '-', '_');
+  return outputOf("bash -c '. packaging/completion/" + program + "; COMP_WORDS=(" + words +
+                  "); COMP_CWORD=$((${#COMP_WORDS[@]} - 1)); " + function + "; echo \"${COMPREPLY[@]}\"' 2>&1");
+}
+
+// As it is called by its path.
+std::string offered(const std::string& words) { return offered("probectl", PROBECTL " " + words); }
+
+TEST(Completion, OffersSubcommandsAndOptions) {
+  EXPECT_EQ(offered("\"\""), "status watch pages query metrics config decode store names --socket --version --help\n");
+  EXPECT_EQ(offered("st"), "status store\n");
+  EXPECT_EQ(offered("--socket /tmp/x wa"), "watch\n");
+  EXPECT_EQ(offered("watch --p"), "--personal\n");
+  EXPECT_EQ(offered("watch --c"), "--changes --count\n");
+  EXPECT_EQ(offered("config \"\""), "push clear --help\n");
+  EXPECT_EQ(offered("config push resources/kiv"), "resources/kiv_test_lte.deviceconfig\n");
+  EXPECT_EQ(offered("watch --count \"\""), "\n");
+  EXPECT_EQ(offered("names \"\""), "metrics classes pages --help\n");
+}
+
+TEST(Completion, OffersEveryMetricClassAndPageThatTheProgramKnows) {
+  EXPECT_EQ(offered("query K_SIM"), "K_SIM_FILE_INFO\n");
+  EXPECT_EQ(offered("query K_SIM_FILE_INFO K_"), "\n");
+  EXPECT_EQ(offered("watch K_SIM_FILE_INFO K_LTE_RR"), "K_LTE_RRC_STATE\n");
+  EXPECT_EQ(offered("metrics K_LTE_RR"), "K_LTE_RRC_STATE\n");
+  EXPECT_EQ(offered("decode KCellularLteRrc"), "KCellularLteRrcState\n");
+  const std::string metrics = offered("decode K_");
   for (const MetricIdentifier& metric : metricIdentifiers()) {
     EXPECT_THAT(" " + metrics, testing::ContainsRegex(" " + std::string(metric.name) + "[ \n]"));
   }
+  EXPECT_EQ(offered("pages \"\""), "Device LTE UMTS GSM\n");
+  EXPECT_EQ(offered("pages lte r"), "RRC\n");
+  EXPECT_EQ(offered("pages LTE RRC \"\""), "State\n");
+  EXPECT_EQ(offered("pages LTE Serving Cell \"\""), "Info Meas\n");
+}
+
+TEST(Completion, KnowsTheOtherPrograms) {
+  EXPECT_EQ(offered("probeview", "probeview --t"), "--terminal\n");
+  EXPECT_EQ(offered("probeview", "probeview --log resources/kiv"), "resources/kiv_test_lte.deviceconfig\n");
+  EXPECT_EQ(offered("radixd", "radixd --s"), "--socket --source\n");
+  EXPECT_EQ(offered("radixd", "radixd --source s"), "scenario\n");
+  EXPECT_EQ(offered("radixd", "radixd --source scenario : c"), "city\n");
+  EXPECT_EQ(offered("radixd", "radixd --source trace : resources/kiv"), "resources/kiv_test_lte.deviceconfig\n");
+  EXPECT_EQ(offered("radixd", "radixd --log-level w"), "warning\n");
+  const std::string pictures = std::filesystem::path(PROBECTL).parent_path().string() + "/probeview-pictures";
+  EXPECT_EQ(offered("probeview-pictures", pictures + " --look d"), "dark\n");
+  EXPECT_EQ(offered("probeview-pictures", pictures + " --page \"LTE\\ RRC\""), "LTE\\ RRC\\ State\n");
 }
 
 }  // namespace

@@ -90,6 +90,60 @@ TEST_F(ServiceCommands, PersonalFieldsShowAsAnEllipsisUnlessAskedFor) {
   EXPECT_THAT(probectl({"watch", "--count", "1", "--json"}).output, HasSubstr("{\"tmsi\":\"…\"}"));
 }
 
+TEST_F(ServiceCommands, WatchShowsThoseMetricsAloneThatAreNamed) {
+  world_->emit(K_LTE_RRC_STATE, {0x10, 3});
+  world_->emit(K_CELLULAR_MM_CTXT, {0x28, 7});
+  const Outcome one = probectl({"watch", "--count", "1", "K_CELLULAR_MM_CTXT"});
+  EXPECT_THAT(one.output, HasSubstr("K_CELLULAR_MM_CTXT"));
+  EXPECT_EQ(std::count(one.output.begin(), one.output.end(), '\n'), 1);
+  EXPECT_THAT(probectl({"watch", "0x3C4E04", "0x4D", "--count", "1"}).output, HasSubstr("K_LTE_RRC_STATE"));
+  const Outcome unknown = probectl({"watch", "K_LTE_RCC_STATE"});
+  EXPECT_EQ(unknown.status, 2);
+  EXPECT_EQ(unknown.errors,
+            "probectl: \"K_LTE_RCC_STATE\" is no metric and no metric's identifier; did you mean K_LTE_RRC_STATE?\n");
+}
+
+TEST_F(ServiceCommands, WatchOfChangesShowsTheFirstRecordAndThenOnlyWhatIsNotAsItWas) {
+  world_->onService([&] {
+    world_->script().onListening = [this](bool listening) {
+      if (!listening) return;
+      auto& script = world_->script();
+      // timestamp, state and cause; nothing but the time changes; the state does; the cause goes.
+      script.emit(K_LTE_RRC_STATE, {0x08, 1, 0x10, 1, 0x28, 1});
+      script.emit(K_LTE_RRC_STATE, {0x08, 2, 0x10, 1, 0x28, 1});
+      script.emit(K_LTE_RRC_STATE, {0x08, 3, 0x10, 3, 0x28, 1});
+      script.emit(K_LTE_RRC_STATE, {0x08, 4, 0x10, 3});
+      script.emit(77, {1});
+      script.emit(77, {1});
+      script.emit(77, {2});
+    };
+  });
+  const Outcome outcome = probectl({"watch", "--changes", "--json", "--count", "5"});
+  std::istringstream lines(outcome.output);
+  std::vector<nlohmann::json> shown;
+  for (std::string line; std::getline(lines, line);) shown.push_back(nlohmann::json::parse(line));
+  ASSERT_EQ(shown.size(), 5u);
+  EXPECT_EQ(shown[0].at("dict").size(), 3u);
+  EXPECT_EQ(shown[1].at("dict").dump(), R"({"state":"KLTE_RRC_STATE_CONNECTED"})");
+  EXPECT_FALSE(shown[1].contains("gone"));
+  EXPECT_EQ(shown[2].at("dict").dump(), "{}");
+  EXPECT_EQ(shown[2].at("gone").dump(), R"(["cause"])");
+  EXPECT_EQ(shown[3].at("id"), 77);
+  EXPECT_EQ(shown[4].at("id"), 77);
+}
+
+TEST(WatchCommand, ANumberOfRecordsThatIsNoneGetsAnErrorForPeople) {
+  for (const char* count : {"0", "-1", "abc", "1.5", "99999999999999999999"}) {
+    std::istringstream in;
+    std::ostringstream out;
+    std::ostringstream err;
+    const std::vector<std::string> arguments{"watch", "--count=" + std::string(count)};
+    EXPECT_EQ(runProbectl(arguments, in, out, err), 2);
+    EXPECT_THAT(err.str(), HasSubstr("--count: \"" + std::string(count) +
+                                     "\" is no number of records: a whole number, at least 1\n"));
+  }
+}
+
 TEST(PersonalData, IsHiddenHoweverDeepItLies) {
   Dictionary dictionary{
       {"imsi", Value::text("001010000000001")},
@@ -143,6 +197,10 @@ TEST_F(ServiceCommands, AQueryThatNoSourceCanFillEndsWithStatusOneAndTheReason) 
   EXPECT_EQ(outcome.output, "");
   EXPECT_EQ(outcome.errors, "probectl: no source can fill K_LTE_TX_POWER (0x3CD302)\n");
   EXPECT_EQ(probectl({"query", "K_NOBODY_KNOWS"}).status, 2);
+  EXPECT_THAT(probectl({"query", "k_lte_txpower"}).errors, HasSubstr("; did you mean K_LTE_TX_POWER"));
+  EXPECT_EQ(probectl({"query", "0x7F0013"}).errors,
+            "probectl: 0x7F0013 is no metric, and no configuration says which metrics a trigger of that number stands "
+            "for: push one with it under [triggers]\n");
 }
 
 TEST_F(ServiceCommands, AQueryOfATriggerPrintsTheMetricThatAnswersIt) {
@@ -183,6 +241,11 @@ TEST_F(ServiceCommands, AConfigurationThatIsRefusedOrCannotBeReadEndsWithStatusO
   std::ofstream(path) << std::string(200000, '#');
   EXPECT_THAT(probectl({"config", "push", path}).errors,
               StartsWith("probectl: " + path + ": the configuration has more than 131072 bytes; at most "));
+  std::ofstream(path) << "[metric]\nK_LTE_RRC_STATE = 5\n";
+  const Outcome unknown = probectl({"config", "push", path});
+  EXPECT_EQ(unknown.status, 1);
+  EXPECT_THAT(unknown.errors,
+              HasSubstr("neither [metrics] nor [triggers] here, only \"metric\"; did you mean metrics?\n"));
   std::ofstream(path) << "[metrics]\nK_NOBODY_KNOWS = 5\n";
   const Outcome noted = probectl({"config", "push", path});
   EXPECT_EQ(noted.status, 0);

@@ -68,8 +68,7 @@ TEST(PageSnapshot, PlainTextAlignsValuesAndIndentsTheLinesOfALongValue) {
   EXPECT_EQ(plainText(snapshot),
             "PDP 0\n"
             "  id       5\n"
-            "  address  one\n"
-            "           two\n"
+            "  address  one\\ntwo\n"
             "\n"
             "  état     frei\n"
             "  alone\n");

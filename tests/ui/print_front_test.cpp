@@ -3,10 +3,12 @@
 
 #include <fcntl.h>
 
+#include <algorithm>
 #include <csignal>
 #include <sstream>
 
 #include "platform/file_descriptor.h"
+#include "tests/support/harmless.h"
 #include "tests/ui/testing.h"
 #include "ui/open_page.h"
 #include "ui/varnet_view_items.h"
@@ -80,6 +82,24 @@ TEST_F(Printing, AStackThatStandsOnAPagePrintsThatPageAlone) {
             "probeview › LTE › RRC State\n"
             "  state  IDLE\n\n"
             "the status\n");
+}
+
+TEST_F(Printing, WhatAPeerSaysSteersNoTerminal) {
+  store.filled[DisplayDictionary::myLTERRCStateDict] =
+      Dictionary{{Key::copy(hostileText()), Value::text(hostileText())}, {"state", Value::text("a\x1b[2J\nb")}};
+  ASSERT_TRUE(openPage(stack, "LTE RRC State"));
+  EXPECT_EQ(front.run(stack, status), 0);
+  const std::string text = printed();
+  EXPECT_TRUE(areHarmless(text)) << text;
+  EXPECT_NE(text.find("  a\\u{1b}[2J\\nb\n"), std::string::npos) << text;
+}
+
+TEST_F(Printing, AReasonOfTheServiceSteersNoTerminal) {
+  std::ostringstream errors;
+  front.failWith([] { return hostileText(); }, errors);
+  EXPECT_EQ(front.run(stack, status), 1);
+  EXPECT_TRUE(areHarmless(errors.str())) << errors.str();
+  EXPECT_EQ(std::ranges::count(errors.str(), '\n'), 1);
 }
 
 TEST_F(Printing, NothingIsPrintedBeforeTheStoreIsFilled) {

@@ -354,6 +354,11 @@ TEST_F(StatusLines, WhatAServiceSaysCannotBreakTheLine) {
   expectTame(onLists());
 }
 
+TEST_F(StatusLines, WhatWouldSteerATerminalShowsAsItsEscape) {
+  receive(rrcState, "trace:\x1b[2Ja\nb.csv");
+  EXPECT_EQ(onLists().text, "trace:\\u{1b}[2Ja\\nb.csv · 0.0 s ago");
+}
+
 TEST(Age, AnAgeIsRoundedDownInTheUnitThatSuitsIt) {
   EXPECT_EQ(ageText(-1s), "0.0 s");
   EXPECT_EQ(ageText(0s), "0.0 s");

@@ -7,6 +7,7 @@
 #include <string>
 #include <vector>
 
+#include "tests/support/harmless.h"
 #include "values/dictionary.h"
 #include "values/json.h"
 #include "values/plain_text.h"
@@ -253,12 +254,51 @@ TEST(PlainText, AHexadecimalTextReadsBack) {
     EXPECT_EQ(parseInteger64(hexText(number)), number);
 }
 
-TEST(PlainText, WhatWouldEndALineOrSteerATerminalIsAQuestionMarkAndNothingElseIs) {
-  EXPECT_EQ(onOneLine("a\nb\r\t\x1b[31m\x7f"), "a?b???[31m?");
-  EXPECT_EQ(onOneLine(std::string_view("\0x", 2)), "?x");
-  EXPECT_EQ(onOneLine("\xC2\x85|\xC2\x9B|\xC2\x80"), "?|?|?");
-  EXPECT_EQ(onOneLine("Gr\u00fc\u00dfe\u00a0\u2026\xC2"), "Gr\u00fc\u00dfe\u00a0\u2026\xC2");
+TEST(PlainText, WhatWouldEndALineOrSteerATerminalIsEscapedAndNothingElseIs) {
+  EXPECT_EQ(onOneLine("a\nb\r\t\x1b[31m\x7f"), "a\\nb\\r\\t\\u{1b}[31m\\u{7f}");
+  EXPECT_EQ(onOneLine(std::string_view("\0x", 2)), "\\0x");
+  EXPECT_EQ(onOneLine("\xC2\x85|\xC2\x9B|\xC2\x80"), "\\u{85}|\\u{9b}|\\u{80}");
+  EXPECT_EQ(onOneLine("a\u202eb\u2028c\u2066d"), "a\\u{202e}b\\u{2028}c\\u{2066}d");
+  EXPECT_EQ(onOneLine("Gr\u00fc\u00dfe\u00a0\u2026 \"C:\\n\" \xC2"), "Gr\u00fc\u00dfe\u00a0\u2026 \"C:\\n\" \ufffd");
   EXPECT_EQ(onOneLine(""), "");
+}
+
+TEST(PlainText, WhateverTheBytesALineIsHarmlessAndWhatWasHarmlessIsUnchanged) {
+  // Every byte between others, every pair of bytes, and every character of the first plane.
+  std::vector<std::string> texts;
+  for (int first = 0; first < 256; ++first) {
+    texts.push_back({'a', static_cast<char>(first), 'b'});
+    for (int second = 0; second < 256; ++second) {
+      texts.push_back({static_cast<char>(first), static_cast<char>(second)});
+    }
+  }
+  for (std::uint32_t code = 0x80; code < 0x10000; ++code) {
+    if (code >= 0xD800 && code < 0xE000) continue;
+    std::string text;
+    if (code >= 0x800) {
+      text += static_cast<char>(0xE0 | code >> 12);
+      text += static_cast<char>(0x80 | (code >> 6 & 0x3F));
+    } else {
+      text += static_cast<char>(0xC0 | code >> 6);
+    }
+    text += static_cast<char>(0x80 | (code & 0x3F));
+    texts.push_back(text);
+  }
+  for (const std::string& text : texts) {
+    const std::string line = onOneLine(text);
+    ASSERT_TRUE(isHarmless(line)) << printed(Value::text(text));
+    ASSERT_EQ(onOneLine(line), line);
+    if (isHarmless(text)) {
+      ASSERT_EQ(line, text);
+    }
+    // As inside a printed value, where nothing but quotation marks and backslashes has more escapes.
+    if (text.find_first_of("\"\\") == std::string::npos) {
+      ASSERT_EQ(onOneLine(printed(Value::text(text))), '"' + line + '"');
+    }
+    std::string json;
+    appendJsonString(text, json);
+    ASSERT_TRUE(isHarmless(json)) << json;
+  }
 }
 
 TEST(PlainText, TheBeginningOfATextEndsBetweenTwoCharacters) {

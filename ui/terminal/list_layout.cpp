@@ -6,7 +6,7 @@
 #include <algorithm>
 
 #include "ui/interface_description.h"
-#include "values/printer.h"
+#include "values/plain_text.h"
 
 namespace probeview::terminal {
 
@@ -17,16 +17,6 @@ constexpr wchar_t ellipsis = L'…';
 constexpr int gap = 2;  // between label and value
 
 int columnsOf(wchar_t character) { return std::max(::wcwidth(character), 0); }
-
-// The next character of well-formed UTF-8.
-char32_t nextCharacter(std::string_view text, std::size_t& at) {
-  const auto lead = static_cast<unsigned char>(text[at++]);
-  if (lead < 0x80) return lead;
-  const int following = lead >= 0xf0 ? 3 : lead >= 0xe0 ? 2 : 1;
-  char32_t character = lead & (0x3fu >> following);
-  for (int byte = 0; byte < following; ++byte) character = (character << 6) | (text[at++] & 0x3f);
-  return character;
-}
 
 // How many characters of the text fit into the width; at least one, so that there is always a way on.
 std::size_t fitting(std::wstring_view text, int width) {
@@ -48,13 +38,13 @@ std::size_t breakBefore(std::wstring_view line, std::size_t fits) {
 }  // namespace
 
 std::wstring characters(std::string_view text) {
-  std::string valid;
-  appendValidUtf8(text, valid);
+  const std::string shown = onOneLine(text);
   std::wstring out;
-  for (std::size_t at = 0; at < valid.size();) {
-    const auto character = static_cast<wchar_t>(nextCharacter(valid, at));
-    const bool isShown = character == L'\n' || ::wcwidth(character) >= 0;
-    out += isShown ? character : replacement;
+  for (std::string_view rest = shown; !rest.empty();) {
+    const auto [code, size] = firstCharacter(rest);
+    const auto character = static_cast<wchar_t>(code);
+    out += ::wcwidth(character) >= 0 ? character : replacement;
+    rest.remove_prefix(size);
   }
   return out;
 }

@@ -15,7 +15,8 @@
 
 namespace probeview::terminal {
 
-// UTF-8 as characters; what is ill-formed, and control characters other than a line's end, become U+FFFD.
+// UTF-8 as characters, on one line: what would steer the terminal stands as its escape. What is ill-formed, or nothing
+// that this system can show, becomes U+FFFD.
 std::wstring characters(std::string_view text);
 // Columns that the characters take.
 int columns(std::wstring_view text);

@@ -91,11 +91,23 @@ TEST(Configuration, AnUnknownMetricIsNotedWithItsLineAndIgnored) {
                                             "line 6: the metric 0x3CFFFE is not known, ignored"));
 }
 
-TEST(Configuration, ASectionThatNobodyKnowsIsNotedAndIgnored) {
-  const Configuration configuration = parse("[metric]\nK_LTE_RRC_STATE = 1000\n");
-  EXPECT_THAT(configuration.plan.metrics, IsEmpty());
+TEST(Configuration, ASectionThatNobodyKnowsIsNotedAndIgnoredBesideOneThatIsKnown) {
+  const Configuration configuration = parse("[metrics]\nK_LTE_RRC_STATE = 1000\n[limits]\na = 1\n");
+  EXPECT_EQ(configuration.plan.metrics.size(), 1u);
   ASSERT_EQ(configuration.notes.size(), 1u);
-  EXPECT_THAT(configuration.notes[0], HasSubstr("line 1: \"metric\" is neither [metrics] nor [triggers], ignored"));
+  EXPECT_THAT(configuration.notes[0], HasSubstr("line 3: \"limits\" is neither [metrics] nor [triggers], ignored"));
+}
+
+TEST(Configuration, ATextOfUnknownSectionsAloneIsRefusedAndTheKnownOnesAreNamed) {
+  const ConfigurationResult result = refusal("\n[metric]\nK_LTE_RRC_STATE = 1000\n");
+  EXPECT_EQ(result.line, 2u);
+  EXPECT_EQ(result.error,
+            "line 2, column 2: there is neither [metrics] nor [triggers] here, only \"metric\"; did you mean metrics?");
+  EXPECT_EQ(refusal("a = 1\n[b]\n").error,
+            "line 1, column 1: there is neither [metrics] nor [triggers] here, only \"a\" and others");
+  // Nothing at all wants nothing.
+  EXPECT_THAT(parse("# nothing\n").plan.metrics, IsEmpty());
+  EXPECT_THAT(parse("[metrics]\n").plan.metrics, IsEmpty());
 }
 
 TEST(Configuration, ASyntaxErrorIsRefusedWithLineAndColumn) {
@@ -178,7 +190,8 @@ TEST(Configuration, TablesNestedToDeathAreRefused) {
   std::string dotted = "a";
   for (int depth = 0; depth < 60'000; ++depth) dotted += ".a";
   EXPECT_THAT(refusal(dotted + " = 1\n").error, HasSubstr("more than 4000 dots"));
-  EXPECT_TRUE(parseConfiguration(dotted.substr(0, 8001) + " = 1\n").configuration.has_value()) << "4000 dots";
+  EXPECT_TRUE(parseConfiguration(dotted.substr(0, 8001) + " = 1\n[metrics]\n").configuration.has_value())
+      << "4000 dots";
   EXPECT_THAT(refusal(dotted.substr(0, 8003) + " = 1\n").error, HasSubstr("more than 4000 dots"));
   refusal("a = " + std::string(100'000, '['));
   refusal("a = " + std::string(100'000, '{'));

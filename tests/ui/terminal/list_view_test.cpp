@@ -3,7 +3,11 @@
 
 #include <gtest/gtest.h>
 
+#include <wchar.h>
+
 #include <clocale>
+
+#include "tests/support/harmless.h"
 
 namespace probeview::terminal {
 namespace {
@@ -43,10 +47,13 @@ TEST_F(TextLayout, ANarrowWidthStillGetsThroughTheText) {
   EXPECT_EQ(shortened(L"abc", 0), L"");
 }
 
-TEST_F(TextLayout, ControlCharactersAndIllFormedTextAreReplaced) {
-  EXPECT_EQ(characters("a\x1b[31mb"), L"a\ufffd[31mb");
+TEST_F(TextLayout, ControlCharactersAreEscapedAndIllFormedTextIsReplaced) {
+  EXPECT_EQ(characters("a\x1b[31mb"), L"a\\u{1b}[31mb");
+  EXPECT_EQ(characters("\xc2\x9b|"), L"\\u{9b}|");
   EXPECT_EQ(characters("\xc3\x28"), L"\ufffd(");
-  EXPECT_EQ(characters("a\nb"), L"a\nb");
+  // A value cannot make itself more rows than it has.
+  EXPECT_EQ(characters("a\nb"), L"a\\nb");
+  for (const wchar_t character : characters(hostileText())) EXPECT_GE(::wcwidth(character), 0) << int{character};
   EXPECT_EQ(characters("Zürich 信"), L"Zürich 信");
   EXPECT_EQ(characters("\xf0\x9f\x93\xb6"), L"\U0001f4f6");
 }

@@ -1,0 +1,61 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "tools/names.h"
+
+#include <CLI/CLI.hpp>
+#include <memory>
+#include <ostream>
+
+#include "messages/metric_identifiers.h"
+#include "messages/registry.h"
+#include "tools/batch.h"
+#include "ui/varnet_view_items.h"
+#include "values/near_matches.h"
+#include "values/plain_text.h"
+
+namespace probeview {
+
+namespace {
+
+ExitStatus showNames(const std::string& what, Tool& tool) {
+  if (what == "pages") {
+    for (const std::string& key : navigablePageKeys()) tool.output << key << '\n';
+    return ExitStatus::Success;
+  }
+  for (const std::string_view name : what == "classes" ? classNames() : metricNames()) tool.output << name << '\n';
+  return ExitStatus::Success;
+}
+
+}  // namespace
+
+std::vector<std::string_view> metricNames() {
+  std::vector<std::string_view> names;
+  for (const MetricIdentifier& metric : metricIdentifiers()) names.push_back(metric.name);
+  return names;
+}
+
+std::vector<std::string_view> classNames() {
+  std::vector<std::string_view> names;
+  for (const MessageDescriptor* message : messageClasses()) names.push_back(message->name);
+  return names;
+}
+
+std::optional<std::int64_t> metricOnCommandLine(std::string_view text) {
+  if (const MetricIdentifier* const metric = metricNamed(text)) return metric->id;
+  return parseInteger64(text);
+}
+
+std::string unknownMetric(std::string_view text) {
+  return quotedExcerpt(text) + " is no metric and no metric's identifier" + didYouMean(text, metricNames());
+}
+
+void addNamesCommand(CLI::App& program, Tool& tool) {
+  CLI::App* command = program.add_subcommand("names", "Print the names of metrics, classes or pages, one a line");
+  auto what = std::make_shared<std::string>();
+  command->add_option("WHAT", *what, "metrics, classes or pages")
+      ->required()
+      ->check(CLI::IsMember({"metrics", "classes", "pages"}));
+  command->footer("What the completion of command lines offers.\n\nExamples:\n  probectl names metrics");
+  command->callback([what, &tool] { tool.run = [what, &tool] { return showNames(*what, tool); }; });
+}
+
+}  // namespace probeview
