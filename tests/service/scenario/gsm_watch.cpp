@@ -9,11 +9,11 @@
 namespace probeview {
 namespace {
 
-using State = KCellularGsmScellInfo::State;
+using GsmState = KCellularGsmScellInfo::State;
 using Band = KCellularWcdmaCellInfo::WcdmaBand;
 
 // 3GPP TS 45.005, 2: the bands that the made-up networks use.
-bool inBand(std::uint32_t arfcn, std::int32_t band) {
+bool isArfcnInBand(std::uint32_t arfcn, std::int32_t band) {
   return band == Band::SYS_BAND_GSM_DCS_1800 ? arfcn >= 512 && arfcn <= 885
                                              : band == Band::SYS_BAND_GSM_PGSM_900 && arfcn >= 1 && arfcn <= 124;
 }
@@ -21,7 +21,7 @@ bool inBand(std::uint32_t arfcn, std::int32_t band) {
 }  // namespace
 
 bool GsmWatch::isOver() const {
-  return !servesCell_ && states_.now() == State::NON_DEDICATED_STATE && stateTime_ >= latest_;
+  return !servesCell_ && states_.now() == GsmState::NON_DEDICATED_STATE && stateTime_ >= latest_;
 }
 
 void GsmWatch::see(const MetricRecord& record) {
@@ -33,8 +33,8 @@ void GsmWatch::see(const MetricRecord& record) {
       servesCell_ = message.hasCellId();
       if (!servesCell_) {
         findings_.expect(Rule::kGsmWithoutACellIsNotDedicated,
-                         message.state() == State::NON_DEDICATED_STATE && !message.hasArfcn() && !message.hasLac());
-        if (!how_.soak && before == State::DEDICATED_STATE) findings_.reach("GSM > NON_DEDICATED");
+                         message.state() == GsmState::NON_DEDICATED_STATE && !message.hasArfcn() && !message.hasLac());
+        if (!how_.soak && before == GsmState::DEDICATED_STATE) findings_.reach("GSM > NON_DEDICATED");
         states_.becomes(message.state(), record.time);
         stateTime_ = record.time;
         serving_.reset();
@@ -42,10 +42,10 @@ void GsmWatch::see(const MetricRecord& record) {
       }
       const CellName cell{message.arfcn(), message.bsic()};
       if (!how_.soak && before && message.state() != before) {
-        findings_.reach(message.state() == State::DEDICATED_STATE ? "GSM > DEDICATED" : "GSM > NON_DEDICATED");
+        findings_.reach(message.state() == GsmState::DEDICATED_STATE ? "GSM > DEDICATED" : "GSM > NON_DEDICATED");
       }
       if (cell != serving_) {
-        if (!how_.soak && serving_ && before == State::DEDICATED_STATE && message.state() == before)
+        if (!how_.soak && serving_ && before == GsmState::DEDICATED_STATE && message.state() == before)
           findings_.reach("GSM handover");
         cellChangedAt_ = record.time;
       }
@@ -53,7 +53,7 @@ void GsmWatch::see(const MetricRecord& record) {
       stateTime_ = record.time;
       serving_ = cell;
       together_.told(0, record.time);
-      findings_.expect(Rule::kGsmChannelInBand, inBand(message.arfcn(), message.gsmBand()));
+      findings_.expect(Rule::kGsmChannelInBand, isArfcnInBand(message.arfcn(), message.gsmBand()));
       findings_.expectBetween(Rule::kGsmRanges, message.bsic(), 0, 63);
       findings_.expectBetween(Rule::kGsmRanges, message.lac(), 1, 0xFFFD);
       findings_.expectBetween(Rule::kGsmRanges, message.cellId(), 0, 0xFFFF);
@@ -73,8 +73,9 @@ void GsmWatch::see(const MetricRecord& record) {
     case K_GSM_IDLE_SCELL_MEAS: {
       const auto message = decoded<KCellularGsmIdleScellMeasurement>(record);
       if (!how_.soak) {
-        findings_.expect(Rule::kGsmMeasurementIsThatOfTheMode, states_.at(record.time) == State::NON_DEDICATED_STATE &&
-                                                                   serving_ && message.scellArfcn() == serving_->first);
+        findings_.expect(Rule::kGsmMeasurementIsThatOfTheMode,
+                         states_.at(record.time) == GsmState::NON_DEDICATED_STATE && serving_ &&
+                             message.scellArfcn() == serving_->first);
       }
       findings_.expectBetween(Rule::kGsmRanges, message.idleRxlevDBm(), -110, -47);
       return;
@@ -82,7 +83,7 @@ void GsmWatch::see(const MetricRecord& record) {
     case K_GSM_CS_RF_MEAS: {
       const auto message = decoded<KCellularGsmCsRfMeasurement>(record);
       if (!how_.soak) {
-        findings_.expect(Rule::kGsmMeasurementIsThatOfTheMode, states_.at(record.time) == State::DEDICATED_STATE &&
+        findings_.expect(Rule::kGsmMeasurementIsThatOfTheMode, states_.at(record.time) == GsmState::DEDICATED_STATE &&
                                                                    serving_ && message.scellArfcn() == serving_->first);
       }
       findings_.expectBetween(Rule::kGsmRanges, message.csRxlevSub(), 0, 63);
@@ -106,7 +107,8 @@ void GsmWatch::settle(Moment time) {
 void GsmWatch::seeIdleConfiguration(const MetricRecord& record) {
   const auto message = decoded<KCellularGsmIdleConfig>(record);
   together_.told(1, record.time);
-  findings_.expect(Rule::kGsmChannelInBand, inBand(message.arfcnBcch(), static_cast<std::int32_t>(message.gsmBand())));
+  findings_.expect(Rule::kGsmChannelInBand,
+                   isArfcnInBand(message.arfcnBcch(), static_cast<std::int32_t>(message.gsmBand())));
   findings_.expectBetween(Rule::kGsmRanges, message.radioLinkTimeout(), 0, 15);
   findings_.expectBetween(Rule::kGsmRanges, message.msTxpwr(), 0, 31);
   findings_.expectBetween(Rule::kGsmRanges, message.rxAccMin(), 0, 63);

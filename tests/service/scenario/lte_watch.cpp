@@ -9,18 +9,18 @@
 namespace probeview {
 namespace {
 
-using State = KCellularLteRrcState::State;
+using LteState = KCellularLteRrcState::State;
 using SecondaryState = SecondaryComponentCarrier::State;
 
 constexpr std::uint32_t kUplinkOffset = 18000;
 
-std::string nameOf(std::int32_t state) {
+std::string lteStateName(std::int32_t state) {
   constexpr std::array kNames{"NULL", "IDLE", "ATTEMPTING", "CONNECTED", "ENDING", "GOING_OUTBOUND", "COMING_INBOUND"};
   return kNames.at(static_cast<std::size_t>(state));
 }
 
 // 3GPP TS 36.101, table 5.7.3-1: the bands that the made-up networks use.
-bool inBand(std::uint32_t earfcn, std::uint32_t band) {
+bool isEarfcnInBand(std::uint32_t earfcn, std::uint32_t band) {
   switch (band) {
     case 3:
       return earfcn >= 1200 && earfcn <= 1949;
@@ -35,8 +35,8 @@ bool inBand(std::uint32_t earfcn, std::uint32_t band) {
 
 }  // namespace
 
-bool LteWatch::serves() const { return states_.now() && *states_.now() != State::KLTE_RRC_STATE_NULL; }
-bool LteWatch::isOver() const { return states_.now() == State::KLTE_RRC_STATE_NULL; }
+bool LteWatch::serves() const { return states_.now() && *states_.now() != LteState::KLTE_RRC_STATE_NULL; }
+bool LteWatch::isOver() const { return states_.now() == LteState::KLTE_RRC_STATE_NULL; }
 
 void LteWatch::see(const MetricRecord& record) {
   switch (record.metricId) {
@@ -66,7 +66,7 @@ void LteWatch::see(const MetricRecord& record) {
 }
 
 void LteWatch::settle(Moment time) {
-  const bool connected = states_.now() == State::KLTE_RRC_STATE_CONNECTED;
+  const bool connected = states_.now() == LteState::KLTE_RRC_STATE_CONNECTED;
   if (drxState_) findings_.expect(Rule::kDrxNamesTheStateThatIs, drxState_ == states_.now());
   if (cellChangedAt_ == time) findings_.expect(Rule::kLteCellChangesAtOneMoment, together_.allAt(time));
   if (!serving_ || carriers_.empty()) return;
@@ -91,11 +91,11 @@ void LteWatch::seeState(const MetricRecord& record) {
     findings_.expect(Rule::kLtePreviousStateIsTheOneBefore, message.prevState() == before);
     const bool exact = Moment(message.prevStateDurMs()) == record.time - states_.since();
     findings_.expect(Rule::kLteDurationIsExact, exact);
-    if (before == State::KLTE_RRC_STATE_NULL) findings_.expect(Rule::kLteComesBackFromNull, exact);
-    findings_.reach("LTE " + nameOf(*before) + " > " + nameOf(state));
+    if (before == LteState::KLTE_RRC_STATE_NULL) findings_.expect(Rule::kLteComesBackFromNull, exact);
+    findings_.reach("LTE " + lteStateName(*before) + " > " + lteStateName(state));
   }
   if (message.cause() == KCellularLteRrcState::Cause::KLTE_RRC_CAUSE_NO_SERVICE) findings_.reach("LTE without service");
-  if (state == State::KLTE_RRC_STATE_CONNECTED && before != state) configured_.clear();
+  if (state == LteState::KLTE_RRC_STATE_CONNECTED && before != state) configured_.clear();
   states_.becomes(state, record.time);
 }
 
@@ -105,7 +105,7 @@ void LteWatch::seeDrx(const MetricRecord& record) {
   drxState_ = message.rrcState();
   findings_.expectBetween(Rule::kLteRanges, message.cdrxConfigStatus(), 0, 1);
   findings_.expect(Rule::kDrxIsConfiguredInConnectedAlone,
-                   configured == (message.rrcState() == State::KLTE_RRC_STATE_CONNECTED));
+                   configured == (message.rrcState() == LteState::KLTE_RRC_STATE_CONNECTED));
   if (!configured) {
     findings_.expect(Rule::kLteRanges, !message.hasLongDrxCycleMs() && !message.hasShortDrxCycleMs());
     return;
@@ -123,12 +123,12 @@ void LteWatch::seeCell(const MetricRecord& record) {
   const auto message = decoded<KCellularLteScellInfo>(record);
   const CellName cell{message.dlFreq(), message.phyCellId()};
   if (serving_ && cell != serving_) {
-    if (!how_.soak) findings_.reach("LTE cell change in " + nameOf(*states_.now()));
+    if (!how_.soak) findings_.reach("LTE cell change in " + lteStateName(*states_.now()));
   }
   serving_ = cell;
   cellChangedAt_ = record.time;
   together_.told(0, record.time);
-  findings_.expect(Rule::kLteChannelInBand, inBand(message.dlFreq(), message.freqBandInd()));
+  findings_.expect(Rule::kLteChannelInBand, isEarfcnInBand(message.dlFreq(), message.freqBandInd()));
   findings_.expect(Rule::kLteChannelInBand, message.ulFreq() == message.dlFreq() + kUplinkOffset);
   findings_.expectBetween(Rule::kLteRanges, message.phyCellId(), 0, 503);
   findings_.expectBetween(Rule::kLteRanges, message.cellId(), 0, 0x0FFFFFFF);
@@ -143,7 +143,7 @@ void LteWatch::seeSelection(const MetricRecord& record) {
   findings_.expectBetween(Rule::kLteRanges, message.qQualMin(), -34, -3);
   findings_.expectBetween(Rule::kLteRanges, message.priorityOperatingFreq(), 0, 7);
   for (const NbrEutra& frequency : message.nbrEutras()) {
-    findings_.expect(Rule::kLteChannelInBand, inBand(frequency.earfcn(), frequency.band()));
+    findings_.expect(Rule::kLteChannelInBand, isEarfcnInBand(frequency.earfcn(), frequency.band()));
     findings_.expect(Rule::kLteNeighbourIsNotTheServingCell, serving_ && frequency.earfcn() != serving_->first);
     findings_.expectBetween(Rule::kLteRanges, frequency.dlBw(), 0, 5);
     findings_.expectBetween(Rule::kLteRanges, frequency.priority(), 0, 7);
@@ -179,12 +179,12 @@ void LteWatch::seeAggregation(const MetricRecord& record) {
     if (!how_.soak) {
       findings_.expect(Rule::kSecondaryNeverNamesThePrimary, serving_ && cell.first != serving_->first);
     }
-    findings_.expect(Rule::kLteChannelInBand, inBand(carrier.dlEarfcn(), carrier.dlRfBand()));
+    findings_.expect(Rule::kLteChannelInBand, isEarfcnInBand(carrier.dlEarfcn(), carrier.dlRfBand()));
     findings_.expectBetween(Rule::kLteRanges, carrier.pci(), 0, 503);
     constexpr std::array kStates{"deconfigured", "deactivated", "activated"};
     if (!how_.soak)
       findings_.reach(std::string("secondary ") + kStates.at(static_cast<std::size_t>(carrier.state())) + " in " +
-                      nameOf(*states_.now()));
+                      lteStateName(*states_.now()));
     if (carrier.state() == SecondaryState::SCC_STATE_DECONFIGURED) {
       findings_.expect(Rule::kDeconfiguredHasNoMeasurements,
                        !carrier.hasRsrp() && !carrier.hasRsrq() && !carrier.hasSnr() && !carrier.hasRssi());
@@ -195,7 +195,7 @@ void LteWatch::seeAggregation(const MetricRecord& record) {
     }
     configured_.insert(cell);
     if (!how_.soak) {
-      findings_.expect(Rule::kSecondaryOnlyWhileConnected, states_.now() == State::KLTE_RRC_STATE_CONNECTED);
+      findings_.expect(Rule::kSecondaryOnlyWhileConnected, states_.now() == LteState::KLTE_RRC_STATE_CONNECTED);
     }
     findings_.expectBetween(Rule::kLteRanges, carrier.rsrp(), -14000, -4400);  // hundredths
     findings_.expectBetween(Rule::kLteRanges, carrier.rsrq(), -1950, -300);
@@ -229,8 +229,8 @@ void LteWatch::seePower(const MetricRecord& record) {
   const auto message = decoded<KCellularLteTxPower>(record);
   if (!how_.soak) {
     const auto state = states_.at(record.time);
-    findings_.expect(Rule::kLtePowerWhileSending,
-                     state == State::KLTE_RRC_STATE_CONNECTED || state == State::KLTE_RRC_STATE_ATMPT_OUTBND_MOBILITY);
+    findings_.expect(Rule::kLtePowerWhileSending, state == LteState::KLTE_RRC_STATE_CONNECTED ||
+                                                      state == LteState::KLTE_RRC_STATE_ATMPT_OUTBND_MOBILITY);
   }
   for (const TxPowerInfo& power : message.txPowerInfos()) {
     if (power.hasPucchTxPower()) findings_.expectBetween(Rule::kLteRanges, power.pucchTxPower(), -40, 23);
@@ -245,7 +245,7 @@ void LteWatch::seeNeighbours(const MetricRecord& record) {
   for (const EgwErrcNbrEutraMeas& neighbour : message.measNbrEutras()) {
     const CellName cell{neighbour.nbrEarfcn(), neighbour.nbrPhysCellId()};
     findings_.expect(Rule::kLteNeighbourIsNotTheServingCell, cell != serving_ && listed.insert(cell).second);
-    findings_.expect(Rule::kLteChannelInBand, inBand(neighbour.nbrEarfcn(), neighbour.freqBandInd()));
+    findings_.expect(Rule::kLteChannelInBand, isEarfcnInBand(neighbour.nbrEarfcn(), neighbour.freqBandInd()));
     findings_.expectBetween(Rule::kLteRanges, neighbour.nbrPhysCellId(), 0, 503);
     findings_.expectBetween(Rule::kLteRanges, neighbour.nbrRsrp(), 0, 97);
     findings_.expectBetween(Rule::kLteRanges, neighbour.nbrRsrq(), 0, 34);

@@ -6,14 +6,14 @@
 namespace probeview {
 namespace {
 
-using State = KCellularWcdmaRrcConnectionState::State;
+using UmtsState = KCellularWcdmaRrcConnectionState::State;
 
 // 3GPP TS 25.101, 5.4.4: the bands that the made-up networks use.
-bool inBand(std::uint32_t uarfcn, std::uint32_t band) {
+bool isUarfcnInBand(std::uint32_t uarfcn, std::uint32_t band) {
   return band == 1 ? uarfcn >= 10562 && uarfcn <= 10838 : band == 8 && uarfcn >= 2937 && uarfcn <= 3088;
 }
 
-std::string nameOf(std::int32_t state) {
+std::string umtsStateName(std::int32_t state) {
   constexpr std::array kNames{"INVALID",   "INACTIVE", "IDLE",    "ESTABLISH",          "URA_PCH",  "CELL_PCH",
                               "CELL_FACH", "CELL_DCH", "RELEASE", "RADIO_LINK_FAILURE", "SCRI_SENT"};
   return kNames.at(static_cast<std::size_t>(state));
@@ -22,13 +22,13 @@ std::string nameOf(std::int32_t state) {
 // 3GPP TS 25.331, 7: from the establishment of the connection to its end, whatever the phone does in between.
 bool isConnectedMode(std::int32_t state) {
   switch (state) {
-    case State::KWCDMA_RRC_CONN_STATE_URA_PCH:
-    case State::KWCDMA_RRC_CONN_STATE_CELL_PCH:
-    case State::KWCDMA_RRC_CONN_STATE_CELL_FACH:
-    case State::KWCDMA_RRC_CONN_STATE_CELL_DCH:
-    case State::KWCDMA_RRC_CONN_STATE_RELEASE:
-    case State::KWCDMA_RRC_CONN_STATE_RADIO_LINK_FAILURE:
-    case State::KWCDMA_RRC_CONN_STATE_SCRI_SENT:
+    case UmtsState::KWCDMA_RRC_CONN_STATE_URA_PCH:
+    case UmtsState::KWCDMA_RRC_CONN_STATE_CELL_PCH:
+    case UmtsState::KWCDMA_RRC_CONN_STATE_CELL_FACH:
+    case UmtsState::KWCDMA_RRC_CONN_STATE_CELL_DCH:
+    case UmtsState::KWCDMA_RRC_CONN_STATE_RELEASE:
+    case UmtsState::KWCDMA_RRC_CONN_STATE_RADIO_LINK_FAILURE:
+    case UmtsState::KWCDMA_RRC_CONN_STATE_SCRI_SENT:
       return true;
     default:
       return false;
@@ -37,8 +37,8 @@ bool isConnectedMode(std::int32_t state) {
 
 }  // namespace
 
-bool UmtsWatch::serves() const { return states_.now() && *states_.now() != State::KWCDMA_RRC_CONN_STATE_INACTIVE; }
-bool UmtsWatch::isOver() const { return states_.now() == State::KWCDMA_RRC_CONN_STATE_INACTIVE; }
+bool UmtsWatch::serves() const { return states_.now() && *states_.now() != UmtsState::KWCDMA_RRC_CONN_STATE_INACTIVE; }
+bool UmtsWatch::isOver() const { return states_.now() == UmtsState::KWCDMA_RRC_CONN_STATE_INACTIVE; }
 
 void UmtsWatch::see(const MetricRecord& record) {
   switch (record.metricId) {
@@ -61,7 +61,7 @@ void UmtsWatch::see(const MetricRecord& record) {
       together_.told(0, record.time);
       using Band = KCellularWcdmaCellInfo::WcdmaBand;
       const std::uint32_t band = message.wcdmaBand() == Band::SYS_BAND_WCDMA_I_IMT_2000 ? 1 : 8;
-      findings_.expect(Rule::kUmtsChannelInBand, inBand(message.dlUarfcn(), band));
+      findings_.expect(Rule::kUmtsChannelInBand, isUarfcnInBand(message.dlUarfcn(), band));
       findings_.expectBetween(Rule::kUmtsRanges, message.psc(), 0, 511);
       findings_.expectBetween(Rule::kUmtsRanges, message.cellId(), 0, 0x0FFFFFFF);
       findings_.expectBetween(Rule::kUmtsRanges, message.lac(), 1, 0xFFFD);
@@ -75,8 +75,8 @@ void UmtsWatch::see(const MetricRecord& record) {
       const auto message = decoded<KCellularWcdmaTxPower>(record);
       if (!how_.soak) {
         const auto state = states_.at(record.time);
-        findings_.expect(Rule::kUmtsPowerWhileSending, state == State::KWCDMA_RRC_CONN_STATE_CELL_FACH ||
-                                                           state == State::KWCDMA_RRC_CONN_STATE_CELL_DCH);
+        findings_.expect(Rule::kUmtsPowerWhileSending, state == UmtsState::KWCDMA_RRC_CONN_STATE_CELL_FACH ||
+                                                           state == UmtsState::KWCDMA_RRC_CONN_STATE_CELL_DCH);
       }
       for (const TxPowerInfo& power : message.txPowerInfos()) {
         findings_.expectBetween(Rule::kUmtsRanges, power.puschTxPower(), -50, 24);  // 3GPP TS 25.101, 6.2.1 and 6.4.3
@@ -103,7 +103,7 @@ void UmtsWatch::seeState(const MetricRecord& record) {
   const auto message = decoded<KCellularWcdmaRrcConnectionState>(record);
   const auto before = states_.now();
   if (!how_.soak && before && message.state() != before) {
-    findings_.reach("UMTS " + nameOf(*before) + " > " + nameOf(message.state()));
+    findings_.reach("UMTS " + umtsStateName(*before) + " > " + umtsStateName(message.state()));
   }
   states_.becomes(message.state(), record.time);
 }
@@ -127,7 +127,7 @@ void UmtsWatch::seeMeasurement(const MetricRecord& record) {
   connectedMode_ = message.connectedMode();
   if (const auto state = states_.at(record.time); state && !how_.soak) {
     findings_.expect(Rule::kUmtsConnectedModeIsThatOfTheState, message.connectedMode() == isConnectedMode(*state));
-    findings_.reach("UMTS measured in " + nameOf(*state));
+    findings_.reach("UMTS measured in " + umtsStateName(*state));
   }
   for (const RxInfo& info : message.rxInfos()) {
     findings_.expectBetween(Rule::kUmtsRanges, info.rssi(), -100, -25);  // 3GPP TS 25.133, 9.1.3
@@ -141,7 +141,7 @@ void UmtsWatch::seeNeighbours(const MetricRecord& record) {
   for (const UtraCellMeasResult& result : message.measUtraResults()) {
     const CellName cell{result.uarfcn(), result.psc()};
     findings_.expect(Rule::kUmtsNeighbourIsNotTheServingCell, cell != serving_ && listed.insert(cell).second);
-    findings_.expect(Rule::kUmtsChannelInBand, inBand(result.uarfcn(), result.band()));
+    findings_.expect(Rule::kUmtsChannelInBand, isUarfcnInBand(result.uarfcn(), result.band()));
     findings_.expectBetween(Rule::kUmtsRanges, result.psc(), 0, 511);
     findings_.expectBetween(Rule::kUmtsRanges, result.rscp(), -5, 91);
     findings_.expectBetween(Rule::kUmtsRanges, result.ecno(), 0, 49);
