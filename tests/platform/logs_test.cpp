@@ -212,11 +212,9 @@ TEST(SystemLog, EachLineIsEchoedToStandardErrorInOneWrite) {
   const WriteWatch watch;
   const int before = ::dup(STDERR_FILENO);
   ASSERT_GE(::dup2(watch.writingEnd(), STDERR_FILENO), 0);
-  {
-    SystemLog log("probeview");
-    log.line("-[RadixWrapper listen]: listening for %s events");
-    log.line("dict=[\"apn\": \"\u009b31m\"]\n\x1b[2J");
-  }
+  // Lines that wait at the same time leave together; the end of a log waits until its own have left.
+  { SystemLog("probeview").line("-[RadixWrapper listen]: listening for %s events"); }
+  { SystemLog("probeview").line("dict=[\"apn\": \"\u009b31m\"]\n\x1b[2J"); }
   ::dup2(before, STDERR_FILENO);
   ::close(before);
   EXPECT_EQ(watch.writes(), (Writes{"-[RadixWrapper listen]: listening for %s events\n",
