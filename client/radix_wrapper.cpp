@@ -71,7 +71,7 @@ struct RadixWrapper::Shared {
     record.receivedMonotonicTime = clock.monotonicTime();
     if (const auto known = status.lastRecords.find(record.metricId); known != status.lastRecords.end()) {
       known->second = record;
-    } else if (status.lastRecords.size() < ServiceStatus::mostMetrics) {
+    } else if (status.lastRecords.size() < radix::mostMetrics) {
       status.lastRecords.emplace(record.metricId, record);
     }
     status.lastRecord = std::move(record);
@@ -87,7 +87,7 @@ struct RadixWrapper::Shared {
   static std::optional<std::chrono::milliseconds> span(const Dictionary& event, std::string_view key) {
     const auto given = milliseconds(event, key);
     if (!given) return std::nullopt;
-    return std::clamp(*given, std::chrono::milliseconds(0), radix::longestSpan);
+    return radix::boundedSpan(*given);
   }
 };
 

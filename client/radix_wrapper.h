@@ -39,12 +39,9 @@ struct ServiceStatus {
     std::optional<std::chrono::milliseconds> period{};
     std::int64_t metricId = 0;  // such as 0x3C4E04; 0 when the event names none
   };
-  // More metrics than there are: a service that invents identifiers does not fill the memory.
-  static constexpr std::size_t mostMetrics = 256;
-
   radix::client::ConnectionState connection;
   std::optional<LastRecord> lastRecord{};  // the last metric event that was handed to a delegate
-  // The last one of each metric, by its identifier; at most mostMetrics.
+  // The last one of each metric, by its identifier; at most radix::mostMetrics.
   std::map<std::int64_t, LastRecord> lastRecords{};
 };
 

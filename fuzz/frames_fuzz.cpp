@@ -12,6 +12,7 @@
 #include <vector>
 
 #include "platform/manual_loop.h"
+#include "radix/dictionary_bytes.h"
 #include "radix/frames.h"
 #include "radix/in_process_link.h"
 #include "service/service.h"

@@ -10,6 +10,7 @@
 #include <sstream>
 #include <string>
 
+#include "radix/dictionary_bytes.h"
 #include "radix/frames.h"
 #include "tests/support/harmless.h"
 #include "tools/record_text.h"

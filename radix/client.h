@@ -8,7 +8,9 @@
 // so; the manager reconnects by itself and then restores its configuration and its event delivery.
 #pragma once
 
+#include <algorithm>
 #include <chrono>
+#include <cstddef>
 #include <cstdint>
 #include <functional>
 #include <memory>
@@ -43,6 +45,17 @@ inline constexpr char kKeyPeriod[] = "kKeyPeriod";
 
 // Thirty years. What a service says beyond that is cut to it, so that sums of some of them fit into nanoseconds.
 inline constexpr std::chrono::milliseconds longestSpan{std::int64_t{30} * 365 * 24 * 3600 * 1000};
+
+// An age or a period as it is taken: not less than nothing, not more than longestSpan. Durations in nanoseconds or
+// coarser.
+template <typename Duration>
+constexpr Duration boundedSpan(Duration given) {
+  return std::clamp(given, Duration::zero(), Duration(longestSpan));
+}
+
+// More metrics than there are. Whatever is kept by metric has room for so many, so that a peer or a source that invents
+// identifiers does not fill the memory.
+inline constexpr std::size_t mostMetrics = 256;
 
 // What our programs call themselves in kKeyAppID.
 inline constexpr std::int64_t serviceAppId = 2;
@@ -107,7 +120,7 @@ struct SourceState {
   std::string origin;                 // as in kKeyOrigin; at most 1024 bytes
   Phase phase = Phase::Running;       // Ended: it has told all that it had, such as a trace that was played
   std::string reason;                 // why it failed, for people; at most 512 bytes
-  std::vector<std::int64_t> metrics;  // the identifiers of the metrics that it can fill, or could; at most 256
+  std::vector<std::int64_t> metrics;  // the identifiers of those it can fill, or could; at most mostMetrics
   friend bool operator==(const SourceState&, const SourceState&) = default;
 };
 

@@ -10,6 +10,7 @@
 
 #include "platform/guarded.h"
 #include "platform/system_log.h"
+#include "radix/dictionary_bytes.h"
 #include "radix/object.h"
 #include "radix/service_commands.h"
 #include "radix/waiting_events.h"
@@ -50,7 +51,7 @@ ObjectHandle makeEventObject(const Event& event, std::chrono::nanoseconds waited
   if (event.kind == EventKind::Metric) {
     if (event.age) {
       const auto age = *event.age + std::chrono::duration_cast<std::chrono::milliseconds>(waited);
-      content.append(kKeyAge, number(std::min(age, longestSpan).count()));
+      content.append(kKeyAge, number(boundedSpan(age).count()));
     }
     if (event.period) content.append(kKeyPeriod, number(event.period->count()));
   }

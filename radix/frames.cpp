@@ -2,7 +2,6 @@
 #include "radix/frames.h"
 
 #include <algorithm>
-#include <bit>
 #include <memory>
 #include <utility>
 
@@ -26,26 +25,15 @@ PB_DEFINE(MetricFrame)
 PB_DEFINE(SourceFrame)
 PB_DEFINE(SourcesFrame)
 PB_DEFINE(Frame)
-PB_DEFINE(Item)
-PB_DEFINE(Items)
 
 }  // namespace wire
 
 namespace {
 
 using probeview::beginningOf;
-using probeview::Dictionary;
-using probeview::Key;
-using probeview::List;
 using probeview::PBDataReader;
 using probeview::PBDataWriter;
 using probeview::Shared;
-using probeview::Value;
-using probeview::ValueKind;
-using wire::ItemKind;
-
-// Deeper than any command or reply is nested.
-constexpr int deepestNesting = 16;
 
 FrameBytes bytesOf(const wire::Frame& frame) {
   PBDataWriter writer;
@@ -58,152 +46,10 @@ std::int64_t signedOf(std::uint64_t number) { return static_cast<std::int64_t>(n
 
 std::vector<std::uint8_t> copyOf(std::span<const std::uint8_t> bytes) { return {bytes.begin(), bytes.end()}; }
 
-std::span<const std::uint8_t> bytesOf(std::string_view text) {
-  return {reinterpret_cast<const std::uint8_t*>(text.data()), text.size()};
-}
-
-std::string_view textOf(std::span<const std::uint8_t> bytes) {
-  return {reinterpret_cast<const char*>(bytes.data()), bytes.size()};
-}
-
-std::vector<std::uint8_t> encodeItems(const wire::Items& items) {
-  PBDataWriter writer;
-  items.writeTo(writer);
-  return writer.takeBytes();
-}
-
-void fill(wire::Item& item, const Value& value);
-
-std::vector<std::uint8_t> encodeList(const List& list) {
-  wire::Items items;
-  for (const Value& value : list) fill(items.addItem(), value);
-  return encodeItems(items);
-}
-
-void setNumber(wire::Item& item, ItemKind kind, std::uint64_t number) {
-  item.setKind(static_cast<std::uint32_t>(kind));
-  item.setNumber(number);
-}
-
-void setContent(wire::Item& item, ItemKind kind, std::span<const std::uint8_t> content) {
-  item.setKind(static_cast<std::uint32_t>(kind));
-  item.setContent(content);
-}
-
-void fill(wire::Item& item, const Value& value) {
-  switch (value.kind()) {
-    case ValueKind::Int32:
-      return setNumber(item, ItemKind::Int32, unsignedOf(value.rawInt32()));
-    case ValueKind::UInt32:
-      return setNumber(item, ItemKind::UInt32, value.rawUInt32());
-    case ValueKind::Int64:
-      return setNumber(item, ItemKind::Int64, unsignedOf(value.rawInt64()));
-    case ValueKind::UInt64:
-      return setNumber(item, ItemKind::UInt64, value.rawUInt64());
-    case ValueKind::Bool:
-      return setNumber(item, ItemKind::Bool, value.rawBool() ? 1 : 0);
-    case ValueKind::Float:
-      return setNumber(item, ItemKind::Float, std::bit_cast<std::uint32_t>(value.rawFloat()));
-    case ValueKind::Double:
-      return setNumber(item, ItemKind::Double, std::bit_cast<std::uint64_t>(value.rawDouble()));
-    case ValueKind::Text:
-      return setContent(item, ItemKind::Text, bytesOf(value.rawText()));
-    case ValueKind::Bytes:
-      return setContent(item, ItemKind::Bytes, *value.bytes());
-    case ValueKind::List:
-      return setContent(item, ItemKind::List, encodeList(*value.list()));
-    case ValueKind::Dictionary:
-      return setContent(item, ItemKind::Dictionary, encodeDictionary(*value.dictionary()));
-  }
-}
-
-// False when the bytes are neither a list nor a dictionary.
-bool readItems(std::span<const std::uint8_t> bytes, wire::Items& items) {
-  PBDataReader reader(bytes);
-  return items.readFrom(reader);
-}
-
-enum class Reading { Understood, Unknown, Malformed };
-
-// Each takes so many levels below itself and no more.
-bool readList(std::span<const std::uint8_t> bytes, int depth, List& list);
-bool readDictionary(std::span<const std::uint8_t> bytes, int depth, Dictionary& dictionary);
-
-Reading read(const wire::Item& item, int depth, Value& value) {
-  const std::uint64_t number = item.number();
-  switch (static_cast<ItemKind>(item.kind())) {
-    case ItemKind::Int32:
-      value = static_cast<std::int32_t>(number);
-      return Reading::Understood;
-    case ItemKind::UInt32:
-      value = static_cast<std::uint32_t>(number);
-      return Reading::Understood;
-    case ItemKind::Int64:
-      value = signedOf(number);
-      return Reading::Understood;
-    case ItemKind::UInt64:
-      value = number;
-      return Reading::Understood;
-    case ItemKind::Bool:
-      value = number != 0;
-      return Reading::Understood;
-    case ItemKind::Float:
-      value = std::bit_cast<float>(static_cast<std::uint32_t>(number));
-      return Reading::Understood;
-    case ItemKind::Double:
-      value = std::bit_cast<double>(number);
-      return Reading::Understood;
-    case ItemKind::Text:
-      value = Value::text(textOf(item.content()));
-      return Reading::Understood;
-    case ItemKind::Bytes:
-      value = Value::bytes(item.content());
-      return Reading::Understood;
-    case ItemKind::List: {
-      List list;
-      if (depth == 0 || !readList(item.content(), depth - 1, list)) return Reading::Malformed;
-      value = std::move(list);
-      return Reading::Understood;
-    }
-    case ItemKind::Dictionary: {
-      Dictionary dictionary;
-      if (depth == 0 || !readDictionary(item.content(), depth - 1, dictionary)) return Reading::Malformed;
-      value = std::move(dictionary);
-      return Reading::Understood;
-    }
-  }
-  return Reading::Unknown;
-}
-
-bool readList(std::span<const std::uint8_t> bytes, int depth, List& list) {
-  wire::Items items;
-  if (!readItems(bytes, items)) return false;
-  for (const wire::Item& item : items.items()) {
-    Value value;
-    const Reading reading = read(item, depth, value);
-    if (reading == Reading::Malformed) return false;
-    if (reading == Reading::Understood) list.append(std::move(value));
-  }
-  return true;
-}
-
-bool readDictionary(std::span<const std::uint8_t> bytes, int depth, Dictionary& dictionary) {
-  wire::Items items;
-  if (!readItems(bytes, items)) return false;
-  for (const wire::Item& item : items.items()) {
-    Value value;
-    const Reading reading = read(item, depth, value);
-    if (reading == Reading::Malformed) return false;
-    if (reading == Reading::Understood) dictionary.append(Key::copy(item.key()), std::move(value));
-  }
-  return true;
-}
-
 // What a peer says may be any number.
 std::optional<std::chrono::milliseconds> spanOf(bool isThere, std::uint64_t milliseconds) {
   if (!isThere) return std::nullopt;
-  const auto longest = static_cast<std::uint64_t>(longestSpan.count());
-  return std::chrono::milliseconds(signedOf(std::min(milliseconds, longest)));
+  return boundedSpan(std::chrono::duration<std::uint64_t, std::milli>(milliseconds));
 }
 
 client::SourceState::Phase phaseOf(std::uint32_t number) {
@@ -337,10 +183,9 @@ FrameBytes encode(const Sources& sources) {
 
 Trailer ageTrailer(std::chrono::nanoseconds age) {
   constexpr std::uint8_t keyOfAge = 9 << 3;  // wire::Frame's field, a varint
-  const auto milliseconds = std::chrono::duration_cast<std::chrono::milliseconds>(age).count();
   Trailer trailer;
   trailer.bytes[trailer.size++] = keyOfAge;
-  auto rest = static_cast<std::uint64_t>(std::clamp<std::int64_t>(milliseconds, 0, longestSpan.count()));
+  auto rest = unsignedOf(std::chrono::duration_cast<std::chrono::milliseconds>(boundedSpan(age)).count());
   for (; rest >= 0x80; rest >>= 7) trailer.bytes[trailer.size++] = static_cast<std::uint8_t>(0x80 | (rest & 0x7F));
   trailer.bytes[trailer.size++] = static_cast<std::uint8_t>(rest);
   return trailer;
@@ -396,22 +241,6 @@ bool decodeFrame(std::span<const std::uint8_t> bytes, FrameHandler& handler) {
     handler.onSources(sourcesOf(*sources));
   }
   return true;
-}
-
-std::vector<std::uint8_t> encodeDictionary(const Dictionary& dictionary) {
-  wire::Items items;
-  for (const auto& [key, value] : dictionary) {
-    wire::Item& item = items.addItem();
-    item.setKey(key.text());
-    fill(item, value);
-  }
-  return encodeItems(items);
-}
-
-std::optional<Dictionary> decodeDictionary(std::span<const std::uint8_t> bytes) {
-  std::optional<Dictionary> dictionary(std::in_place);
-  if (!readDictionary(bytes, deepestNesting, *dictionary)) dictionary.reset();
-  return dictionary;
 }
 
 }  // namespace radix

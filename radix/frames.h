@@ -27,7 +27,6 @@
 
 #include "radix/client.h"
 #include "radix/link.h"
-#include "values/dictionary.h"
 
 namespace radix {
 
@@ -46,14 +45,14 @@ struct Hello {
 struct Command {
   std::uint32_t sequence = 0;  // chosen by the client; the reply bears it
   std::string name{};
-  std::vector<std::uint8_t> arguments{};  // encoded by encodeDictionary()
+  std::vector<std::uint8_t> arguments{};  // of radix/dictionary_bytes.h
 };
 
 struct Reply {
   std::uint32_t sequence = 0;
   std::int32_t status = 0;
   std::string message{};
-  std::vector<std::uint8_t> content{};  // encoded by encodeDictionary()
+  std::vector<std::uint8_t> content{};  // of radix/dictionary_bytes.h
 };
 
 // Whether the client takes events from now on.
@@ -133,10 +132,5 @@ class FrameHandler {
 // Hands the content to the handler. False when the bytes are no frame, as no bytes are; nothing has been handed over
 // then.
 bool decodeFrame(std::span<const std::uint8_t> bytes, FrameHandler& handler);
-
-// Dictionaries of commands and replies, with their order and the exact type of each value. Entries of types that the
-// reader does not know are left out. Absent when the bytes are no dictionary, or one nested deeper than anybody needs.
-std::vector<std::uint8_t> encodeDictionary(const probeview::Dictionary& dictionary);
-std::optional<probeview::Dictionary> decodeDictionary(std::span<const std::uint8_t> bytes);
 
 }  // namespace radix

@@ -7,6 +7,7 @@
 #include <map>
 #include <utility>
 
+#include "radix/client.h"
 #include "radix/link.h"
 
 namespace probeview {
@@ -15,9 +16,6 @@ namespace probeview {
 // of its own, by which sessions know what they have sent.
 class LastRecords {
  public:
-  // More metrics than there are; a source that invents identifiers does not fill the memory.
-  static constexpr std::size_t mostMetrics = 256;
-
   struct Record {
     std::int64_t metricId;
     radix::FrameBytes frame;
@@ -32,7 +30,7 @@ class LastRecords {
       place.key() = known->second = ++arrived_;
       place.mapped() = std::move(record);
       records_.insert(records_.end(), std::move(place));
-    } else if (arrivals_.size() < mostMetrics) {
+    } else if (arrivals_.size() < radix::mostMetrics) {
       arrivals_.emplace(record.metricId, ++arrived_);
       records_.emplace_hint(records_.end(), arrived_, std::move(record));
     } else {

@@ -4,21 +4,16 @@
 #include <algorithm>
 #include <utility>
 
+#include "radix/client.h"
 #include "radix/frames.h"
 
 namespace probeview {
 
-namespace {
-
-// Queues of metrics of which nothing waits are kept for the next record; not for more metrics than there are.
-constexpr std::size_t mostMetricsKnown = 256;
-
-}  // namespace
-
 void Outbox::addRecord(Record record) {
   const std::size_t size = record.frame->size();
   if (records_ + 1 > limits_.records || bytes_ + size > limits_.bytes) makeRoom(record.metricId, size);
-  if (ofMetric_.size() > mostMetricsKnown) {
+  // Queues of metrics of which nothing waits are kept for the next record, within bounds.
+  if (ofMetric_.size() > radix::mostMetrics) {
     std::erase_if(ofMetric_, [](const auto& one) { return one.second.empty(); });
   }
   ofMetric_[record.metricId].push_back(firstNumber_ + queue_.size());

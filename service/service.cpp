@@ -7,6 +7,7 @@
 
 #include "messages/metric_identifiers.h"
 #include "radix/client.h"
+#include "radix/dictionary_bytes.h"
 #include "radix/service_commands.h"
 #include "radix/status.h"
 #include "service/payload_check.h"

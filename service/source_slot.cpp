@@ -115,9 +115,8 @@ void SourceSlot::emit(MetricRecord record) {
   }
   if (record.origin.empty()) record.origin = origin_;
   record.origin.resize(beginningOf(record.origin, radix::longestOrigin).size());
-  constexpr std::chrono::nanoseconds longestAge = radix::longestSpan;
-  record.age = std::clamp(record.age, std::chrono::nanoseconds(0), longestAge);
-  record.period = std::clamp(record.period, std::chrono::milliseconds(0), radix::longestSpan);
+  record.age = radix::boundedSpan(record.age);
+  record.period = radix::boundedSpan(record.period);
   const std::chrono::nanoseconds now = worker_.clock().monotonicTime();
   ++records_;
   rate_.add(now);

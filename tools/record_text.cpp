@@ -64,7 +64,7 @@ std::optional<std::string> RecordText::changedLine(const Dictionary& event) {
   Last now{content.value_or(Dictionary{}), payload != nullptr && payload->bytes() ? printed(*payload) : std::string()};
   const auto known = last_.find(id);
   if (known == last_.end()) {
-    if (last_.size() == mostMetrics) last_.clear();
+    if (last_.size() == radix::mostMetrics) last_.clear();
     last_.emplace(id, std::move(now));
     return line(event, std::move(content), {});
   }

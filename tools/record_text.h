@@ -36,9 +36,6 @@ class RecordText {
     Dictionary content;
     std::string payload;
   };
-  // More metrics than there are; a service may make up as many as it likes.
-  static constexpr std::size_t mostMetrics = 256;
-
   std::string line(const Dictionary& event, std::optional<Dictionary> content, const List& gone);
 
   Options options_;

@@ -334,7 +334,7 @@ TEST_F(RadixWrapperTest, TheServiceStatusKeepsTheLastRecordOfEachMetricWithAgeAn
   EXPECT_EQ(wrapper_.serviceStatus().lastRecords.at(2).period, std::chrono::milliseconds(0));
   // One that invents metrics does not fill the memory.
   for (std::int64_t metric = 0; metric < 1000; ++metric) send(metric, "modem", 0, 0);
-  EXPECT_EQ(wrapper_.serviceStatus().lastRecords.size(), ServiceStatus::mostMetrics);
+  EXPECT_EQ(wrapper_.serviceStatus().lastRecords.size(), radix::mostMetrics);
   EXPECT_EQ(wrapper_.serviceStatus().lastRecord->metricId, 999);
 }
 

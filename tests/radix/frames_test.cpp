@@ -8,6 +8,7 @@
 #include <vector>
 
 #include "messages/runtime/data_writer.h"
+#include "radix/dictionary_bytes.h"
 #include "radix/frame_tables.h"
 
 namespace radix {
@@ -149,7 +150,7 @@ TEST(Frames, HoweverMuchIsSaidOfTheSourcesItFitsIntoAFrame) {
   EXPECT_LE(got.size(), Sources::most);
   EXPECT_EQ(got[0].origin, std::string(Sources::longestOrigin, 'o'));
   EXPECT_EQ(got[0].reason, std::string(Sources::longestReason, 'r'));
-  EXPECT_EQ(got[0].metrics.size(), Sources::mostMetrics);
+  EXPECT_EQ(got[0].metrics.size(), mostMetrics);
   // A peer that keeps to nothing of this is cut by whoever hears it.
   auto content = probeview::Shared<wire::SourcesFrame>::make();
   for (std::size_t count = 0; count < 100; ++count) {
@@ -168,7 +169,7 @@ TEST(Frames, HoweverMuchIsSaidOfTheSourcesItFitsIntoAFrame) {
   ASSERT_TRUE(decodeFrame(writer.takeBytes(), recorder));
   ASSERT_EQ(recorder.sources.states.size(), Sources::most);
   EXPECT_EQ(recorder.sources.states[0].origin.size(), Sources::longestOrigin);
-  EXPECT_EQ(recorder.sources.states[0].metrics.size(), Sources::mostMetrics);
+  EXPECT_EQ(recorder.sources.states[0].metrics.size(), mostMetrics);
   EXPECT_EQ(recorder.sources.states[0].phase, client::SourceState::Phase::Running) << "of a later version";
 }
 

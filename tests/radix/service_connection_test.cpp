@@ -13,6 +13,7 @@
 #include "platform/manual_loop.h"
 #include "platform/system_log.h"
 #include "radix/connection_manager.h"
+#include "radix/dictionary_bytes.h"
 #include "radix/in_process_link.h"
 
 namespace radix::client {

@@ -12,6 +12,7 @@
 #include "messages/metric_identifiers.h"
 #include "platform/manual_loop.h"
 #include "radix/connection_manager.h"
+#include "radix/dictionary_bytes.h"
 #include "radix/in_process_link.h"
 #include "radix/service_commands.h"
 #include "radix/status.h"

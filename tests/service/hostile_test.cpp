@@ -8,6 +8,7 @@
 #include <vector>
 
 #include "messages/metric_identifiers.h"
+#include "radix/dictionary_bytes.h"
 #include "radix/service_commands.h"
 #include "radix/status.h"
 #include "tests/service/harness/raw_client.h"

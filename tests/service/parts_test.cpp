@@ -68,12 +68,12 @@ TEST(LastRecords, KeepTheLastOfEachMetricInTheOrderOfArrival) {
 TEST(LastRecords, KeepAsManyMetricsAsTheLimitSaysAndNotOneMore) {
   LastRecords records;
   const auto frame = std::make_shared<const std::vector<std::uint8_t>>(1);
-  for (std::size_t metric = 0; metric < LastRecords::mostMetrics; ++metric) {
+  for (std::size_t metric = 0; metric < radix::mostMetrics; ++metric) {
     records.keep({static_cast<std::int64_t>(metric), frame});
   }
-  EXPECT_EQ(records.records().size(), LastRecords::mostMetrics);
+  EXPECT_EQ(records.records().size(), radix::mostMetrics);
   EXPECT_EQ(records.keep({-1, frame}), 0U);
-  EXPECT_EQ(records.records().size(), LastRecords::mostMetrics);
+  EXPECT_EQ(records.records().size(), radix::mostMetrics);
   records.keep({0, frame});
   EXPECT_EQ(metricsOf(records).back(), 0);
 }

@@ -8,6 +8,7 @@
 #include <vector>
 
 #include "platform/loop_thread.h"
+#include "radix/dictionary_bytes.h"
 #include "radix/frames.h"
 #include "service/socket_listener.h"
 #include "tests/service/harness/scripted_source.h"
