@@ -68,7 +68,7 @@ struct RadixWrapper::Shared {
     record.age = span(event, radix::kKeyAge);
     record.period = span(event, radix::kKeyPeriod);
     record.receivedWallTime = clock.wallTime();
-    record.receivedMonotonicTime = clock.monotonicTime();
+    record.receivedAgeTime = clock.ageTime();
     if (const auto known = status.lastRecords.find(record.metricId); known != status.lastRecords.end()) {
       known->second = record;
     } else if (status.lastRecords.size() < radix::mostMetrics) {

@@ -27,12 +27,12 @@ using radix::client::ConfigurationOutcome;
 // saying why values stand still.
 struct ServiceStatus {
   struct LastRecord {
-    std::string origin;                                // such as "scenario:city"; empty when the event names none
-    std::optional<std::chrono::milliseconds> time;     // when it was measured, since 1970-01-01 UTC
-    std::chrono::milliseconds receivedWallTime{};      // when it reached the main thread, since 1970-01-01 UTC
-    std::chrono::nanoseconds receivedMonotonicTime{};  // the same moment on the clock that only goes forward
+    std::string origin;                             // such as "scenario:city"; empty when the event names none
+    std::optional<std::chrono::milliseconds> time;  // when it was measured, since 1970-01-01 UTC
+    std::chrono::milliseconds receivedWallTime{};   // when it reached the main thread, since 1970-01-01 UTC
+    std::chrono::nanoseconds receivedAgeTime{};     // the same moment on the clock by which things grow older
     // How old it was when it left the service, 0 to radix::longestSpan; absent when the service does not say. From then
-    // on it has grown older by what has gone by since receivedMonotonicTime.
+    // on it has grown older by what has gone by since receivedAgeTime.
     std::optional<std::chrono::milliseconds> age{};
     // Its source's period for the metric, 0 to radix::longestSpan; 0: on change, or asked for once. Absent when the
     // service does not say.

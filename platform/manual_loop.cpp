@@ -71,6 +71,11 @@ std::chrono::milliseconds ManualLoop::wallTime() const {
 
 void ManualLoop::setWallTime(std::chrono::milliseconds wallTime) { wallOffset_ = wallTime - now_; }
 
+void ManualLoop::sleep(std::chrono::nanoseconds time) {
+  slept_ += time;
+  wallOffset_ += time;
+}
+
 bool ManualLoop::runOne() {
   Task task;
   {

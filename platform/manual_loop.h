@@ -31,8 +31,11 @@ class ManualLoop final : public Worker, public Clock {
 
   std::chrono::milliseconds wallTime() const override;
   std::chrono::nanoseconds monotonicTime() const override { return now_; }
+  std::chrono::nanoseconds ageTime() const override { return now_ + slept_; }
   // Lets the time of day jump; the monotonic time goes on as before.
   void setWallTime(std::chrono::milliseconds wallTime);
+  // Lets the device sleep: the time of day and ages go on, the monotonic time and with it all timers stand still.
+  void sleep(std::chrono::nanoseconds time);
 
   // Runs the next posted task; whether there was one.
   bool runOne();
@@ -55,6 +58,8 @@ class ManualLoop final : public Worker, public Clock {
   std::unique_ptr<Inbox> inbox_;
   TimerQueue timers_;
   std::chrono::nanoseconds now_{std::chrono::hours(1)};
+  // More than nothing, so that whoever takes one clock for the other is found out.
+  std::chrono::nanoseconds slept_{std::chrono::hours(1000)};
   std::chrono::nanoseconds wallOffset_;
 };
 

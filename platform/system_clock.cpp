@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "platform/clock.h"
 
+#include <time.h>
+
 namespace probeview {
 
 namespace {
@@ -12,6 +14,12 @@ class SystemClock final : public Clock {
   }
   std::chrono::nanoseconds monotonicTime() const override {
     return std::chrono::duration_cast<std::chrono::nanoseconds>(std::chrono::steady_clock::now().time_since_epoch());
+  }
+  std::chrono::nanoseconds ageTime() const override {
+    // std::chrono knows no clock that counts a suspended machine's time.
+    timespec now{};
+    ::clock_gettime(CLOCK_BOOTTIME, &now);
+    return std::chrono::seconds(now.tv_sec) + std::chrono::nanoseconds(now.tv_nsec);
   }
 };
 

@@ -90,11 +90,11 @@ class EventRoad : public std::enable_shared_from_this<EventRoad> {
   // On the worker.
   void deliver(TaskQueue& queue, std::vector<Event> events, const std::shared_ptr<ServiceConnection>& connection) {
     EventHold hold = waiting_->add(events, connection);
-    queue.post([self = shared_from_this(),
-                batch = Batch{std::move(events), std::move(hold), clock_.monotonicTime()}]() mutable {
-      self->batches_.push_back(std::move(batch));
-      self->handOver();
-    });
+    queue.post(
+        [self = shared_from_this(), batch = Batch{std::move(events), std::move(hold), clock_.ageTime()}]() mutable {
+          self->batches_.push_back(std::move(batch));
+          self->handOver();
+        });
   }
 
  private:
@@ -102,7 +102,7 @@ class EventRoad : public std::enable_shared_from_this<EventRoad> {
   struct Batch {
     std::vector<Event> events;
     EventHold hold;
-    std::chrono::nanoseconds arrived{};  // on the clock that only goes forward
+    std::chrono::nanoseconds arrived{};  // by Clock::ageTime()
     std::size_t handedOver = 0;
   };
 
@@ -131,7 +131,7 @@ class EventRoad : public std::enable_shared_from_this<EventRoad> {
     if (!handlers) return;
     const auto found = handlers->find(event.kind == EventKind::Trigger ? kEventTrigger : kEventMetric);
     if (found == handlers->end() || !found->second) return;
-    found->second(makeEventObject(event, clock_.monotonicTime() - batch.arrived, batch.hold), event.group);
+    found->second(makeEventObject(event, clock_.ageTime() - batch.arrived, batch.hold), event.group);
   }
 
   std::shared_ptr<WaitingEvents> waiting_;

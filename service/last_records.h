@@ -19,7 +19,7 @@ class LastRecords {
   struct Record {
     std::int64_t metricId;
     radix::FrameBytes frame;
-    std::chrono::nanoseconds born{};  // when its values were new, on the monotonic clock
+    std::chrono::nanoseconds born{};  // when its values were new, by Clock::ageTime()
   };
 
   // The record's number, from 1; 0 when it is not kept.

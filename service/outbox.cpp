@@ -77,7 +77,7 @@ void Outbox::discard(const std::function<bool(const Record& record)>& isUnwanted
   if (any) closeHoles();
 }
 
-std::size_t Outbox::next(std::span<radix::OutgoingFrame> frames, std::chrono::nanoseconds now) {
+std::size_t Outbox::next(std::span<radix::OutgoingFrame> frames, std::chrono::nanoseconds ageTime) {
   if (lost_ != told_) {
     words_.push_back(radix::encode(radix::Dropped{lost_ - told_}));
     told_ = lost_;
@@ -90,7 +90,7 @@ std::size_t Outbox::next(std::span<radix::OutgoingFrame> frames, std::chrono::na
   }
   for (const Record& entry : queue_) {
     if (count == frames.size()) break;
-    if (entry.frame != nullptr) frames[count++] = {entry.frame, radix::ageTrailer(now - entry.born)};
+    if (entry.frame != nullptr) frames[count++] = {entry.frame, radix::ageTrailer(ageTime - entry.born)};
   }
   return count;
 }

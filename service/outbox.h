@@ -28,7 +28,7 @@ class Outbox {
   struct Record {
     std::int64_t metricId = 0;
     radix::FrameBytes frame{};
-    std::chrono::nanoseconds born{};  // when its values were new, on the monotonic clock
+    std::chrono::nanoseconds born{};  // when its values were new, by Clock::ageTime()
     std::uint64_t number = 0;         // as LastRecords gives it
     bool isAnswer = false;            // to the client's own query
   };
@@ -41,8 +41,8 @@ class Outbox {
   void discard(const std::function<bool(const Record& record)>& isUnwanted);
 
   // Copies the next frames, as many as fit and are there; how many. An account of new losses comes before the records,
-  // and behind each record its age at this moment.
-  std::size_t next(std::span<radix::OutgoingFrame> frames, std::chrono::nanoseconds now);
+  // and behind each record its age at this moment, which is one of Clock::ageTime().
+  std::size_t next(std::span<radix::OutgoingFrame> frames, std::chrono::nanoseconds ageTime);
   // Takes away so many of those that next() has given.
   void sent(std::size_t count);
 

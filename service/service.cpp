@@ -315,7 +315,7 @@ void Service::removeEnded() {
 }
 
 void Service::route(std::size_t source, MetricRecord record, std::chrono::nanoseconds now) {
-  LastRecords::Record kept{.metricId = record.metricId, .frame = {}, .born = now - record.age};
+  LastRecords::Record kept{.metricId = record.metricId, .frame = {}, .born = worker_.clock().ageTime() - record.age};
   kept.frame = radix::encode(radix::Event{.kind = radix::EventKind::Metric,
                                           .metricId = record.metricId,
                                           .payload = std::move(record.payload),

@@ -307,7 +307,7 @@ void Session::flush() {
   lastFlush_ = worker_.clock().monotonicTime();
   std::array<radix::OutgoingFrame, framesPerFlush> frames;
   while (!blocked_ && link_ && !outbox_.empty()) {
-    const std::size_t count = outbox_.next(frames, lastFlush_);
+    const std::size_t count = outbox_.next(frames, worker_.clock().ageTime());
     const std::size_t taken = link_->send({frames.data(), count});
     outbox_.sent(taken);
     if (taken < count) blocked_ = true;

@@ -121,7 +121,7 @@ void SourceSlot::emit(MetricRecord record) {
   ++records_;
   rate_.add(now);
   lastRecord_ = record.time;
-  lastRecordBorn_ = now - record.age;
+  lastRecordBorn_ = worker_.clock().ageTime() - record.age;
   ears_.record(std::move(record), now);
 }
 

@@ -46,9 +46,9 @@ class SourceSlot final : MetricSink {
   std::uint64_t records() const { return records_; }
   std::uint64_t withheld() const { return withheld_; }
   double recordsPerSecond() const;
-  // Wall time of the last record, if there was one; and how old its values are by now, by the monotonic clock.
+  // Wall time of the last record, if there was one; and how old its values are by now.
   const std::optional<std::chrono::milliseconds>& lastRecord() const { return lastRecord_; }
-  std::chrono::nanoseconds lastRecordAge() const { return worker_.clock().monotonicTime() - lastRecordBorn_; }
+  std::chrono::nanoseconds lastRecordAge() const { return worker_.clock().ageTime() - lastRecordBorn_; }
 
  private:
   class GuardedScheduler;
@@ -76,7 +76,7 @@ class SourceSlot final : MetricSink {
   RateMeter rate_;
   std::chrono::nanoseconds started_;
   std::optional<std::chrono::milliseconds> lastRecord_;
-  std::chrono::nanoseconds lastRecordBorn_{};
+  std::chrono::nanoseconds lastRecordBorn_{};  // by Clock::ageTime()
   std::shared_ptr<bool> alive_;
 };
 

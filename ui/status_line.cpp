@@ -171,7 +171,7 @@ Status StatusLine::filled(const ServiceStatus& service, const Record& record) co
 }
 
 std::chrono::nanoseconds StatusLine::ageOf(const Record& record) const {
-  return record.age.value_or(std::chrono::milliseconds(0)) + clock_.monotonicTime() - record.receivedMonotonicTime;
+  return record.age.value_or(std::chrono::milliseconds(0)) + clock_.ageTime() - record.receivedAgeTime;
 }
 
 bool StatusLine::isStale(const Record& record) const {

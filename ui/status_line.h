@@ -26,8 +26,8 @@ struct StatusFacts {
 // Puts into one line why the page above it moves or stands still: whether the service is there and has taken the
 // configuration, which source fills the page, how old its values are and whether more are to come. The youngest record
 // of the page's metrics counts. Times of day are local; a record's age is how old it was when it left the service and
-// what has gone by since, on the clock that only goes forward; where the service does not say, when it was received is
-// told instead. Main thread.
+// what has gone by since, asleep or awake; where the service does not say, when it was received is told instead. Of a
+// service that does not tell all its sources the line concludes nothing from what it does not tell. Main thread.
 //
 //   scenario:city · 0.4 s ago
 //   nothing received yet from scenario:city

@@ -21,7 +21,7 @@ void MetricPacer::offer(MetricRecord record) {
   const std::int64_t metricId = record.metricId;
   Entry& entry = entries_[metricId];
   entry.latest = std::move(record);
-  entry.offeredAt = clock_.monotonicTime();
+  entry.offeredAt = clock_.ageTime();
   entry.waiting = true;
   passOrWait(metricId, entry);
 }
@@ -63,7 +63,7 @@ void MetricPacer::pass(Entry& entry) {
   entry.timer.reset();
   MetricRecord record = entry.latest;
   record.period = periodOf(record);
-  record.age += *entry.passedAt - entry.offeredAt;
+  record.age += clock_.ageTime() - entry.offeredAt;
   sink_.emit(std::move(record));
 }
 

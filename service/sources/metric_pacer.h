@@ -35,9 +35,9 @@ class MetricPacer {
  private:
   struct Entry {
     MetricRecord latest;
-    std::chrono::nanoseconds offeredAt{};
-    bool waiting = false;  // the latest has not been passed on, but is to be
-    std::optional<std::chrono::nanoseconds> passedAt;
+    std::chrono::nanoseconds offeredAt{};              // by Clock::ageTime()
+    bool waiting = false;                              // the latest has not been passed on, but is to be
+    std::optional<std::chrono::nanoseconds> passedAt;  // by Clock::monotonicTime()
     ScheduledTaskHandle timer;
   };
 

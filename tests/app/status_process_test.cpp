@@ -61,7 +61,7 @@ TEST_F(RealStatus, ATraceThatWasPlayedHasEndedAndCannotFillWhatItHasNoColumnsFor
   // Whoever comes later finds the trace ended, too, and its records no younger.
   const auto age = [](Session& of) {
     const auto& last = *of.wrapper.serviceStatus().lastRecord;
-    return last.age.value_or(0ms) + (systemClock().monotonicTime() - last.receivedMonotonicTime);
+    return last.age.value_or(0ms) + (systemClock().ageTime() - last.receivedAgeTime);
   };
   const auto before = age(session);
   Session later;

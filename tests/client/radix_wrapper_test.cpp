@@ -300,7 +300,7 @@ TEST_F(RadixWrapperTest, TheServiceStatusTellsTheConnectionAndTheLastRecord) {
   EXPECT_EQ(status.lastRecord->origin, "scenario:city");
   EXPECT_EQ(status.lastRecord->time, std::chrono::milliseconds(1709640000123));
   EXPECT_EQ(status.lastRecord->receivedWallTime, ManualLoop::defaultWallTime);
-  EXPECT_EQ(main_.monotonicTime() - status.lastRecord->receivedMonotonicTime, std::chrono::milliseconds(400));
+  EXPECT_EQ(main_.ageTime() - status.lastRecord->receivedAgeTime, std::chrono::milliseconds(400));
 }
 
 TEST_F(RadixWrapperTest, TheServiceStatusKeepsTheLastRecordOfEachMetricWithAgeAndPeriod) {
@@ -336,6 +336,16 @@ TEST_F(RadixWrapperTest, TheServiceStatusKeepsTheLastRecordOfEachMetricWithAgeAn
   for (std::int64_t metric = 0; metric < 1000; ++metric) send(metric, "modem", 0, 0);
   EXPECT_EQ(wrapper_.serviceStatus().lastRecords.size(), radix::mostMetrics);
   EXPECT_EQ(wrapper_.serviceStatus().lastRecord->metricId, 999);
+}
+
+TEST_F(RadixWrapperTest, WhenARecordCameIsKeptOnTheClockThatCountsTheTimeAsleep) {
+  const auto delegate = std::make_shared<NotedDelegate>();
+  wrapper_.setDelegate(delegate);
+  wrapper_.listen();
+  manager_->send(radix::kEventMetric, {{"kKeyMetricID", std::int64_t{1}}});
+  main_.run();
+  main_.sleep(std::chrono::hours(8));
+  EXPECT_EQ(main_.ageTime() - wrapper_.serviceStatus().lastRecord->receivedAgeTime, std::chrono::hours(8));
 }
 
 TEST_F(RadixWrapperTest, WhatTheSourcesCanFillIsKnownWithoutACommand) {

@@ -2,6 +2,7 @@
 #include <gtest/gtest.h>
 #include <signal.h>
 #include <sys/socket.h>
+#include <time.h>
 #include <unistd.h>
 
 #include <atomic>
@@ -101,6 +102,36 @@ TEST(ManualLoop, TheTimeOfDayMayJumpWhileTheMonotonicTimeGoesOn) {
   loop.setWallTime(milliseconds(5));
   EXPECT_EQ(loop.wallTime(), milliseconds(5));
   EXPECT_EQ(loop.monotonicTime(), before);
+}
+
+TEST(ManualLoop, WhileTheDeviceSleepsTheTimeOfDayAndAgesGoOnAndTimersWait) {
+  ManualLoop loop;
+  bool ran = false;
+  const auto timer = loop.after(milliseconds(5), [&] { ran = true; });
+  const auto monotonic = loop.monotonicTime();
+  const auto age = loop.ageTime();
+  const auto wall = loop.wallTime();
+  loop.sleep(hours(8));
+  loop.advance(milliseconds(4));
+  EXPECT_FALSE(ran);
+  EXPECT_EQ(loop.monotonicTime() - monotonic, milliseconds(4));
+  EXPECT_EQ(loop.ageTime() - age, hours(8) + milliseconds(4));
+  EXPECT_EQ(loop.wallTime() - wall, hours(8) + milliseconds(4));
+  loop.advance(milliseconds(1));
+  EXPECT_TRUE(ran);
+}
+
+// On a machine that has never slept since it was started all clocks of this kind agree.
+TEST(SystemClock, AgesGoByTheClockThatCountsTheTimeAsleep) {
+  const auto sinceBoot = [] {
+    timespec now{};
+    ::clock_gettime(CLOCK_BOOTTIME, &now);
+    return seconds(now.tv_sec) + nanoseconds(now.tv_nsec);
+  };
+  const auto before = sinceBoot();
+  const auto age = systemClock().ageTime();
+  EXPECT_LE(before, age);
+  EXPECT_LE(age, sinceBoot());
 }
 
 TEST(ManualLoop, WaitingAtItsGateRunsTheLoopAndMovesTheClockNoFurtherThanTheDeadline) {

@@ -470,6 +470,25 @@ TEST_F(ServiceConnectionTest, AnEventThatWaitsForItsHandlerGrowsOlder) {
   EXPECT_THAT(ages, ElementsAre(185'000, longestSpan.count(), std::nullopt));
 }
 
+TEST_F(ServiceConnectionTest, AnEventThatWaitsForItsHandlerOverASleepOfTheDeviceIsSoMuchOlder) {
+  std::optional<std::int64_t> age;
+  RegisterEventHandler(manager_, kEventMetric, [&](const ObjectHandle& event, Group) {
+    age = nativeDictionary(*event).find(kKeyAge)->int64();
+  });
+  EventsOn(manager_);
+  loop_.run();
+  EventsOff(manager_);
+  std::vector<std::uint8_t> bytes = *encode(Event{.metricId = 1});
+  const Trailer trailer = ageTrailer(seconds(5));
+  bytes.insert(bytes.end(), trailer.bytes.begin(), trailer.bytes.begin() + trailer.size);
+  current().sayBytes(bytes);
+  loop_.run();
+  loop_.sleep(std::chrono::hours(8));
+  EventsOn(manager_);
+  loop_.run();
+  EXPECT_EQ(age, 8 * 3600 * 1000 + 5000);
+}
+
 TEST_F(ServiceConnectionTest, AHandlerMaySwitchEventsOffAndOnInTheMiddleOfABatchAndLosesNothing) {
   std::vector<std::int64_t> metrics;
   RegisterEventHandler(manager_, kEventMetric, [&](const ObjectHandle& event, Group) {

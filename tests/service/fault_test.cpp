@@ -485,6 +485,42 @@ TEST_F(Faults, WhatWaitsForAClientThatClearsItsConfigurationIsTakenBackAndALater
   EXPECT_EQ(heard.events[1].time, 4);
 }
 
+TEST_F(Faults, ARecordGrowsOlderWhileTheDeviceSleeps) {
+  emit();
+  loop_.advance(seconds(1));
+  loop_.sleep(hours(8));
+  const auto client = greeted();
+  client->say(radix::Delivery{true});
+  loop_.advance(milliseconds(1));
+  ASSERT_EQ(client->events.size(), 1U);
+  ASSERT_TRUE(client->events[0].age);
+  EXPECT_GE(*client->events[0].age, hours(8) + seconds(1));
+  EXPECT_LT(*client->events[0].age, hours(8) + seconds(2));
+  const Dictionary report = status();
+  const auto ageOfLast = (*report.find("sources")->list())[0].dictionary()->find("last_record_age_ms")->int64();
+  EXPECT_GE(milliseconds(ageOfLast.value()), hours(8) + seconds(1));
+}
+
+TEST_F(Faults, ARecordThatWaitsForAStuckReaderOverASleepHasGrownOlderWhenItLeaves) {
+  StuckLink::Shared link;
+  link.room = 2;
+  service_.accept(std::make_unique<StuckLink>(link), {});
+  link.listener->onFrame(*radix::encode(radix::Hello{.name = "stuck", .observes = true}));
+  link.listener->onFrame(*radix::encode(radix::Delivery{true}));
+  loop_.advance(milliseconds(1));
+  emit();
+  loop_.advance(milliseconds(1));
+  loop_.sleep(hours(8));
+  link.room = 100;
+  link.listener->onWritable();
+  loop_.advance(milliseconds(1));
+  const Heard heard(link.frames);
+  ASSERT_EQ(heard.events.size(), 1U);
+  ASSERT_TRUE(heard.events[0].age);
+  EXPECT_GE(*heard.events[0].age, hours(8));
+  EXPECT_LT(*heard.events[0].age, hours(8) + seconds(1));
+}
+
 TEST_F(Faults, ARecordTellsHowOldItWasWhenItLeftWhateverTheTimeOfDay) {
   script_->sink->emit({.metricId = K_LTE_RRC_STATE,
                        .payload = {0x10, 1},

@@ -56,7 +56,7 @@ class StatusLines : public testing::Test {
     record.metricId = metric;
     record.origin = origin;
     record.receivedWallTime = clock.wallTime();
-    record.receivedMonotonicTime = clock.monotonicTime();
+    record.receivedAgeTime = clock.ageTime();
     record.age = age;
     record.period = period;
     service.lastRecords[metric] = record;
@@ -95,6 +95,15 @@ TEST_F(StatusLines, TheAgeOfARecordIsHowOldItWasWhenItLeftTheServiceAndWhatHasGo
   clock.setWallTime(clock.wallTime() - 48h);
   clock.advance(60s);
   EXPECT_EQ(onLists().text, "trace:drive.csv · 4 min ago") << "whatever happens to the time of day";
+}
+
+TEST_F(StatusLines, ValuesGrowOlderWhileTheDeviceSleeps) {
+  setSources({source("scenario:city"), source("trace:drive.csv", Phase::Ended)});
+  receive(rrcState, "scenario:city", 1s);
+  receive(servingCell, "trace:drive.csv", 0ms);
+  clock.sleep(8h);
+  EXPECT_EQ(onPage({rrcState}), (Status{StatusKind::Stale, "scenario:city · source silent for 8 h"}));
+  EXPECT_EQ(onPage({servingCell}), (Status{StatusKind::Ended, "trace:drive.csv · 8 h ago · trace ended"}));
 }
 
 TEST_F(StatusLines, OfARecordWhoseAgeTheServiceDoesNotTellItSaysOnlyWhenItWasReceived) {

@@ -137,6 +137,19 @@ TEST_F(MetricPacerTest, WhatWaitedOrIsPassedAgainIsAsOldAsItIs) {
   EXPECT_EQ(sink.last.age, milliseconds(180'601));
 }
 
+TEST_F(MetricPacerTest, ASleepOfTheDeviceMakesWhatWaitsOlderAndEndsNoPeriod) {
+  planPeriod(milliseconds(1000));
+  offer(1);
+  offer(2);
+  loop.advance(milliseconds(400));
+  loop.sleep(std::chrono::hours(8));
+  loop.advance(milliseconds(600));
+  EXPECT_THAT(sink.values, ElementsAre(1)) << "what was due in a second is due in a second of being awake";
+  loop.advance(milliseconds(1));
+  ASSERT_THAT(sink.values, ElementsAre(1, 2));
+  EXPECT_EQ(sink.last.age, std::chrono::hours(8) + milliseconds(1001));
+}
+
 TEST_F(MetricPacerTest, AShorterPeriodHoldsAtOnce) {
   planPeriod(milliseconds(10'000));
   offer(1);

@@ -67,6 +67,22 @@ TEST_F(TraceSourceTest, RowsOfOneSecondComeTogetherAndInTheirOrder) {
   EXPECT_THAT(sink.records, SizeIs(3));
 }
 
+TEST_F(TraceSourceTest, ASleepOfTheDeviceIsNoTimeOfTheDrive) {
+  std::string rows;
+  for (int minute = 0; minute < 60; ++minute) {
+    const std::string digits = (minute < 10 ? "0" : "") + std::to_string(minute);
+    rows += measurement("12." + digits + ".00", -90);
+  }
+  start(rows);
+  listen();
+  loop.advance(seconds(30));
+  loop.sleep(std::chrono::hours(8));
+  loop.advance(milliseconds(29'999));
+  EXPECT_THAT(sink.records, SizeIs(1)) << "no rows of the night in one burst";
+  loop.advance(milliseconds(1));
+  EXPECT_THAT(sink.records, SizeIs(2));
+}
+
 TEST_F(TraceSourceTest, AClockThatGoesBackCostsNoTime) {
   start(measurement("12.00.10", -90) + measurement("12.00.00", -91) + measurement("12.00.01", -92));
   listen();
