@@ -163,29 +163,35 @@ Status StatusLine::filled(const ServiceStatus& service, const Record& record) co
     if (source->phase != SourceState::Phase::Running) return {kindOf(*source), line + " · " + endOf(*source)};
   }
   if (!isStale(record)) return {StatusKind::Live, line};
-  const auto silence = silenceOf(service, record.origin);
-  // Other metrics of a source that runs may go on: a phone that has left a cell no longer measures it.
-  if (origin.empty() || silence <= leastStaleAge) return {StatusKind::Stale, line + ", stale"};
-  const auto silent = "source silent for " + ageText(silence);
-  return {StatusKind::Stale, (ageText(silence) == age ? origin : line) + " · " + silent};
+  const auto silence = origin.empty() ? std::nullopt : silenceOf(service, record.origin);
+  if (!silence) return {StatusKind::Stale, line + ", stale"};
+  const auto silent = "source silent for " + ageText(*silence);
+  return {StatusKind::Stale, (ageText(*silence) == age ? origin : line) + " · " + silent};
 }
 
 std::chrono::nanoseconds StatusLine::ageOf(const Record& record) const {
   return record.age.value_or(std::chrono::milliseconds(0)) + clock_.ageTime() - record.receivedAgeTime;
 }
 
+bool StatusLine::isPeriodic(const Record& record) { return record.period && record.period->count() > 0; }
+
 bool StatusLine::isStale(const Record& record) const {
-  if (!record.period || record.period->count() == 0) return false;
-  return ageOf(record) > std::max<std::chrono::nanoseconds>(leastStaleAge, stalePeriods * *record.period);
+  return isPeriodic(record) &&
+         ageOf(record) > std::max<std::chrono::nanoseconds>(leastStaleAge, stalePeriods * *record.period);
 }
 
-std::chrono::nanoseconds StatusLine::silenceOf(const ServiceStatus& service, const std::string& origin) const {
+std::optional<std::chrono::nanoseconds> StatusLine::silenceOf(const ServiceStatus& service,
+                                                              const std::string& origin) const {
   auto silence = std::chrono::nanoseconds::max();
-  for (const auto& [metric, record] : service.lastRecords) {
-    if (record.origin == origin) silence = std::min(silence, ageOf(record));
-  }
-  if (service.lastRecord && service.lastRecord->origin == origin)
-    silence = std::min(silence, ageOf(*service.lastRecord));
+  bool keepsAPeriod = false;
+  const auto consider = [&](const Record& record) {
+    if (record.origin != origin) return;
+    silence = std::min(silence, ageOf(record));
+    keepsAPeriod = keepsAPeriod || (isPeriodic(record) && !isStale(record));
+  };
+  for (const auto& [metric, record] : service.lastRecords) consider(record);
+  if (service.lastRecord) consider(*service.lastRecord);
+  if (keepsAPeriod || silence <= leastStaleAge) return std::nullopt;
   return silence;
 }
 

@@ -56,9 +56,13 @@ class StatusLine {
   Status away(const StatusFacts& facts) const;
   Status filled(const ServiceStatus& service, const Record& record) const;
   std::chrono::nanoseconds ageOf(const Record& record) const;
+  // Whether it comes again and again, so that it may be missed.
+  static bool isPeriodic(const Record& record);
   bool isStale(const Record& record) const;
-  // How old the youngest record of that origin is.
-  std::chrono::nanoseconds silenceOf(const ServiceStatus& service, const std::string& origin) const;
+  // For how long nothing has come from that origin. Absent while it is not silent: something came within leastStaleAge,
+  // or one of its metrics still keeps to its period, however long that is. Others may stop all the same: a phone that
+  // has left a cell no longer measures it.
+  std::optional<std::chrono::nanoseconds> silenceOf(const ServiceStatus& service, const std::string& origin) const;
   const Record* youngestOf(const StatusFacts& facts) const;
   std::string localTime(std::chrono::milliseconds wallTime) const;
 

@@ -196,6 +196,30 @@ TEST_F(StatusLines, AMetricThatStopsWhileItsSourceGoesOnIsStaleAndTheSourceIsNot
   EXPECT_EQ(onPage({rrcState}), (Status{StatusKind::Stale, "scenario:city · 2 min ago, stale"}));
 }
 
+TEST_F(StatusLines, ASourceThatKeepsToALongPeriodIsNotCalledSilentWhenAShortOneStops) {
+  setSources({source("scenario:city")});
+  receive(servingCell, "scenario:city", 60s);
+  receive(rrcState, "scenario:city", 1s);
+  clock.advance(20s);
+  EXPECT_EQ(onPage({rrcState}), (Status{StatusKind::Stale, "scenario:city · 20 s ago, stale"}));
+  EXPECT_EQ(onPage({servingCell}), (Status{StatusKind::Live, "scenario:city · 20 s ago"}));
+  clock.advance(160s);
+  EXPECT_EQ(onPage({rrcState}), (Status{StatusKind::Stale, "scenario:city · 3 min ago, stale"})) << "three periods";
+  clock.advance(1s);
+  EXPECT_EQ(onPage({rrcState}), (Status{StatusKind::Stale, "scenario:city · source silent for 3 min"}));
+}
+
+TEST_F(StatusLines, ASourceThatHasJustToldAChangeIsNotSilent) {
+  setSources({source("scenario:city")});
+  receive(rrcState, "scenario:city", 1s);
+  clock.advance(30s);
+  receive(servingCell, "scenario:city", 0ms);
+  clock.advance(10s);
+  EXPECT_EQ(onPage({rrcState}), (Status{StatusKind::Stale, "scenario:city · 40 s ago, stale"}));
+  clock.advance(1ms);
+  EXPECT_EQ(onPage({rrcState}), (Status{StatusKind::Stale, "scenario:city · 40 s ago · source silent for 10 s"}));
+}
+
 TEST_F(StatusLines, ATraceThatHasEndedIsSaidToHaveEndedHoweverYoungItsLastRecordIs) {
   setSources({source("trace:drive.csv", Phase::Ended)});
   receive(rrcState, "trace:drive.csv", 0ms);
