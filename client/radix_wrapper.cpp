@@ -178,8 +178,9 @@ const ServiceStatus& RadixWrapper::serviceStatus() const {
 }
 
 std::optional<std::set<std::int64_t>> RadixWrapper::fillableMetrics() const {
-  const auto& sources = serviceStatus().connection.sources;
-  if (!sources) return std::nullopt;
+  const auto& connection = serviceStatus().connection;
+  const auto& sources = connection.sources;
+  if (!sources || connection.areSourcesCut) return std::nullopt;
   std::set<std::int64_t> metrics;
   for (const radix::client::SourceState& source : *sources) {
     if (source.phase == radix::client::SourceState::Phase::Failed) continue;

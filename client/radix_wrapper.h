@@ -89,7 +89,7 @@ class RadixWrapper {
   // copied.
   const ServiceStatus& serviceStatus() const;
   // The identifiers of the metrics that the service's sources can fill, those that have failed apart; absent while
-  // there is no service and when it does not say.
+  // there is no service and when it does not say, or not of all of them.
   std::optional<std::set<std::int64_t>> fillableMetrics() const;
 
  private:

@@ -142,6 +142,9 @@ struct ConnectionState {
   std::uint64_t lostEvents = 0;  // events that the service could not deliver because this client was too slow
   // What feeds the service, at most 32 of them; absent while there is no connection and when the service does not say.
   std::optional<std::vector<SourceState>> sources{};
+  // There are more sources than these, or one of them can fill more than it names: nobody can conclude anything from
+  // what is not among them.
+  bool areSourcesCut = false;
   ConfigurationOutcome configuration = ConfigurationOutcome::NotPushed;
   std::string configurationTrouble{};  // why it was refused or is unsent, for people; empty otherwise
 };

@@ -85,7 +85,8 @@ class SourceFrame final : public PBCodable {
 
 class SourcesFrame final : public PBCodable {
   PB_MESSAGE(SourcesFrame)
-  PB_LIST(1, "sources", sources, Sources, source, Source, repeated<message<SourceFrame>>);
+  PB_LIST (1, "sources", sources, Sources, source, Source, repeated<message<SourceFrame>>);
+  PB_FIELD(2, "cut",     isCut,   IsCut,   boolean);  // more is there than is told
 };
 
 class Frame final : public PBCodable {

@@ -63,14 +63,21 @@ client::SourceState::Phase phaseOf(std::uint32_t number) {
 
 Sources sourcesOf(const wire::SourcesFrame& frame) {
   Sources sources;
+  sources.isCut = frame.isCut();
   for (const wire::SourceFrame& source : frame.sources()) {
-    if (sources.states.size() == Sources::most) break;
+    if (sources.states.size() == Sources::most) {
+      sources.isCut = true;
+      break;
+    }
     client::SourceState& state = sources.states.emplace_back();
     state.origin = beginningOf(source.origin(), Sources::longestOrigin);
     state.phase = phaseOf(source.phase());
     state.reason = beginningOf(source.reason(), Sources::longestReason);
     for (const wire::MetricFrame& metric : source.metrics()) {
-      if (state.metrics.size() == Sources::mostMetrics) break;
+      if (state.metrics.size() == mostMetrics) {
+        sources.isCut = true;
+        break;
+      }
       state.metrics.push_back(signedOf(metric.identifier()));
     }
   }
@@ -164,16 +171,19 @@ FrameBytes encode(const Sources& sources) {
   // The last ones go when so many of them name so much that no frame holds it.
   for (std::size_t count = std::min(sources.states.size(), Sources::most);; --count) {
     auto content = Shared<wire::SourcesFrame>::make();
+    bool isCut = sources.isCut || count < sources.states.size();
     for (std::size_t index = 0; index < count; ++index) {
       const client::SourceState& state = sources.states[index];
       wire::SourceFrame& source = content->addSource();
       source.setOrigin(beginningOf(state.origin, Sources::longestOrigin));
       source.setPhase(static_cast<std::uint32_t>(state.phase));
       if (!state.reason.empty()) source.setReason(beginningOf(state.reason, Sources::longestReason));
-      for (std::size_t metric = 0; metric < std::min(state.metrics.size(), Sources::mostMetrics); ++metric) {
+      isCut = isCut || state.metrics.size() > mostMetrics;
+      for (std::size_t metric = 0; metric < std::min(state.metrics.size(), mostMetrics); ++metric) {
         source.addMetric().setIdentifier(unsignedOf(state.metrics[metric]));
       }
     }
+    if (isCut) content->setIsCut(true);
     wire::Frame frame;
     frame.setSources(std::move(content));
     FrameBytes bytes = bytesOf(frame);

@@ -10,7 +10,8 @@
 // What came later than version 1 began, and what peers make of it that do not know it: a service that does not know
 // that its client observes gives it every record, as the client has pushed nothing; a client that cannot say it gets no
 // record before it pushes a configuration. A client that does not know ages, periods and sources passes them over; one
-// whose service does not tell them shows nothing of them.
+// whose service does not tell them shows nothing of them. One that does not know that sources may be cut takes those
+// that it is told for all, as it always has.
 //
 // Versions: each side says which version of the protocol it speaks and the oldest with which it can still work. Two
 // sides talk when neither is older than the oldest of the other; then both keep to what the older of the two knows.
@@ -88,12 +89,15 @@ struct Dropped {
 
 // What feeds the service: all of it, at the greeting and whenever something of it has changed.
 struct Sources {
-  // What is past these is left out or cut, by the side that says it and by the side that hears it.
+  // What is past these, or past radix::mostMetrics of one source, is left out or cut, by the side that says it and by
+  // the side that hears it.
   static constexpr std::size_t most = 32;
-  static constexpr std::size_t mostMetrics = 256;
   static constexpr std::size_t longestOrigin = radix::longestOrigin;
   static constexpr std::size_t longestReason = 512;
   std::vector<client::SourceState> states{};
+  // A source or a metric of one has been left out: what is not told may be there all the same. Set by encode() and
+  // decodeFrame() where they leave something out.
+  bool isCut = false;
 };
 
 // Asks whether the other side is alive; it sends the same number back as an answer.

@@ -131,6 +131,7 @@ void ServiceConnection::lose(Status status, const std::string& reason) {
     state_.since = worker_.clock().wallTime();
   }
   state_.sources.reset();
+  state_.areSourcesCut = false;
   state_.trouble = reason;
   // Events that came with the last batch were received in full.
   onBatchEnd();
@@ -325,6 +326,7 @@ void ServiceConnection::onDropped(Dropped dropped) {
 void ServiceConnection::onSources(Sources sources) {
   if (phase_ != Phase::Ready) return;
   state_.sources = std::move(sources.states);
+  state_.areSourcesCut = sources.isCut;
   publish();
 }
 

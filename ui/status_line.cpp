@@ -78,9 +78,16 @@ std::string named(const std::vector<const SourceState*>& sources, const std::str
   return sources.size() == 1 ? named(*sources[0]) : named(*sources[0]) + " and " + named(*sources[1]);
 }
 
-// Why no record has come for a page, or for the lists.
-Status nothingYet(const std::vector<SourceState>& sources, const std::optional<PageFeed>& feed) {
-  if (sources.empty()) return {StatusKind::Unfillable, "the baseband service has no source"};
+// Where nothing is known of what feeds the service.
+Status nothingYet(const std::optional<PageFeed>& feed) {
+  return {StatusKind::Waiting, feed ? "Connected to the baseband service, nothing received yet for this page"
+                                    : "Connected to the baseband service, nothing received yet"};
+}
+
+// Why no record has come for a page, or for the lists. Where the sources are not all, only what those promise that run
+// is certain.
+Status nothingYet(const std::vector<SourceState>& sources, bool areAll, const std::optional<PageFeed>& feed) {
+  if (areAll && sources.empty()) return {StatusKind::Unfillable, "the baseband service has no source"};
   std::vector<const SourceState*> all;
   std::vector<const SourceState*> able;
   std::vector<const SourceState*> running;
@@ -96,11 +103,12 @@ Status nothingYet(const std::vector<SourceState>& sources, const std::optional<P
     if (source.phase == SourceState::Phase::Failed && failed == nullptr) failed = &source;
   }
   const auto count = [](const auto& many) { return std::to_string(many.size()) + " sources"; };
+  if (!running.empty())
+    return {StatusKind::Waiting, "nothing received yet from " + named(running, "any of " + count(running))};
+  if (!areAll) return nothingYet(feed);
   if (able.empty())
     return {StatusKind::Unfillable,
             named(all, "none of the " + count(all)) + " can" + (all.size() > 2 ? "" : "not") + " fill this page"};
-  if (!running.empty())
-    return {StatusKind::Waiting, "nothing received yet from " + named(running, "any of " + count(running))};
   const auto& gone = failed != nullptr ? *failed : *able.front();
   return {kindOf(gone), named(gone) + " · " + endOf(gone) + (failed != nullptr ? "" : ", nothing received")};
 }
@@ -134,9 +142,8 @@ Status StatusLine::status(const StatusFacts& facts) const {
   if (connection.configuration == ConfigurationOutcome::NotPushed) {
     return {StatusKind::Waiting, "no configuration pushed, nothing received yet"};
   }
-  if (connection.sources) return nothingYet(*connection.sources, facts.feed);
-  return {StatusKind::Waiting, facts.feed ? "Connected to the baseband service, nothing received yet for this page"
-                                          : "Connected to the baseband service, nothing received yet"};
+  if (connection.sources) return nothingYet(*connection.sources, !connection.areSourcesCut, facts.feed);
+  return nothingYet(facts.feed);
 }
 
 Status StatusLine::away(const StatusFacts& facts) const {
@@ -159,8 +166,10 @@ Status StatusLine::filled(const ServiceStatus& service, const Record& record) co
   const auto line = (origin.empty() ? "Last record " : origin + " · ") + since;
   if (service.connection.sources && !record.origin.empty()) {
     const auto* source = sourceNamed(*service.connection.sources, record.origin);
-    if (source == nullptr) return {StatusKind::Ended, line + " · no longer a source"};
-    if (source->phase != SourceState::Phase::Running) return {kindOf(*source), line + " · " + endOf(*source)};
+    if (source == nullptr && !service.connection.areSourcesCut)
+      return {StatusKind::Ended, line + " · no longer a source"};
+    if (source != nullptr && source->phase != SourceState::Phase::Running)
+      return {kindOf(*source), line + " · " + endOf(*source)};
   }
   if (!isStale(record)) return {StatusKind::Live, line};
   const auto silence = origin.empty() ? std::nullopt : silenceOf(service, record.origin);

@@ -355,6 +355,8 @@ TEST_F(RadixWrapperTest, WhatTheSourcesCanFillIsKnownWithoutACommand) {
                              {.origin = "b", .phase = State::Phase::Ended, .reason = "", .metrics = {2, 3}},
                              {.origin = "c", .phase = State::Phase::Failed, .reason = "gone", .metrics = {9}}};
   EXPECT_EQ(wrapper_.fillableMetrics(), (std::set<std::int64_t>{1, 2, 3}));
+  manager_->state.areSourcesCut = true;
+  EXPECT_EQ(wrapper_.fillableMetrics(), std::nullopt) << "the service does not say all";
   EXPECT_TRUE(manager_->calls.empty());
 }
 

@@ -171,6 +171,27 @@ TEST(Frames, HoweverMuchIsSaidOfTheSourcesItFitsIntoAFrame) {
   EXPECT_EQ(recorder.sources.states[0].origin.size(), Sources::longestOrigin);
   EXPECT_EQ(recorder.sources.states[0].metrics.size(), mostMetrics);
   EXPECT_EQ(recorder.sources.states[0].phase, client::SourceState::Phase::Running) << "of a later version";
+  EXPECT_TRUE(recorder.sources.isCut);
+}
+
+TEST(Frames, SourcesSayWhetherTheyAreAll) {
+  const auto isCut = [](std::size_t sources, std::size_t metrics, std::size_t reason = 0, bool before = false) {
+    client::SourceState state;
+    state.origin = std::string(Sources::longestOrigin, 'o');
+    state.reason = std::string(reason, 'r');
+    state.metrics.assign(metrics, -1);
+    const auto got = roundTrip(Sources{std::vector<client::SourceState>(sources, state), before}).sources;
+    EXPECT_LE(got.states.size(), sources);
+    return got.isCut;
+  };
+  EXPECT_FALSE(isCut(0, 0));
+  EXPECT_FALSE(isCut(Sources::most, 0));
+  EXPECT_TRUE(isCut(Sources::most + 1, 0));
+  EXPECT_FALSE(isCut(1, mostMetrics));
+  EXPECT_TRUE(isCut(1, mostMetrics + 1));
+  EXPECT_FALSE(isCut(1, 0, 100'000)) << "a shorter reason is the same source";
+  EXPECT_TRUE(isCut(Sources::most, mostMetrics)) << "no frame holds them";
+  EXPECT_TRUE(isCut(1, 0, 0, true)) << "whoever was not told all cannot tell all";
 }
 
 TEST(Frames, AnEmptyPayloadIsAPayload) { EXPECT_TRUE(roundTrip(Event{}).event.payload.empty()); }

@@ -463,6 +463,30 @@ TEST_P(Contract, TheClientIsToldWhatFeedsTheServiceAndWhenThatChanges) {
   EXPECT_TRUE(until([&] { return !sources(); }));
 }
 
+TEST_P(Contract, OfMoreSourcesThanAreToldTheClientKnowsThatTheyAreNotAll) {
+  Client& client = connect();
+  const auto state = [&] { return radix::client::Connection(client.manager); };
+  ASSERT_TRUE(until([&] { return state().sources.has_value(); }));
+  EXPECT_FALSE(state().areSourcesCut);
+  std::vector<std::shared_ptr<TestService::Script>> scripts;
+  world_->onService([&] {
+    while (scripts.size() < radix::Sources::most) {
+      scripts.push_back(std::make_shared<TestService::Script>());
+      scripts.back()->origin = "source " + std::to_string(scripts.size());
+      world_->service().addSource(std::make_unique<ScriptedSource>(scripts.back()));
+    }
+  });
+  EXPECT_TRUE(until([&] { return state().areSourcesCut; }));
+  EXPECT_EQ(state().sources->size(), radix::Sources::most);
+  // Of a service that is not there nothing is known, and the next one has one source.
+  world_->kill();
+  EXPECT_TRUE(until([&] { return !state().connected; }));
+  EXPECT_FALSE(state().areSourcesCut);
+  world_->restart();
+  EXPECT_TRUE(until([&] { return state().sources.has_value(); }));
+  EXPECT_FALSE(state().areSourcesCut);
+}
+
 TEST_P(Contract, TheOutcomeOfTheConfigurationIsKnown) {
   Client& client = connect();
   using Outcome = radix::client::ConfigurationOutcome;

@@ -291,6 +291,26 @@ TEST_F(StatusLines, WhereTheOnlySourceIsGoneBeforeAnythingCameItSaysHow) {
   EXPECT_EQ(onPage({rrcState}), (Status{StatusKind::Failed, "trace:y.csv · source failed: it is a folder"}));
 }
 
+TEST_F(StatusLines, WhereNotAllSourcesAreToldNothingIsConcludedFromThoseThatAre) {
+  service.connection.areSourcesCut = true;
+  setSources({source("scenario:city", Phase::Running, "", {servingCell})});
+  const Status nothingOnPage{StatusKind::Waiting,
+                             "Connected to the baseband service, nothing received yet for this page"};
+  EXPECT_EQ(onPage({rrcState}), nothingOnPage) << "another may fill it";
+  EXPECT_EQ(onPage({servingCell}), (Status{StatusKind::Waiting, "nothing received yet from scenario:city"}));
+  setSources({source("scenario:city", Phase::Ended)});
+  EXPECT_EQ(onPage({rrcState}), nothingOnPage) << "another may run";
+  setSources({});
+  EXPECT_EQ(onPage({rrcState}), nothingOnPage);
+  EXPECT_EQ(onLists(), (Status{StatusKind::Waiting, "Connected to the baseband service, nothing received yet"}));
+  receive(rrcState, "trace:drive.csv", 1s);
+  EXPECT_EQ(onPage({rrcState}), (Status{StatusKind::Live, "trace:drive.csv · 0.0 s ago"}));
+  clock.advance(60s);
+  EXPECT_EQ(onPage({rrcState}), (Status{StatusKind::Stale, "trace:drive.csv · source silent for 1 min"}));
+  setSources({source("trace:drive.csv", Phase::Ended)});
+  EXPECT_EQ(onPage({rrcState}), (Status{StatusKind::Ended, "trace:drive.csv · 1 min ago · trace ended"}));
+}
+
 TEST_F(StatusLines, AServiceThatDoesNotSayWhatFeedsItHasSentNothingYet) {
   EXPECT_EQ(onLists(), (Status{StatusKind::Waiting, "Connected to the baseband service, nothing received yet"}));
 }
