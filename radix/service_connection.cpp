@@ -2,6 +2,7 @@
 #include "radix/service_connection.h"
 
 #include <algorithm>
+#include <iterator>
 #include <utility>
 
 #include "values/plain_text.h"
@@ -20,9 +21,9 @@ std::string versionTrouble(const ServiceConnection::Identity& own, const Hello& 
 // Of what a service says, as much is kept as anybody reads.
 constexpr std::size_t longestTrouble = 1000;
 
-// In the form in which the results of commands stand in the log.
-std::string refusedRestoring(const Reply& reply) {
-  return "the baseband service refuses the configuration that is pushed again: error=" + std::to_string(reply.status) +
+// What nobody waits for any more, in the form in which the results of commands stand in the log.
+std::string refusedLate(const Reply& reply) {
+  return "the baseband service refuses the configuration that was pushed: error=" + std::to_string(reply.status) +
          " msg=" + probeview::onOneLine(probeview::beginningOf(reply.message, longestTrouble));
 }
 
@@ -136,6 +137,8 @@ void ServiceConnection::lose(Status status, const std::string& reason) {
   // Events that came with the last batch were received in full.
   onBatchEnd();
   failAll(status, reason);
+  // The next service counts from anew what it answers.
+  for (PushedConfiguration& one : configurations_) one.sequence = 0;
   scheduleAttempt(reconnectDelay_);
   reconnectDelay_ = std::min(reconnectDelay_ * 2, longestReconnectDelay);
   publish();
@@ -151,10 +154,15 @@ void ServiceConnection::finish(Waiting waiting, Status status, std::string messa
   PendingCommand& command = *waiting.command;
   command.result = {static_cast<std::int32_t>(status), std::move(message)};
   if (command.name == kCommandAddConfiguration) {
-    // What the service never judged is still wanted: it is asked again on the next connection.
-    if (judge == Judge::Nobody || status == Status::Ok) {
-      configuration_ = command.arguments;
-      unjudgedConfiguration_ = judge == Judge::Nobody ? waiting.sequence : 0;
+    if (judge == Judge::Nobody) {
+      // What the service never judged is still wanted: it is asked again on the next connection.
+      configurations_.push_back({command.arguments, waiting.sequence});
+      const std::size_t accepted = configurations_.front().isAccepted ? 1 : 0;
+      if (configurations_.size() - accepted > mostUnjudgedConfigurations) {
+        configurations_.erase(configurations_.begin() + static_cast<std::ptrdiff_t>(accepted));
+      }
+    } else if (status == Status::Ok) {
+      acceptConfiguration(waiting.sequence, command.arguments);
     }
     setConfigurationOutcome(judge == Judge::Nobody ? ConfigurationOutcome::Unsent
                             : status == Status::Ok ? ConfigurationOutcome::Accepted
@@ -162,8 +170,7 @@ void ServiceConnection::finish(Waiting waiting, Status status, std::string messa
                             command.result.message);
   } else if (command.name == kCommandClearConfiguration) {
     // Wanted or not by the service: who clears a configuration does not want it back on the next connection.
-    configuration_.reset();
-    unjudgedConfiguration_ = 0;
+    configurations_.clear();
     setConfigurationOutcome(ConfigurationOutcome::NotPushed);
   }
   // Last: whoever waits for it may ask at once what has become of it.
@@ -182,12 +189,35 @@ void ServiceConnection::setConfigurationOutcome(ConfigurationOutcome outcome, co
 }
 
 void ServiceConnection::restore() {
-  if (configuration_) {
-    unjudgedConfiguration_ = nextSequence();
-    send(encode(
-        Command{.sequence = unjudgedConfiguration_, .name = kCommandAddConfiguration, .arguments = *configuration_}));
+  for (PushedConfiguration& one : configurations_) {
+    one.sequence = nextSequence();
+    send(encode(Command{.sequence = one.sequence, .name = kCommandAddConfiguration, .arguments = one.arguments}));
   }
   if (delivery_) send(encode(Delivery{true}));
+}
+
+void ServiceConnection::acceptConfiguration(std::uint32_t sequence, std::vector<std::uint8_t> arguments) {
+  std::erase_if(configurations_,
+                [sequence](const PushedConfiguration& one) { return one.isAccepted || one.sequence <= sequence; });
+  configurations_.push_front({.arguments = std::move(arguments), .sequence = 0, .isAccepted = true});
+}
+
+void ServiceConnection::judgeRestored(const Reply& reply) {
+  const auto found = std::find_if(
+      configurations_.begin(), configurations_.end(),
+      [&reply](const PushedConfiguration& one) { return one.sequence != 0 && one.sequence == reply.sequence; });
+  if (found == configurations_.end()) return;
+  const bool isOk = static_cast<Status>(reply.status) == Status::Ok;
+  // Of those before it nobody wants to know any more.
+  const bool isLast = std::next(found) == configurations_.end();
+  if (isOk) {
+    acceptConfiguration(reply.sequence, std::move(found->arguments));
+  } else {
+    configurations_.erase(found);
+    if (events_.notice) events_.notice(refusedLate(reply));
+  }
+  if (!isLast) return;
+  setConfigurationOutcome(isOk ? ConfigurationOutcome::Accepted : ConfigurationOutcome::Refused, reply.message);
 }
 
 std::uint32_t ServiceConnection::nextSequence() {
@@ -287,17 +317,8 @@ void ServiceConnection::onReply(Reply reply) {
     return one.sequence != 0 && one.sequence == reply.sequence;
   });
   if (found == waiting_.end()) {
-    // Nobody waits for it any more, or it answers what was restored: a configuration that is refused is not kept.
-    if (unjudgedConfiguration_ != 0 && reply.sequence == unjudgedConfiguration_) {
-      unjudgedConfiguration_ = 0;
-      if (static_cast<Status>(reply.status) != Status::Ok) {
-        configuration_.reset();
-        setConfigurationOutcome(ConfigurationOutcome::Refused, reply.message);
-        if (events_.notice) events_.notice(refusedRestoring(reply));
-      } else {
-        setConfigurationOutcome(ConfigurationOutcome::Accepted);
-      }
-    }
+    // Nobody waits for it any more, or it answers what was restored.
+    judgeRestored(reply);
     return;
   }
   Waiting answered = std::move(*found);

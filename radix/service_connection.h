@@ -31,6 +31,8 @@ inline constexpr std::size_t mostAnswersUnread = 64;
 inline constexpr std::size_t largestBatch = 1024 * 1024;
 // Commands that wait for their replies at once; more than any caller has threads.
 inline constexpr std::size_t mostCommandsAtOnce = 256;
+// Configurations that are kept for the next connection although no service has judged them; of more the last ones.
+inline constexpr std::size_t mostUnjudgedConfigurations = 4;
 
 // What a connection may read now.
 enum class Appetite {
@@ -94,6 +96,12 @@ class ServiceConnection final : public std::enable_shared_from_this<ServiceConne
     std::uint32_t sequence = 0;  // 0: not sent yet
   };
 
+  struct PushedConfiguration {
+    std::vector<std::uint8_t> arguments;
+    std::uint32_t sequence = 0;  // under which it waits for its reply on this connection; 0: it does not
+    bool isAccepted = false;
+  };
+
   void onFrame(std::span<const std::uint8_t> frame) override;
   void onOverlongFrame(std::size_t size) override;
   void onBatchEnd() override;
@@ -113,6 +121,9 @@ class ServiceConnection final : public std::enable_shared_from_this<ServiceConne
   void failAll(Status status, const std::string& reason);
   void finish(Waiting waiting, Status status, std::string message, Judge judge = Judge::Nobody);
   void restore();
+  // The service has taken the configuration that was pushed under the sequence number, and goes by no earlier one.
+  void acceptConfiguration(std::uint32_t sequence, std::vector<std::uint8_t> arguments);
+  void judgeRestored(const Reply& reply);
   void setConfigurationOutcome(ConfigurationOutcome outcome, const std::string& trouble = {});
   std::uint32_t nextSequence();
   void sendWaiting();
@@ -139,10 +150,9 @@ class ServiceConnection final : public std::enable_shared_from_this<ServiceConne
   std::deque<Waiting> waiting_;
   std::uint32_t lastSequence_ = 0;
 
-  // What is restored on a new connection.
-  std::optional<std::vector<std::uint8_t>> configuration_;
-  // The sequence number under which that was sent without a reply so far; 0: not sent, or taken.
-  std::uint32_t unjudgedConfiguration_ = 0;
+  // What is restored on a new connection: the configuration that a service has accepted last, and behind it those
+  // pushed since then of which none has said whether it takes them. Should it refuse those, it still goes by the first.
+  std::deque<PushedConfiguration> configurations_;
   bool delivery_ = false;
 
   std::vector<Event> batch_;

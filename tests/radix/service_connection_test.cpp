@@ -351,12 +351,114 @@ TEST_F(ServiceConnectionTest, AConfigurationThatIsRefusedOnlyWhenRestoredIsNotTr
   loop_.advance(seconds(1));
   current().answer(0, 3, "no\nsuch metric");
   loop_.run();
-  EXPECT_THAT(log.lines, ElementsAre("the baseband service refuses the configuration that is pushed again: error=3 "
+  EXPECT_THAT(log.lines, ElementsAre("the baseband service refuses the configuration that was pushed: error=3 "
                                      "msg=no\\nsuch metric"));
   current().hangUp();
   loop_.advance(milliseconds(100));
   ASSERT_THAT(services_, SizeIs(2));
   EXPECT_THAT(current().commands, IsEmpty());
+}
+
+// The configurations that were pushed.
+std::vector<std::string> pushedOf(const PlayedService& service) {
+  std::vector<std::string> texts;
+  for (const Command& command : service.commands) {
+    const auto arguments = decodeDictionary(command.arguments);
+    const Value* payload = arguments ? arguments->find(kKeyPayload) : nullptr;
+    if (payload == nullptr) continue;
+    const auto bytes = *payload->bytes();
+    texts.emplace_back(bytes.begin(), bytes.end());
+  }
+  return texts;
+}
+
+TEST_F(ServiceConnectionTest, AConfigurationThatIsRefusedLateLeavesTheOneThatWasAcceptedToBeRestored) {
+  answerAll();
+  ASSERT_EQ(push("accepted").status, 0);
+  answering_.reset();
+  EXPECT_EQ(push("second").status, static_cast<int>(Status::TimedOut));
+  EXPECT_EQ(Connection(manager_).configuration, ConfigurationOutcome::Unsent);
+  current().answer(1, 3, "no");
+  loop_.run();
+  EXPECT_EQ(Connection(manager_).configuration, ConfigurationOutcome::Refused);
+  EXPECT_EQ(Connection(manager_).configurationTrouble, "no");
+  current().hangUp();
+  loop_.advance(milliseconds(100));
+  ASSERT_THAT(services_, SizeIs(2));
+  EXPECT_THAT(pushedOf(current()), ElementsAre("accepted"));
+  current().answer(0);
+  loop_.run();
+  EXPECT_EQ(Connection(manager_).configuration, ConfigurationOutcome::Accepted);
+}
+
+TEST_F(ServiceConnectionTest, AConfigurationThatNobodyHasJudgedIsRestoredBehindTheOneThatWasAccepted) {
+  for (const bool takesSecond : {false, true}) {
+    manager_.reset();
+    loop_.run();
+    services_.clear();
+    restart();
+    answerAll();
+    ASSERT_EQ(push("accepted").status, 0);
+    answering_.reset();
+    EXPECT_EQ(push("second").status, static_cast<int>(Status::TimedOut));
+    EventsOn(manager_);
+    loop_.run();
+    current().hangUp();
+    loop_.advance(milliseconds(100));
+    ASSERT_THAT(services_, SizeIs(2));
+    // Should the second be refused, the first counts: as it did where both were pushed.
+    EXPECT_THAT(pushedOf(current()), ElementsAre("accepted", "second"));
+    EXPECT_THAT(current().deliveries, ElementsAre(true));
+    current().answer(0);
+    loop_.run();
+    EXPECT_EQ(Connection(manager_).configuration, ConfigurationOutcome::Unsent) << "of the last one nothing is known";
+    current().answer(1, takesSecond ? 0 : 3, takesSecond ? "" : "no");
+    loop_.run();
+    EXPECT_EQ(Connection(manager_).configuration,
+              takesSecond ? ConfigurationOutcome::Accepted : ConfigurationOutcome::Refused);
+    current().hangUp();
+    loop_.advance(milliseconds(200));
+    ASSERT_THAT(services_, SizeIs(3));
+    EXPECT_THAT(pushedOf(current()), ElementsAre(takesSecond ? "second" : "accepted"));
+  }
+}
+
+TEST_F(ServiceConnectionTest, OfTwoLateJudgementsEachCountsForItsOwnConfiguration) {
+  loop_.run();
+  EXPECT_EQ(push("first").status, static_cast<int>(Status::TimedOut));
+  EXPECT_EQ(push("second").status, static_cast<int>(Status::TimedOut));
+  current().answer(0);
+  loop_.run();
+  EXPECT_EQ(Connection(manager_).configuration, ConfigurationOutcome::Unsent);
+  current().answer(1, 3, "no");
+  loop_.run();
+  EXPECT_EQ(Connection(manager_).configuration, ConfigurationOutcome::Refused);
+  current().hangUp();
+  loop_.advance(milliseconds(100));
+  EXPECT_THAT(pushedOf(current()), ElementsAre("first"));
+}
+
+TEST_F(ServiceConnectionTest, AConfigurationThatIsAcceptedTakesThePlaceOfAllBeforeIt) {
+  loop_.run();
+  EXPECT_EQ(push("first").status, static_cast<int>(Status::TimedOut));
+  answered_ = 1;
+  answerAll();
+  EXPECT_EQ(push("second").status, 0);
+  answering_.reset();
+  current().answer(0, 3, "late");
+  loop_.run();
+  EXPECT_EQ(Connection(manager_).configuration, ConfigurationOutcome::Accepted);
+  current().hangUp();
+  loop_.advance(milliseconds(100));
+  EXPECT_THAT(pushedOf(current()), ElementsAre("second"));
+}
+
+TEST_F(ServiceConnectionTest, OfConfigurationsThatNobodyJudgesTheLastFourAreKept) {
+  mood_ = Mood::Absent;
+  for (const char* text : {"1", "2", "3", "4", "5", "6"}) EXPECT_NE(push(text).status, 0);
+  mood_ = Mood::There;
+  loop_.advance(seconds(1));
+  EXPECT_THAT(pushedOf(current()), ElementsAre("3", "4", "5", "6"));
 }
 
 TEST_F(ServiceConnectionTest, ALateAnswerToAConfigurationThatHasBeenClearedSinceSaysNothingAnyMore) {
