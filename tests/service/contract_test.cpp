@@ -10,9 +10,11 @@
 
 #include "messages/metric_identifiers.h"
 #include "radix/client.h"
+#include "radix/dictionary_bytes.h"
 #include "radix/object.h"
 #include "radix/service_commands.h"
 #include "radix/status.h"
+#include "tests/service/harness/raw_client.h"
 #include "tests/service/harness/test_service.h"
 
 namespace probeview {
@@ -355,6 +357,61 @@ TEST_P(Contract, WhoeverHasPushedNothingGetsNothingAndKeepsNoSourceAwake) {
   listen(client);
   EXPECT_EQ(client.events.size(), 1U);
   EXPECT_FALSE(sourceIsHeard());
+}
+
+TEST_P(Contract, WhatWaitsForAClientThatReplacesItsConfigurationIsTakenBackAndIsNoLoss) {
+  Client& other = connect("other");
+  RawClient stuck(world_->rawLink());
+  const auto pushNow = [&](std::uint32_t sequence, std::string_view text) {
+    stuck.say(radix::Command{
+        .sequence = sequence,
+        .name = radix::kCommandAddConfiguration,
+        .arguments = radix::encodeDictionary(
+            {{radix::kKeyPayload, Value::bytes({reinterpret_cast<const std::uint8_t*>(text.data()), text.size()})}})});
+  };
+  // Of the records that wait for it in the service.
+  const auto queued = [&]() -> std::uint64_t {
+    if (perform(other, radix::kCommandShowStatus).status != 0) return 0;
+    for (const Value& client : *reply_.find("clients")->list()) {
+      const Dictionary& entry = *client.dictionary();
+      if (entry.find("name")->text() == "stuck") return entry.find("queued")->rawUInt64();
+    }
+    return 0;
+  };
+  stuck.say(radix::Hello{.name = "stuck"});
+  stuck.say(radix::Delivery{true});
+  pushNow(1, "[metrics]\nK_LTE_RRC_STATE = \"on change\"\nK_LTE_CDRX_CONFIG = \"on change\"\n");
+  ASSERT_TRUE(until([&] { return stuck.replies.size() == 1; }));
+  stuck.setReading(false);
+  world_->emit(K_LTE_CDRX_CONFIG, numbered(0));
+  world_->settle();
+  std::size_t count = 0;
+  std::uint8_t number = 0;
+  // With 60 kB that nobody knows behind it, so that the transport is full soon.
+  while (queued() < 3 && count < 1000) {
+    number = static_cast<std::uint8_t>(++count % 100);
+    Bytes large = numbered(number);
+    large.insert(large.end(), {0xA2, 0x1F, 0xE0, 0xD4, 0x03});
+    large.resize(large.size() + 60'000);
+    world_->emit(K_LTE_RRC_STATE, large);
+    world_->settle();
+  }
+  const std::uint64_t waited = queued();
+  ASSERT_GE(waited, 3U);
+  // It does not want those any more, and has not had this one.
+  world_->emit(K_LTE_CDRX_CONFIG, numbered(101));
+  pushNow(2, "[metrics]\nK_LTE_CDRX_CONFIG = \"on change\"\nK_LTE_TX_POWER = 1000\n");
+  ASSERT_TRUE(until([&] { return queued() == 1; }));
+  stuck.setReading(true);
+  ASSERT_TRUE(until([&] { return stuck.replies.size() == 2 && stuck.events.size() == count - waited + 2; }));
+  EXPECT_EQ(stuck.events.back().metricId, K_LTE_CDRX_CONFIG);
+  EXPECT_EQ(stuck.events.back().payload, numbered(101));
+  EXPECT_EQ(stuck.dropped, 0U);
+  // What was taken back was never sent: whoever wants it again gets the last of it.
+  pushNow(3, "[metrics]\nK_LTE_RRC_STATE = 1000\n");
+  ASSERT_TRUE(until([&] { return stuck.events.size() == count - waited + 3; }));
+  EXPECT_EQ(stuck.events.back().payload.at(1), number);
+  stuck.hangUp();
 }
 
 TEST_P(Contract, AnAnswerGoesOnceToEachWhoAskedAndToThoseWhoTakeTheMetricAnyway) {
