@@ -1,7 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "ui/qt/window.h"
-
 #include "app/window.h"
+
+#include "ui/qt/toolkit_messages.h"
+#include "ui/qt/window.h"
 
 namespace probeview {
 
@@ -9,6 +10,7 @@ MakeWindow windowMaker(char** argv) {
   return [argv] {
     // The toolkit keeps a reference to the count. It sees the program's name alone: its own options are not offered.
     static int nameAlone = 1;
+    qt::logToolkitMessages();
     return qt::makeWindowFront(nameAlone, argv);
   };
 }

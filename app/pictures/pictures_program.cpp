@@ -12,6 +12,7 @@
 #include "platform/time_zone.h"
 #include "radix/socket_path.h"
 #include "ui/qt/pictures.h"
+#include "ui/qt/toolkit_messages.h"
 
 namespace probeview {
 
@@ -64,6 +65,7 @@ int runPicturesProgram(int argc, char** argv, std::ostream& output, std::ostream
   // The picture is the only output.
   setConsoleLog(*new DiscardingSink);
   setSystemLog(*new SystemLog("probeview", SystemLog::Echo::None));
+  qt::logToolkitMessages();
   int noArguments = 1;
   const auto front = qt::makePicturesFront(noArguments, argv, options, errors);
   return applicationMain("AppDelegate", *front,

@@ -121,11 +121,13 @@ TEST(Programs, WithHardlyAnyDescriptorsEachSaysSoAndEndsWithStatusOne) {
   const std::string closing = "for n in 3 4 5 6 7 8 9; do eval \"exec $n>&-\"; done; ";
   for (const std::string limit : {"4", "6"}) {
     for (const std::string& command : commands) {
-      expectReason(run(surroundings + "bash -c '" + closing + "ulimit -n " + limit + "; exec " + command + "' 2>&1"), command);
+      expectReason(run(surroundings + "bash -c '" + closing + "ulimit -n " + limit + "; exec " + command + "' 2>&1"),
+                   command);
     }
     // On a terminal of its own.
     const std::string terminal = probeview + " --terminal";
-    expectReason(run(surroundings + "script -qec '" + closing + "ulimit -n " + limit + "; exec " + terminal + "' /dev/null 2>&1"),
+    expectReason(run(surroundings + "script -qec '" + closing + "ulimit -n " + limit + "; exec " + terminal +
+                     "' /dev/null 2>&1"),
                  terminal);
   }
 }
@@ -143,6 +145,25 @@ TEST(Programs, ASocketWithAnEmptyPathIsRefused) {
     EXPECT_NE(shown.output.find("the socket's path is empty"), std::string::npos) << shown.output;
   }
 }
+
+#ifdef PICTURES
+TEST(Programs, WhatTheToolkitSaysToAStandardErrorThatNobodyReadsKeepsNoPictureFromBeingDrawn) {
+  RadixdProcess radixd("scenario:city,seed=1,speed=20");
+  ASSERT_TRUE(radixd.start());
+  const TemporaryFolder folder;
+  const std::string pipe = folder.path() + "/pipe";
+  ASSERT_EQ(::mkfifo(pipe.c_str(), 0600), 0);
+  const FileDescriptor idle(::open(pipe.c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC));
+  const FileDescriptor filler(::open(pipe.c_str(), O_WRONLY | O_NONBLOCK | O_CLOEXEC));
+  ASSERT_TRUE(idle && filler);
+  while (::write(filler.number(), "x", 1) == 1) {
+  }
+  // Without that folder the toolkit warns.
+  const std::string command =
+      "env -u XDG_RUNTIME_DIR timeout 60 " PICTURES " " + folder.path() + "/pages.png 2>" + pipe;
+  EXPECT_EQ(run(command).status, 0);
+}
+#endif
 
 TEST(Programs, ATimeZoneOrAConfigurationThatIsAPipeWithoutAWriterHangsNoProgram) {
   RadixdProcess radixd("scenario:city,seed=1");
