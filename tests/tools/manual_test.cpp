@@ -130,6 +130,8 @@ TEST(Completion, OffersSubcommandsAndOptions) {
   EXPECT_EQ(offered("\"\""), "status watch pages query metrics config decode store names --socket --version --help\n");
   EXPECT_EQ(offered("st"), "status store\n");
   EXPECT_EQ(offered("--socket /tmp/x wa"), "watch\n");
+  EXPECT_EQ(offered("--socket = /tmp/x wa"), "watch\n");
+  EXPECT_EQ(offered("config push --socket = resources/kiv"), "resources/kiv_test_lte.deviceconfig\n");
   EXPECT_EQ(offered("watch --p"), "--personal\n");
   EXPECT_EQ(offered("watch --c"), "--changes --count\n");
   EXPECT_EQ(offered("config \"\""), "push clear --help\n");
