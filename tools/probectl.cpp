@@ -6,8 +6,11 @@
 
 #include <CLI/CLI.hpp>
 #include <algorithm>
+#include <climits>
+#include <csignal>
 #include <cstdlib>
 #include <iostream>
+#include <optional>
 #include <sstream>
 #include <string_view>
 #include <system_error>
@@ -31,6 +34,32 @@ int finished(Tool& tool, ExitStatus status) {
   tool.errors << "probectl: not all of the answer could be written; is the disk full?\n";
   return static_cast<int>(status == ExitStatus::Success ? ExitStatus::Failure : status);
 }
+
+// Whether so much on standard output may wait for its reader. A pipe that says that there is room has room for this
+// much.
+bool mayHaveToWait(std::size_t size) {
+  pollfd output{STDOUT_FILENO, POLLOUT, 0};
+  return size > PIPE_BUF || ::poll(&output, 1, 0) <= 0;
+}
+
+// Lets SIGINT and SIGTERM end the program as they would if no loop waited for them. One that the loop has not heard yet
+// ends it at once.
+class EndableBySignals {
+ public:
+  EndableBySignals() {
+    sigset_t ending;
+    sigemptyset(&ending);
+    sigaddset(&ending, SIGINT);
+    sigaddset(&ending, SIGTERM);
+    ::pthread_sigmask(SIG_UNBLOCK, &ending, &before_);
+  }
+  ~EndableBySignals() { ::pthread_sigmask(SIG_SETMASK, &before_, nullptr); }
+  EndableBySignals(const EndableBySignals&) = delete;
+  EndableBySignals& operator=(const EndableBySignals&) = delete;
+
+ private:
+  sigset_t before_{};
+};
 
 // Where the command line names a subcommand that there is none of, what to say of it; empty otherwise.
 std::string unknownSubcommand(const CLI::App& program, std::span<const std::string> arguments) {
@@ -65,6 +94,13 @@ bool readerIsGone(const Tool& tool) {
   if (&tool.output != &std::cout) return false;
   pollfd output{STDOUT_FILENO, 0, 0};
   return ::poll(&output, 1, 0) > 0 && (output.revents & (POLLERR | POLLHUP)) != 0;
+}
+
+void writeLine(Tool& tool, std::string_view line) {
+  std::optional<EndableBySignals> whileItWaits;
+  if (&tool.output == &std::cout && mayHaveToWait(line.size() + 1)) whileItWaits.emplace();
+  tool.output << line << '\n';
+  tool.output.flush();
 }
 
 std::unique_ptr<CLI::App> makeProbectlGrammar(Tool& tool) {

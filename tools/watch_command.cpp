@@ -92,8 +92,7 @@ ExitStatus watch(const WatchOptions& options, Tool& tool) {
     if (ended || !isOneOf(*wanted, event)) return;
     const std::optional<std::string> line = options.changes ? text.changedLine(event) : text.line(event);
     if (!line) return;
-    tool.output << *line << '\n';
-    tool.output.flush();
+    writeLine(tool, *line);
     ++shown;
     // Who reads may have gone, or seen enough.
     ended = !tool.output || (options.count != 0 && shown == options.count);

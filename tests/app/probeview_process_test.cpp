@@ -4,8 +4,11 @@
 #include <fcntl.h>
 #include <gtest/gtest.h>
 #include <sys/stat.h>
+#include <sys/syscall.h>
 
+#include <chrono>
 #include <cstdio>
+#include <fstream>
 #include <string>
 #include <vector>
 
@@ -201,6 +204,48 @@ TEST(Programs, TheConsoleLogComesBeforeThePagesWhereStandardOutputIsNamed) {
   EXPECT_NE(shown.output.find("\nQuerying SIM files\n"), std::string::npos);
   EXPECT_NE(shown.output.find("\nReceived Valid Metric\n"), std::string::npos);
   EXPECT_NE(shown.output.find("\nprobeview › Device Info › IMSI\n"), std::string::npos);
+}
+
+// Whether the process stands in a write, as far as the system tells.
+bool isWriting(pid_t process) {
+  std::ifstream file("/proc/" + std::to_string(process) + "/syscall");
+  long call = 0;
+  return (file >> call) && (call == SYS_write || call == SYS_writev);
+}
+
+TEST(Programs, ASignalEndsAWatchWhoseReaderTakesNothing) {
+  RadixdProcess radixd("scenario:city,seed=1,speed=20");
+  ASSERT_TRUE(radixd.start());
+  int ends[2] = {};
+  ASSERT_EQ(::pipe2(ends, O_CLOEXEC), 0);
+  const FileDescriptor reading(ends[0]);
+  const FileDescriptor writing(ends[1]);
+  ASSERT_EQ(::fcntl(writing.number(), F_SETPIPE_SZ, 4096), 4096);
+  const pid_t process = ::fork();
+  if (process == 0) {
+    ::prctl(PR_SET_PDEATHSIG, SIGKILL);
+    ::dup2(writing.number(), STDOUT_FILENO);
+    ::execl(PROBECTL, PROBECTL, "watch", nullptr);
+    ::_exit(127);
+  }
+  ASSERT_GT(process, 0);
+  const auto within = [](auto condition) {
+    const auto end = std::chrono::steady_clock::now() + std::chrono::seconds(30);
+    while (!condition()) {
+      if (std::chrono::steady_clock::now() > end) return false;
+      ::poll(nullptr, 0, 5);
+    }
+    return true;
+  };
+  EXPECT_TRUE(within([&] { return isWriting(process); }));
+  ::kill(process, SIGTERM);
+  int status = 0;
+  const bool hasEnded = within([&] { return ::waitpid(process, &status, WNOHANG) == process; });
+  EXPECT_TRUE(hasEnded);
+  if (!hasEnded) {
+    ::kill(process, SIGKILL);
+    ::waitpid(process, &status, 0);
+  }
 }
 
 TEST(Programs, AReaderThatGoesAwayEndsThePrintingInPeace) {
