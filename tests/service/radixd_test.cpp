@@ -228,16 +228,13 @@ TEST_F(Radixd, AViewerOnAServiceThatHasPlayedItsTraceGetsEachRecordOnceWithItsAg
   std::ofstream(trace_) << logFrom("13.00", 20);
   radixd = std::make_unique<RadixdProcess>(words);
   ASSERT_TRUE(radixd->waitForLog("played to its end"));
-  // Twenty states and the cell. Of the twenty measurements a busy machine plays several within their period of a
-  // millisecond, and then the last of those comes alone.
+  // All twenty states. Of the twenty measurements a busy machine plays several within their period of a millisecond,
+  // and then the last of those comes alone. The cell is the trigger's: nobody has asked for it here.
   const auto countOf = [&](std::int64_t metricId) {
     return std::count_if(records.begin(), records.end(), [&](const auto& record) { return record.first == metricId; });
   };
-  ASSERT_TRUE(loop_.runUntil(
-      [&] {
-        return countOf(K_LTE_RRC_STATE) >= 20 && countOf(K_LTE_SCELL_INFO) >= 1 && countOf(K_LTE_RSRP_RSRQ_SINR) >= 1;
-      },
-      patience));
+  ASSERT_TRUE(
+      loop_.runUntil([&] { return countOf(K_LTE_RRC_STATE) == 20 && countOf(K_LTE_RSRP_RSRQ_SINR) >= 1; }, patience));
   listen();
   ASSERT_EQ(status(viewer), 0);
   ASSERT_EQ(status(viewer), 0);
