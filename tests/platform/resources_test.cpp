@@ -2,6 +2,7 @@
 #include "platform/resources.h"
 
 #include <gtest/gtest.h>
+#include <unistd.h>
 
 #include <filesystem>
 #include <fstream>
@@ -13,7 +14,8 @@ class Resources : public testing::Test {
  protected:
   void SetUp() override {
     folder_ = std::filesystem::path(testing::TempDir()) /
-              ("resources_" + std::string(testing::UnitTest::GetInstance()->current_test_info()->name()));
+              ("resources_" + std::string(testing::UnitTest::GetInstance()->current_test_info()->name()) + "_" +
+               std::to_string(::getpid()));
     std::filesystem::create_directories(folder_ / "first");
     std::filesystem::create_directories(folder_ / "second");
     setResourceFolders({(folder_ / "first").string(), (folder_ / "second").string()});

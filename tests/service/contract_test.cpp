@@ -387,8 +387,9 @@ TEST_P(Contract, WhatWaitsForAClientThatReplacesItsConfigurationIsTakenBackAndIs
   world_->settle();
   std::size_t count = 0;
   std::uint8_t number = 0;
-  // With 60 kB that nobody knows behind it, so that the transport is full soon.
-  while (queued() < 3 && count < 1000) {
+  // With 60 kB that nobody knows behind it, so that the transport is full soon. Up to 64 may wait for a moment although
+  // there is room: records leave together.
+  while (queued() <= 64 && count < 1000) {
     number = static_cast<std::uint8_t>(++count % 100);
     Bytes large = numbered(number);
     large.insert(large.end(), {0xA2, 0x1F, 0xE0, 0xD4, 0x03});
@@ -397,7 +398,7 @@ TEST_P(Contract, WhatWaitsForAClientThatReplacesItsConfigurationIsTakenBackAndIs
     world_->settle();
   }
   const std::uint64_t waited = queued();
-  ASSERT_GE(waited, 3U);
+  ASSERT_GT(waited, 64U);
   // It does not want those any more, and has not had this one.
   world_->emit(K_LTE_CDRX_CONFIG, numbered(101));
   pushNow(2, "[metrics]\nK_LTE_CDRX_CONFIG = \"on change\"\nK_LTE_TX_POWER = 1000\n");
