@@ -22,7 +22,7 @@
 #include <string_view>
 #include <vector>
 
-#include "service/metric_source.h"
+#include "source/metric_source.h"
 
 namespace probeview {
 

@@ -4,7 +4,7 @@
 #include <optional>
 #include <span>
 
-#include "service/metric_source.h"
+#include "source/metric_source.h"
 
 namespace probeview {
 

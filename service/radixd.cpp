@@ -17,6 +17,7 @@
 #include "service/log.h"
 #include "service/service.h"
 #include "service/socket_listener.h"
+#include "service/sources/make_source.h"
 
 namespace probeview {
 

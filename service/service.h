@@ -15,9 +15,9 @@
 #include "service/configuration.h"
 #include "service/last_records.h"
 #include "service/log.h"
-#include "service/metric_source.h"
 #include "service/session.h"
 #include "service/source_slot.h"
+#include "source/metric_source.h"
 
 namespace probeview {
 

@@ -11,8 +11,8 @@
 
 #include "platform/worker.h"
 #include "service/log.h"
-#include "service/metric_source.h"
 #include "service/rate_meter.h"
+#include "source/metric_source.h"
 
 namespace probeview {
 

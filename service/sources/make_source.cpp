@@ -1,12 +1,14 @@
 // SPDX-License-Identifier: Apache-2.0
 //
 // Which sources there are: one line for each kind.
+#include "service/sources/make_source.h"
+
 #include <string>
 #include <string_view>
 
-#include "service/metric_source.h"
-#include "service/sources/scenario/scenario_source.h"
+#include "scenario/scenario_source.h"
 #include "service/sources/trace_source.h"
+#include "source/metric_source.h"
 
 namespace probeview {
 

@@ -4,9 +4,9 @@
 #include <array>
 #include <cmath>
 
+#include "messages/wire_units.h"
 #include "service/sources/trace_cell.h"
 #include "service/sources/trace_field.h"
-#include "service/sources/wire_units.h"
 #include "values/plain_text.h"
 #include "values/printer.h"
 

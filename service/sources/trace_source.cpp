@@ -6,10 +6,10 @@
 #include <utility>
 
 #include "messages/metric_identifiers.h"
-#include "service/sources/metric_pacer.h"
 #include "service/sources/trace_file.h"
 #include "service/sources/trace_reader.h"
 #include "service/sources/trace_translator.h"
+#include "source/metric_pacer.h"
 #include "values/plain_text.h"
 
 namespace probeview {

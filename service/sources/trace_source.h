@@ -3,7 +3,7 @@
 
 #include <string_view>
 
-#include "service/metric_source.h"
+#include "source/metric_source.h"
 
 namespace probeview {
 

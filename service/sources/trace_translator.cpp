@@ -8,7 +8,7 @@
 #include "messages/metric_identifiers.h"
 #include "messages/runtime/data_writer.h"
 #include "messages/umts_messages.h"
-#include "service/sources/wire_units.h"
+#include "messages/wire_units.h"
 
 namespace probeview {
 

@@ -9,7 +9,7 @@
 #include <utility>
 
 #include "platform/manual_loop.h"
-#include "service/metric_source.h"
+#include "service/sources/make_source.h"
 #include "store/metric_validator.h"
 #include "tests/support/golden.h"
 #include "ui/category_page.h"

@@ -20,8 +20,10 @@ ROOMS = {
     "ui/terminal": {"values", "platform", "ui"},
     "ui/qt": {"values", "platform", "ui"},
     "app": {"values", "platform", "messages/runtime", "messages", "radix", "client", "store", "ui", "ui/qt", "ui/terminal"},
-    "capture": {"values", "platform", "messages/runtime", "messages"},
-    "service": {"values", "platform", "messages/runtime", "messages", "radix", "capture"},
+    "source": {"values", "platform", "radix"},
+    "scenario": {"values", "platform", "messages/runtime", "messages", "source"},
+    "service": {"values", "platform", "messages/runtime", "messages", "radix", "source", "service/sources"},
+    "service/sources": {"values", "platform", "messages/runtime", "messages", "source", "scenario"},
     "schema": {"values", "messages/runtime", "messages"},
 }
 # These stand outside the house and may look into every room.

@@ -4,8 +4,8 @@
 #include <algorithm>
 
 #include "messages/metric_identifiers.h"
+#include "scenario/edges_story.h"
 #include "schema/facts.h"
-#include "service/sources/scenario/edges_story.h"
 #include "tests/store/store_fixture.h"
 
 namespace probeview {

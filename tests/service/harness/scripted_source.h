@@ -10,7 +10,7 @@
 #include <utility>
 #include <vector>
 
-#include "service/metric_source.h"
+#include "source/metric_source.h"
 
 namespace probeview {
 

@@ -1,0 +1,143 @@
+// SPDX-License-Identifier: Apache-2.0
+#include <algorithm>
+
+#include "messages/wire_units.h"
+#include "scenario/family_reports.h"
+#include "scenario/selection.h"
+
+namespace probeview::scenario {
+namespace {
+
+// System information counts some differences in steps.
+constexpr std::uint32_t kGsmDecibelsPerStep = 2;
+
+// The power control level of the largest power in the band (3GPP TS 45.005, 4.1.1).
+std::uint32_t largestPowerLevel(const Carrier& carrier) { return carrier.band == 1800 ? 0 : 5; }
+
+}  // namespace
+
+void report(const Phone& phone, KCellularGsmScellInfo& message) {
+  if (phone.gsm().connection == GsmConnection::kInactive) {
+    // The cell that was left serves no more.
+    message.setState(KCellularGsmScellInfo::State::NON_DEDICATED_STATE);
+    return;
+  }
+  const CellIndex serving = *phone.gsm().serving;
+  const Cell& cell = phone.network().cells[serving];
+  const Carrier& carrier = phone.network().carrierOf(serving);
+  message.setMcc(kCountryCode);
+  message.setMnc(kNetworkCode);
+  message.setLac(cell.areaCode);
+  message.setCellId(cell.identity);
+  message.setGsmBand(bandCode(carrier));
+  message.setArfcn(carrier.channel);
+  message.setBsic(cell.physicalIdentity);
+  message.setState(phone.gsm().connection == GsmConnection::kDedicated
+                       ? KCellularGsmScellInfo::State::DEDICATED_STATE
+                       : KCellularGsmScellInfo::State::NON_DEDICATED_STATE);
+  message.setNumMncDigits(kNetworkCodeDigits);
+}
+
+// What system information 3 and 4 say (3GPP TS 44.018, 9.1.35 and 10.5.2).
+void report(const Phone& phone, KCellularGsmIdleConfig& message) {
+  const CellIndex serving = *phone.gsm().serving;
+  const Cell& cell = phone.network().cells[serving];
+  const Carrier& carrier = phone.network().carrierOf(serving);
+  message.setArfcnBcch(carrier.channel);
+  message.setMcc(kCountryCode);
+  message.setMnc(kNetworkCode);
+  message.setLac(cell.areaCode);
+  message.setCi(cell.identity);
+  message.setBsic(cell.physicalIdentity);
+  message.setDtxFromBs(1);         // the phone shall use discontinuous transmission
+  message.setRadioLinkTimeout(4);  // 20 SACCH blocks
+  message.setMultibRep(2);         // neighbours of the other band to report
+  message.setGsmBand(static_cast<std::uint32_t>(bandCode(carrier)));
+  message.setMsTxpwr(largestPowerLevel(carrier));
+  message.setRxAccMin(units::gsmRxLev.toUnsigned(GsmSelection::kRxLevAccessMin));
+  message.setCbq(0);
+  message.setCba(0);
+  message.setC2Valid(1);
+  message.setTmpOffset(0);
+  message.setPenaltyT(0);
+  message.setT3212(10);  // tenths of hours
+  message.setAcc(0);     // no access class is barred
+  message.setBsPaMfrms(4);
+  message.setCsPagemode(0);
+  message.setMaxRetransCs(2);  // 4 times
+  message.setEmergCallAllowed(1);
+  message.setAttachAllowed(1);
+  message.setHalfRateSupported(1);
+  message.setSi78Broadcast(0);
+  message.setCbchSupported(0);
+  message.setReestAllowed(1);
+  message.setEcsc(1);  // the phone reports its classmark early
+  message.setSi2TerNeeded(0);
+}
+
+void report(const Phone& phone, KCellularGsmIdleScellMeasurement& message) {
+  const GsmState& gsm = phone.gsm();
+  message.setScellArfcn(phone.network().carrierOf(*gsm.serving).channel);
+  message.setCurrentAntenna(gsm.antenna);
+  message.setIdleRxlevDBm(units::gsmIdleLevel.toSigned(gsm.rxLev));
+}
+
+void report(const Phone& phone, KCellularGsmCsRfMeasurement& message) {
+  const GsmState& gsm = phone.gsm();
+  const Carrier& carrier = phone.network().carrierOf(*gsm.dedicatedCell);
+  message.setScellArfcn(carrier.channel);
+  message.setCurrentAntenna(gsm.antenna);
+  for (const int power : gsm.transmitPowers) message.addCsTxPwr(power);
+  message.setCsRxlevSub(units::gsmRxLev.toUnsigned(gsm.dedicatedRxLev));
+  message.setCsRxqualSub(gsm.rxQual);
+  message.setScellBand(static_cast<std::uint32_t>(bandCode(carrier)));
+}
+
+void report(const Phone& phone, KCellularGsmGrrEventMeasCr& message) {
+  const Network& network = phone.network();
+  for (const CellMeasurement& measured : phone.gsm().neighbours.gsm) {
+    const Cell& cell = network.cells[measured.cell];
+    GsmNcellMeas& neighbour = message.addGsmNcellMeas();
+    neighbour.setMcc(kCountryCode);
+    neighbour.setMnc(kNetworkCode);
+    neighbour.setLac(cell.areaCode);
+    neighbour.setCi(cell.identity);
+    neighbour.setBsic(cell.physicalIdentity);
+    neighbour.setArfcn(network.carrierOf(measured.cell).channel);
+    neighbour.setRxlev(units::gsmRxLev.toUnsigned(measured.strength));
+  }
+  for (const CellMeasurement& measured : phone.gsm().neighbours.umts) {
+    UmtsNcellMeas& neighbour = message.addUmtsNcellMeas();
+    neighbour.setCpichSc(network.cells[measured.cell].physicalIdentity);
+    neighbour.setDlUarfcn(network.carrierOf(measured.cell).channel);
+    neighbour.setCpichRscp(units::utraRscp.toUnsigned(measured.strength));
+    neighbour.setCpichEcn0(units::utraEcNo.toUnsigned(measured.quality));
+  }
+  for (const CellMeasurement& measured : phone.gsm().neighbours.lte) {
+    const Carrier& carrier = network.carrierOf(measured.cell);
+    LteNcellMeas& neighbour = message.addLteNcellMeas();
+    neighbour.setPhysicalCellId(network.cells[measured.cell].physicalIdentity);
+    if (const auto index = units::lteBandwidthIndex(bandwidthMegahertz(carrier))) neighbour.setBandwidth(*index);
+    neighbour.setRsrp(units::lteRsrp.toUnsigned(measured.strength));
+    neighbour.setEarfcn(carrier.channel);
+    neighbour.setRsrq(units::lteRsrq.toUnsigned(measured.quality));
+  }
+}
+
+// What system information 13 says (3GPP TS 44.018, 10.5.2.37b; 44.060, 12.24), and that the cell is not barred
+// (44.060, 11.2.20).
+void report(const Phone& phone, KCellularGsmGprsConfig& message) {
+  const Cell& cell = phone.network().cells[*phone.gsm().serving];
+  message.setGprsSup(true);
+  message.setRac(cell.routingAreaCode);
+  message.setSpPgCy(true);
+  message.setNco(0);  // the phone chooses its cells itself
+  message.setNom(2);  // circuit and packet services page apart
+  message.setCrHyst(GsmSelection::kReselectHysteresis / kGsmDecibelsPerStep);
+  message.setAccThr(6);
+  message.setExtUplTbfSupported(true);
+  message.setPriorityClass(0);
+  message.setCellBarAccess2(0);
+}
+
+}  // namespace probeview::scenario

@@ -1,0 +1,145 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include <array>
+#include <cstdint>
+#include <optional>
+#include <string>
+#include <vector>
+
+#include "scenario/modem.h"
+
+namespace probeview::scenario {
+
+// The numbers are those of the metric service.
+enum class LteConnection : std::int32_t {
+  kNull = 0,
+  kIdle = 1,
+  kAttemptingConnection = 2,
+  kConnected = 3,
+  kEnding = 4,
+  kAttemptingOutboundMobility = 5,
+  kAttemptingInboundMobility = 6,
+};
+
+enum class LteCause : std::int32_t {
+  kEstablishMobileTerminated = 2,
+  kEstablishSignalling = 3,
+  kEstablishData = 4,
+  kReestablishHandoverFailure = 7,
+  kReleaseT311Expired = 11,
+  kReleaseReestablishmentRejected = 13,
+  kReleaseLoadBalancing = 14,
+  kReleaseOther = 15,
+  kReleaseMobilityFromEutran = 20,
+  kEstablishMobilityToEutran = 21,
+  kEstablishNoResponse = 22,
+  kReestablishT310Expired = 27,
+  kNoService = 254,
+  kNotApplicable = 255,
+};
+
+// The numbers are those of the metric service.
+enum class SecondaryState : std::int32_t { kDeconfigured = 0, kDeactivated = 1, kActivated = 2 };
+
+struct SecondaryCarrier {
+  CellIndex cell = 0;
+  std::uint32_t index = 1;  // from 1; stays as long as the carrier is there, whatever becomes of the others
+  SecondaryState state = SecondaryState::kDeactivated;
+  double rsrp = 0, rsrq = 0, sinr = 0, rssi = 0;
+};
+
+// One look at the serving cell with both antennas, between the slower measurements of layer 1.
+struct LteSample {
+  CellIndex cell = 0;
+  std::array<double, 2> rsrp{};
+  std::array<double, 2> rsrq{};
+  std::array<double, 2> sinr{};
+};
+
+// What one uplink subframe was sent with, in dBm.
+struct TransmitPower {
+  std::optional<double> control;  // PUCCH
+  std::optional<double> shared;   // PUSCH, or the whole of UTRA's uplink
+  unsigned subframe = 0;          // 0 to 9
+};
+
+struct LteState {
+  LteConnection connection = LteConnection::kNull;
+  std::optional<LteConnection> previous;  // none before the first change
+  Milliseconds since = 0;
+  Milliseconds previousDuration = 0;
+  LteCause cause = LteCause::kNotApplicable;
+  std::optional<CellIndex> serving;  // the cell that serves, or the last one that did
+  double rsrp = 0, rsrq = 0, sinr = 0;
+  NeighbourLists neighbours;
+  std::vector<LteSample> samples;  // the ten at most of the last report, the oldest first
+  std::vector<TransmitPower> transmitPowers;
+  std::vector<SecondaryCarrier> secondaries;
+  unsigned transmissionMode = 3;
+
+  // C-DRX is configured with the connection and ends with it, also when the phone leaves, looks for a cell in which to
+  // go on or is on its way to another technology (3GPP TS 36.331, 5.3.7.2, 5.3.12 and 5.4.3).
+  bool drxConfigured() const { return connected(); }
+  bool connected() const { return connection == LteConnection::kConnected; }
+  bool camped() const { return connection != LteConnection::kNull; }
+};
+
+// The phone in E-UTRA: idle mode, connections, handover, carrier aggregation, radio link failure.
+class LteModem {
+ public:
+  explicit LteModem(const Network& network) : network_(network) {}
+
+  const LteState& state() const { return state_; }
+
+  // Camps on a cell, or arrives in it with a connection.
+  void enter(CellIndex cell, Manner manner, const Circumstances& c);
+  // The phone has gone to another technology.
+  void leave(LteCause cause, const Circumstances& c);
+  // Goes one step on. A departure is the wish to be elsewhere; the phone then calls leave() here and enter() there.
+  std::optional<Departure> advance(const Circumstances& c);
+  // Whether the cell that served is gone and no other of this technology has been found.
+  bool lost() const { return lost_; }
+
+ private:
+  void change(LteConnection to, LteCause cause, const Circumstances& c);
+  void serve(CellIndex cell, const Circumstances& c);
+  void measure(const Circumstances& c);
+  void sample(const Circumstances& c);
+  void control(const Circumstances& c);
+  std::optional<Departure> advanceIdle(const Circumstances& c);
+  std::optional<CellIndex> reselectionCandidate(const Circumstances& c) const;
+  std::optional<Departure> advanceConnected(const Circumstances& c);
+  std::optional<CellIndex> handoverCandidate(const Circumstances& c) const;
+  std::optional<CellIndex> outboundCandidate(const Circumstances& c) const;
+  void superviseLink(const Circumstances& c);
+  void beginReestablishment(LteCause cause, const Circumstances& c);
+  void advanceReestablishment(const Circumstances& c);
+  void aggregate(const Circumstances& c);
+  void endAggregation(const Circumstances& c);
+  void forgetDeconfigured(const Circumstances& c);
+  void becomeConnected(LteCause cause, const Circumstances& c);
+  std::optional<CellIndex> selectionCandidate(const Circumstances& c) const;
+
+  const Network& network_;
+  LteState state_;
+  Milliseconds deadline_ = 0;  // of the present state, where it has one
+  Milliseconds backOff_ = 0;   // no connection attempt before
+  Milliseconds lastActivity_ = 0;
+  Milliseconds downloadSince_ = -1;
+  Milliseconds cellFailingSince_ = -1;
+  int outOfSync_ = 0;
+  Milliseconds t310Ends_ = -1;
+  bool reestablishing_ = false;
+  bool lost_ = false;
+  Pending reselection_;
+  Pending handover_;
+  Pending outbound_;
+  std::optional<CellIndex> executing_;  // the target of a handover that has been ordered
+  Milliseconds executesAt_ = 0;
+  std::optional<Departure> leaving_;  // a departure that has been ordered
+  unsigned nextSubframe_ = 0;
+  std::vector<LteSample> samples_;  // those of the serving cell up to now, ten at most, the oldest first
+};
+
+}  // namespace probeview::scenario

@@ -1,0 +1,215 @@
+// SPDX-License-Identifier: Apache-2.0
+#include <algorithm>
+#include <array>
+#include <set>
+#include <string>
+
+#include "messages/wire_units.h"
+#include "scenario/family_reports.h"
+#include "scenario/selection.h"
+
+namespace probeview::scenario {
+namespace {
+
+std::uint32_t bandwidthIndex(const Carrier& carrier) {
+  return units::lteBandwidthIndex(bandwidthMegahertz(carrier)).value_or(0);
+}
+
+// System information counts levels in steps of 2 dB (3GPP TS 36.331, 6.3.4: Q-RxLevMin, ReselectionThreshold).
+constexpr int kLteDecibelsPerStep = 2;
+
+void fill(RsrpRsrqSinr& values, const Network& network, const LteSample& sample) {
+  values.setPhyCellId(network.cells[sample.cell].physicalIdentity);
+  values.setRsrp0(units::lteSampleRsrp.toSigned(sample.rsrp[0]));
+  values.setRsrp1(units::lteSampleRsrp.toSigned(sample.rsrp[1]));
+  values.setRsrq0(units::lteSampleRsrq.toSigned(sample.rsrq[0]));
+  values.setRsrq1(units::lteSampleRsrq.toSigned(sample.rsrq[1]));
+  values.setSinr0(units::lteSampleSinr.toSigned(sample.sinr[0]));
+  values.setSinr1(units::lteSampleSinr.toSigned(sample.sinr[1]));
+}
+
+}  // namespace
+
+void report(const Phone& phone, KCellularLteRrcState& message) {
+  const LteState& lte = phone.lte();
+  message.setState(static_cast<std::int32_t>(lte.connection));
+  if (lte.previous) {
+    message.setPrevState(static_cast<std::int32_t>(*lte.previous));
+    message.setPrevStateDurMs(static_cast<std::uint32_t>(lte.previousDuration));
+  }
+  message.setCause(static_cast<std::int32_t>(lte.cause));
+}
+
+void report(const Phone& phone, KCellularLteCdrxConfig& message) {
+  const LteState& lte = phone.lte();
+  message.setRrcState(static_cast<std::int32_t>(lte.connection));
+  message.setCdrxConfigStatus(lte.drxConfigured() ? 1 : 0);
+  if (!lte.drxConfigured()) return;
+  message.setOnDurationMs(LteDrx::kOnDuration);
+  message.setDrxInactivityMs(LteDrx::kInactivity);
+  message.setDrxRetxTimerMs(LteDrx::kRetransmission);
+  message.setLongDrxCycleMs(LteDrx::kLongCycle);
+  message.setShortDrxCycleMs(LteDrx::kShortCycle);
+  message.setDrxShortCycleNum(LteDrx::kShortCycles);
+  message.setTransmissionMode(lte.transmissionMode);
+}
+
+void report(const Phone& phone, KCellularLteScellInfo& message) {
+  const CellIndex serving = *phone.lte().serving;
+  const Cell& cell = phone.network().cells[serving];
+  const Carrier& carrier = phone.network().carrierOf(serving);
+  message.setPhyCellId(cell.physicalIdentity);
+  message.setDlFreq(carrier.channel);
+  message.setUlFreq(carrier.channel + kUplinkChannelOffset);
+  message.setDlBw(units::lteServingDownlinkBandwidth(bandwidthMegahertz(carrier)));
+  message.setUlBw(units::lteServingUplinkBandwidth(bandwidthMegahertz(carrier)));
+  message.setCellId(cell.identity);
+  message.setFreqBandInd(carrier.band);
+  message.setTrackingAreaCode(cell.areaCode);
+  message.setNumMncDigits(kNetworkCodeDigits);
+  message.setSelPlmnMcc(kCountryCode);
+  message.setSelPlmnMnc(kNetworkCode);
+}
+
+void report(const Phone& phone, KCellularLteSelReselCellInfo& message) {
+  const Network& network = phone.network();
+  const Carrier& serving = network.carrierOf(*phone.lte().serving);
+  // Band 3 reaches into band 9, which phones of another region know the carrier by (3GPP TS 36.331, 6.3.1).
+  if (serving.band == 3) message.addMultiBandInfo(9);
+  message.setImsEmergencySupport(network.hasVoiceOverIms(*phone.lte().serving) ? 1 : 0);
+  message.setAcBarringForEmergency(0);
+  message.setQRxLevMin(LteSelection::kQRxLevMin / kLteDecibelsPerStep);
+  message.setQQualMin(LteSelection::kQQualMin);
+  message.setQHyst(LteSelection::kHysteresis);
+  message.setSNonIntraSearchP(LteSelection::kNonIntraSearchP / kLteDecibelsPerStep);
+  message.setSNonIntraSearchQ(LteSelection::kNonIntraSearchQ);
+  message.setSIntraSearchP(LteSelection::kIntraSearchP / kLteDecibelsPerStep);
+  message.setSIntraSearchQ(LteSelection::kIntraSearchQ);
+  message.setThreshServingLowP(LteSelection::kServingLowP / kLteDecibelsPerStep);
+  message.setPriorityOperatingFreq(serving.priority);
+  std::set<std::uint32_t> listed{serving.channel};
+  for (const Carrier& carrier : network.carriers) {
+    if (carrier.technology != Technology::kLte || !listed.insert(carrier.channel).second) continue;
+    NbrEutra& neighbour = message.addNbrEutra();
+    neighbour.setEarfcn(carrier.channel);
+    neighbour.setQRxlevMin(LteSelection::kQRxLevMin / kLteDecibelsPerStep);
+    neighbour.setQQualMin(LteSelection::kQQualMin);
+    neighbour.setQOffset(0);
+    neighbour.setPmax(LteSelection::kMaximumPower);
+    neighbour.setDlBw(bandwidthIndex(carrier));
+    neighbour.setThresXHighP(LteSelection::kCandidateHighP / kLteDecibelsPerStep);
+    neighbour.setThresXLowP(LteSelection::kCandidateLowP / kLteDecibelsPerStep);
+    neighbour.setThresXHighQ(LteSelection::kCandidateHighQ);
+    neighbour.setThresXLowQ(LteSelection::kCandidateLowQ);
+    neighbour.setPriority(carrier.priority);
+    neighbour.setFrameType(NbrEutra::FrameType::FDD);
+    neighbour.setBand(carrier.band);
+  }
+}
+
+void report(const Phone& phone, KCellularLteTxPower& message) {
+  for (const TransmitPower& power : phone.lte().transmitPowers) {
+    TxPowerInfo& info = message.addTxPowerInfo();
+    if (power.control) info.setPucchTxPower(wholeDecibels(*power.control));
+    if (power.shared) info.setPuschTxPower(wholeDecibels(*power.shared));
+    info.setSubframeIndex(power.subframe);
+  }
+}
+
+void report(const Phone& phone, KCellularLteRsrpRsrqSinr& message) {
+  const auto& samples = phone.lte().samples;
+  const auto count = static_cast<std::uint32_t>(samples.size());
+  const auto period = static_cast<std::uint32_t>(kStep);
+  if (phone.traffic().activity() == Activity::kVoice) {
+    message.setCallId("call " + std::to_string(phone.traffic().calls()));
+  }
+  message.setLastYSamples(count);
+  message.setSamplePeriodMs(period);
+  message.setDurationMs(count * period);
+  message.setNumSamples(count);
+  LteSample average;
+  for (const LteSample& sample : samples) {
+    fill(message.addInstValues(), phone.network(), sample);
+    average.cell = sample.cell;
+    for (std::size_t antenna = 0; antenna < 2; ++antenna) {
+      average.rsrp[antenna] += sample.rsrp[antenna] / count;
+      average.rsrq[antenna] += sample.rsrq[antenna] / count;
+      average.sinr[antenna] += sample.sinr[antenna] / count;
+    }
+  }
+  if (samples.empty()) return;
+  auto values = Shared<RsrpRsrqSinr>::make();
+  fill(*values, phone.network(), average);
+  message.setAvgValues(std::move(values));
+}
+
+void report(const Phone& phone, KCellularLteComponentCarrierInfo& message) {
+  const Network& network = phone.network();
+  const Carrier& primary = network.carrierOf(*phone.lte().serving);
+  message.setPccEarfcn(primary.channel);
+  message.setPccBandwidth(bandwidthIndex(primary));
+  unsigned secondary = 0;
+  for (const SecondaryCarrier& entry : phone.lte().secondaries) {
+    if (entry.state == SecondaryState::kDeconfigured) continue;
+    const Carrier& carrier = network.carrierOf(entry.cell);
+    if (secondary == 0) {
+      message.setScc0Earfcn(carrier.channel);
+      message.setScc0Bandwidth(bandwidthIndex(carrier));
+    } else {
+      message.setScc1Earfcn(carrier.channel);
+      message.setScc1Bandwidth(bandwidthIndex(carrier));
+    }
+    ++secondary;
+  }
+}
+
+void report(const Phone& phone, KCellularLteCarrierAggregationStatus& message) {
+  const Network& network = phone.network();
+  for (const SecondaryCarrier& entry : phone.lte().secondaries) {
+    const Carrier& carrier = network.carrierOf(entry.cell);
+    SecondaryComponentCarrier& listed = message.addSccList();
+    listed.setIndex(entry.index);
+    listed.setState(static_cast<std::int32_t>(entry.state));
+    listed.setPci(network.cells[entry.cell].physicalIdentity);
+    listed.setDlEarfcn(carrier.channel);
+    listed.setDlRfBand(carrier.band);
+    listed.setDlBandwidth(bandwidthIndex(carrier));
+    listed.setHasUplink(false);                                  // the phone sends on its primary carrier only
+    if (entry.state == SecondaryState::kDeconfigured) continue;  // and is not measured any more
+    listed.setRsrp(units::lteCarrierRsrp.toSigned(entry.rsrp));
+    listed.setRsrq(units::lteCarrierRsrq.toSigned(entry.rsrq));
+    listed.setSnr(wholeDecibels(entry.sinr));
+    listed.setRssi(units::lteCarrierRssi.toSigned(entry.rssi));
+  }
+}
+
+void report(const Phone& phone, KCellularLteNbrEutraCellMeas& message) {
+  const Network& network = phone.network();
+  for (const CellMeasurement& measured : phone.lte().neighbours.lte) {
+    EgwErrcNbrEutraMeas& neighbour = message.addMeasNbrEutra();
+    neighbour.setNbrEarfcn(network.carrierOf(measured.cell).channel);
+    neighbour.setNbrPhysCellId(network.cells[measured.cell].physicalIdentity);
+    neighbour.setFreqBandInd(network.carrierOf(measured.cell).band);
+    neighbour.setNbrRsrp(units::lteRsrp.toSigned(measured.strength));
+    neighbour.setNbrRsrq(units::lteRsrq.toSigned(measured.quality));
+  }
+}
+
+void report(const Phone& phone, KCellularLteNbrInterRatCellMeas& message) {
+  const Network& network = phone.network();
+  for (const CellMeasurement& measured : phone.lte().neighbours.umts) {
+    EgwErrcNbrUtraMeas& neighbour = message.addMeasNbrUtra();
+    neighbour.setUarfcn(network.carrierOf(measured.cell).channel);
+    neighbour.setPsc(network.cells[measured.cell].physicalIdentity);
+    neighbour.setRscp(units::utraRscp.toSigned(measured.strength));
+    neighbour.setEcno(units::utraEcNo.toUnsigned(measured.quality));
+  }
+  for (const CellMeasurement& measured : phone.lte().neighbours.gsm) {
+    EgwErrcNbrGeranMeas& neighbour = message.addMeasNbrGeran();
+    neighbour.setArfcn(network.carrierOf(measured.cell).channel);
+    neighbour.setBsic(network.cells[measured.cell].physicalIdentity);
+    neighbour.setRxlev(units::gsmRxLev.toUnsigned(measured.strength));
+  }
+}
+
+}  // namespace probeview::scenario

@@ -1,0 +1,140 @@
+// SPDX-License-Identifier: Apache-2.0
+#include <set>
+
+#include "messages/wire_units.h"
+#include "scenario/family_reports.h"
+#include "scenario/selection.h"
+
+namespace probeview::scenario {
+std::int32_t bandCode(const Carrier& carrier) {
+  using Band = KCellularWcdmaCellInfo::WcdmaBand;
+  switch (carrier.technology) {
+    case Technology::kGsm:
+      return carrier.band == 1800 ? Band::SYS_BAND_GSM_DCS_1800 : Band::SYS_BAND_GSM_PGSM_900;
+    case Technology::kUmts:
+      return Band::SYS_BAND_WCDMA_I_IMT_2000 + static_cast<std::int32_t>(carrier.band) - 1;
+    case Technology::kLte:
+      return Band::SYS_BAND_LTE_EUTRAN_BAND1 + static_cast<std::int32_t>(carrier.band) - 1;
+  }
+  return 0;
+}
+
+void report(const Phone& phone, KCellularWcdmaRrcConnectionState& message) {
+  const UmtsState& umts = phone.umts();
+  message.setState(static_cast<std::int32_t>(umts.connection));
+  if (umts.establishment) message.setEstablishmentCause(static_cast<std::int32_t>(*umts.establishment));
+  if (umts.release) message.setReleaseCause(static_cast<std::int32_t>(*umts.release));
+}
+
+void report(const Phone& phone, KCellularWcdmaRrcConfiguration& message) {
+  const UmtsState& umts = phone.umts();
+  if (umts.drxCycle) message.setDrxCycleLengthMs(*umts.drxCycle);
+  message.setIsMimoConfigured(false);
+  message.setIsDcConfigured(umts.dualCarrier);
+}
+
+void report(const Phone& phone, KCellularWcdmaCellInfo& message) {
+  const CellIndex serving = *phone.umts().serving;
+  const Cell& cell = phone.network().cells[serving];
+  const Carrier& carrier = phone.network().carrierOf(serving);
+  message.setMcc(kCountryCode);
+  message.setMnc(kNetworkCode);
+  message.setLac(cell.areaCode);
+  message.setCellId(cell.identity);
+  message.setWcdmaBand(bandCode(carrier));
+  message.setDlUarfcn(carrier.channel);
+  message.setPsc(cell.physicalIdentity);
+  message.setNumMncDigits(kNetworkCodeDigits);
+  // The older carrier was never fitted for fast uplink.
+  message.setHspa(carrier.band == 8 ? KCellularWcdmaCellInfo::Hspa::SYS_HS_IND_HSDPA_SUPP_CELL
+                                    : KCellularWcdmaCellInfo::Hspa::SYS_HS_IND_HSDPA_HSUPA_SUPP_CELL);
+}
+
+void report(const Phone& phone, KCellularWcdmaScellMeasurement& message) {
+  const UmtsState& umts = phone.umts();
+  message.setConnectedMode(umts.measuredConnected);
+  for (const double power : umts.antennaPower) {
+    // RSRP and RSRQ are of E-UTRA; what UTRA has in their place has no field here.
+    RxInfo& info = message.addRxInfo();
+    info.setRssi(wholeDecibels(power));
+    info.setSnr(wholeDecibels(umts.pilotRatio));
+  }
+}
+
+void report(const Phone& phone, KCellularWcdmaTxPower& message) {
+  for (const TransmitPower& power : phone.umts().transmitPowers) {
+    // UTRA has one uplink power; its place is that of the shared channel.
+    TxPowerInfo& info = message.addTxPowerInfo();
+    if (power.shared) info.setPuschTxPower(wholeDecibels(*power.shared));
+    info.setSubframeIndex(power.subframe);
+  }
+}
+
+void report(const Phone& phone, KCellularWcdmaSelReselCellInfo& message) {
+  const UmtsState& umts = phone.umts();
+  const Network& network = phone.network();
+  const Carrier& serving = network.carrierOf(*umts.serving);
+  message.setHsdpaCapable(1);
+  message.setEdchCapable(serving.band == 8 ? 0 : 1);
+  message.setDuplexMode(KCellularWcdmaSelReselCellInfo::DuplexMode::FDD);
+  message.setCellBarred(0);
+  message.setFachMeasOccInfoPresent(1);
+  message.setSRxlev(wholeDecibels(umts.rscp - UmtsSelection::kQRxLevMin));
+  message.setSQual(wholeDecibels(umts.ecNo - UmtsSelection::kQQualMin));
+  message.setSIntrasearch(UmtsSelection::kIntraSearch);
+  message.setSIntersearch(UmtsSelection::kInterSearch);
+  message.setSSearchRat(UmtsSelection::kSearchRat);
+  message.setSCellPrio(serving.priority);
+  std::set<std::pair<Technology, std::uint32_t>> listed;
+  for (const Carrier& carrier : network.carriers) {
+    if (!listed.insert({carrier.technology, carrier.channel}).second) continue;
+    switch (carrier.technology) {
+      case Technology::kLte: {
+        EutraFreqInfo& info = message.addEutraPrioInfo();
+        info.setEarfcn(carrier.channel);
+        info.setPrio(carrier.priority);
+        break;
+      }
+      case Technology::kUmts: {
+        UtraFreqInfo& info = message.addUtraPrioInfo();
+        info.setUarfcn(carrier.channel);
+        info.setPrio(carrier.priority);
+        break;
+      }
+      case Technology::kGsm: {
+        GsmFreqInfo& info = message.addGsmPrioInfo();
+        info.setArfcn(carrier.channel);
+        info.setPrio(carrier.priority);
+        break;
+      }
+    }
+  }
+}
+
+void report(const Phone& phone, KCellularWcdmaNbrCellMeas& message) {
+  const Network& network = phone.network();
+  for (const CellMeasurement& measured : phone.umts().neighbours.umts) {
+    UtraCellMeasResult& result = message.addMeasUtraResult();
+    result.setUarfcn(network.carrierOf(measured.cell).channel);
+    result.setBand(network.carrierOf(measured.cell).band);
+    result.setPsc(network.cells[measured.cell].physicalIdentity);
+    result.setEcno(units::utraEcNo.toUnsigned(measured.quality));
+    result.setRscp(units::utraRscp.toSigned(measured.strength));
+  }
+  for (const CellMeasurement& measured : phone.umts().neighbours.gsm) {
+    GsmCellMeasResult& result = message.addMeasGsmResult();
+    result.setArfcn(network.carrierOf(measured.cell).channel);
+    result.setBsic(network.cells[measured.cell].physicalIdentity);
+    result.setRxlev(units::gsmRxLev.toUnsigned(measured.strength));
+  }
+  for (const CellMeasurement& measured : phone.umts().neighbours.lte) {
+    LteCellMeasResult& result = message.addMeasLteResult();
+    result.setEarfcn(network.carrierOf(measured.cell).channel);
+    result.setPhyCellId(network.cells[measured.cell].physicalIdentity);
+    result.setEutraBand(network.carrierOf(measured.cell).band);
+    result.setRsrp(units::lteRsrp.toSigned(measured.strength));
+    result.setRsrq(units::lteRsrq.toSigned(measured.quality));
+  }
+}
+
+}  // namespace probeview::scenario
