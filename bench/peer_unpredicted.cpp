@@ -7,8 +7,8 @@
 #include "bench/classes.h"
 #include "messages/gsm_messages.h"
 #include "messages/lte_messages.h"
+#include "messages/metric_utility.h"
 #include "messages/nas_messages.h"
-#include "messages/runtime/metric_utility.h"
 #include "messages/runtime/table_walker.h"
 #include "messages/umts_messages.h"
 

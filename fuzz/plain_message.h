@@ -12,8 +12,8 @@
 #include <string>
 #include <vector>
 
+#include "messages/metric_utility.h"
 #include "messages/runtime/field_descriptor.h"
-#include "messages/runtime/metric_utility.h"
 #include "values/dictionary.h"
 
 namespace probeview {

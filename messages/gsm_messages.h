@@ -152,6 +152,18 @@ class KCellularGsmGprsConfig final : public PBCodable {
   PB_FIELD(11, "cell_bar_access_2",     cellBarAccess2,     CellBarAccess2,     uint32);
 };
 
+// All of them, in the order of the registry.
+#define GSM_MESSAGES(EACH) \
+  EACH(KCellularGsmScellInfo) \
+  EACH(KCellularGsmIdleConfig) \
+  EACH(KCellularGsmIdleScellMeasurement) \
+  EACH(KCellularGsmCsRfMeasurement) \
+  EACH(KCellularGsmGrrEventMeasCr) \
+  EACH(GsmNcellMeas) \
+  EACH(UmtsNcellMeas) \
+  EACH(LteNcellMeas) \
+  EACH(KCellularGsmGprsConfig)
+
 // clang-format on
 
 }  // namespace probeview

@@ -299,6 +299,28 @@ class KCellularLteNbrInterRatCellMeas final : public PBCodable {
   PB_LIST (3, "meas_nbr_geran", measNbrGerans, MeasNbrGerans, measNbrGeran, MeasNbrGeran, repeated<message<EgwErrcNbrGeranMeas>>);
 };
 
+// All of them, in the order of the registry.
+#define LTE_MESSAGES(EACH) \
+  EACH(KCellularLteRrcState) \
+  EACH(KCellularLteCdrxConfig) \
+  EACH(KCellularLteScellInfo) \
+  EACH(KCellularLteSelReselCellInfo) \
+  EACH(NbrEutra) \
+  EACH(KCellularLteServingCellMeasurement) \
+  EACH(RxInfo) \
+  EACH(KCellularLteTxPower) \
+  EACH(TxPowerInfo) \
+  EACH(KCellularLteRsrpRsrqSinr) \
+  EACH(RsrpRsrqSinr) \
+  EACH(KCellularLteComponentCarrierInfo) \
+  EACH(KCellularLteCarrierAggregationStatus) \
+  EACH(SecondaryComponentCarrier) \
+  EACH(KCellularLteNbrEutraCellMeas) \
+  EACH(EgwErrcNbrEutraMeas) \
+  EACH(KCellularLteNbrInterRatCellMeas) \
+  EACH(EgwErrcNbrUtraMeas) \
+  EACH(EgwErrcNbrGeranMeas)
+
 // clang-format on
 
 }  // namespace probeview

@@ -307,6 +307,22 @@ class KCellularSimCardFiles final : public PBCodable {
   PB_LIST (2, "ef_list",   efLists,   EfLists, efList, EfList, repeated<message<ElementaryFile>>);
 };
 
+// All of them, in the order of the registry.
+#define NAS_MESSAGES(EACH) \
+  EACH(KCellularMmCommonInfo) \
+  EACH(Plmn) \
+  EACH(KCellularLocationAreaId) \
+  EACH(KCellularTrackingAreaId) \
+  EACH(KCellularMmContext) \
+  EACH(KCellularGmmContext) \
+  EACH(RoutingAreaId) \
+  EACH(KCellularEmmContext) \
+  EACH(Guti) \
+  EACH(KCellularActivatedBearerContexts) \
+  EACH(BearerContext) \
+  EACH(KCellularSimCardFiles) \
+  EACH(ElementaryFile)
+
 // clang-format on
 
 }  // namespace probeview

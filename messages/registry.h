@@ -10,7 +10,7 @@
 
 namespace probeview {
 
-// The 54 message classes, LTE, UMTS, GSM, then NAS, bearers and SIM; the order is fixed. descriptor->make() makes an
+// The message classes, LTE, UMTS, GSM, then NAS, bearers and SIM; the order is fixed. descriptor->make() makes an
 // empty message of the class.
 std::span<const MessageDescriptor* const> messageClasses() noexcept;
 

@@ -291,6 +291,22 @@ class KCellularWcdmaNbrCellMeas final : public PBCodable {
   PB_LIST (4, "meas_lte_result",  measLteResults,  MeasLteResults, measLteResult, MeasLteResult, repeated<message<LteCellMeasResult>>);
 };
 
+// All of them, in the order of the registry.
+#define UMTS_MESSAGES(EACH) \
+  EACH(KCellularWcdmaRrcConnectionState) \
+  EACH(KCellularWcdmaRrcConfiguration) \
+  EACH(KCellularWcdmaCellInfo) \
+  EACH(KCellularWcdmaScellMeasurement) \
+  EACH(KCellularWcdmaTxPower) \
+  EACH(KCellularWcdmaSelReselCellInfo) \
+  EACH(EutraFreqInfo) \
+  EACH(UtraFreqInfo) \
+  EACH(GsmFreqInfo) \
+  EACH(KCellularWcdmaNbrCellMeas) \
+  EACH(UtraCellMeasResult) \
+  EACH(GsmCellMeasResult) \
+  EACH(LteCellMeasResult)
+
 // clang-format on
 
 }  // namespace probeview

@@ -3,7 +3,6 @@
 #include <cstdio>
 
 #include "messages/runtime/field_run.h"
-#include "messages/runtime/metric_utility.h"
 #include "messages/runtime/table_walker.h"
 
 namespace probeview {
@@ -27,6 +26,18 @@ inline Record readRecord(const std::uint8_t* position, const std::uint8_t* limit
   const wire::Varint length = wire::readVarint(position, limit);
   if (length.next == nullptr || length.value > static_cast<std::uint64_t>(limit - length.next)) return {};
   return {length.next, length.next + length.value};
+}
+
+// What is no field of the message, or is dropped. Returns the position behind it, null when that failed. Out of line:
+// seldom needed.
+[[gnu::noinline]] const std::uint8_t* passOver(std::uint64_t key, const std::uint8_t* position,
+                                               const std::uint8_t* limit, const MessageDescriptor& descriptor,
+                                               LineSink* log) {
+  const auto number = static_cast<std::uint16_t>(key >> 3);
+  if (!descriptor.drops(number, descriptor.name, log)) return wire::skipValue(position, limit, key & 7);
+  const wire::Varint dropped = wire::readVarint(position, limit);
+  logUnknownTag(log, number, dropped.value);
+  return dropped.next;
 }
 
 // Hands over the numbers of one occurrence of a repeated scalar, packed or single. A last number inside which the data
@@ -198,8 +209,8 @@ const std::uint8_t* FieldRun::decodeNumbers(PBRepeatedInt32& list, std::uint64_t
                          [&](std::uint32_t element) { list.add(wire::unZigZag(element), blockOf(decoding)); });
 }
 
-// Decodes the rest of a record, fields in any order: goes on where decodeInOrder() or decodeTail() has stopped, and after
-// each field takes those that follow it in the order of their numbers by decodeExpected().
+// Decodes the rest of a record, fields in any order: goes on where decodeInOrder() or decodeTail() has stopped, and
+// after each field takes those that follow it in the order of their numbers by decodeExpected().
 const std::uint8_t* TableWalker::decodeOthers(PBCodable& message, const MessageDescriptor& descriptor,
                                               DecodingProgress progress, const std::uint8_t* limit,
                                               Decoding& decoding) {
@@ -212,18 +223,10 @@ const std::uint8_t* TableWalker::decodeOthers(PBCodable& message, const MessageD
     if (key.value != descriptor.rows[index].expectedKey) {
       // Only 16 bits of a field number count.
       const auto number = static_cast<std::uint16_t>(key.value >> 3);
-      // Before the fields: one that has the number of a metric is written, but never decoded.
-      if (KBBMetricUtility::isMetricId(number)) {
-        KBBMetricUtility::isValidMetricIdTag(number, descriptor.name, decoding.log);
-        const wire::Varint dropped = wire::readVarint(position, limit);
-        logUnknownTag(decoding.log, number, dropped.value);
-        if (dropped.next == nullptr) return nullptr;
-        progress.position = dropped.next;
-        continue;
-      }
       index = number < fieldNumberLimit ? descriptor.rowOfNumber[number] : descriptor.rowCount;
-      if (index == descriptor.rowCount) {
-        progress.position = wire::skipValue(position, limit, key.value & 7);
+      // Neither what is no field is decoded nor a field whose number is dropped, which is only ever written.
+      if (descriptor.rows[index].expectedKey == neverExpected) {
+        progress.position = passOver(key.value, position, limit, descriptor, decoding.log);
         if (progress.position == nullptr) return nullptr;
         continue;
       }

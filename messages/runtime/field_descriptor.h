@@ -18,6 +18,7 @@
 
 namespace probeview {
 
+class LineSink;
 class PBCodable;
 class PBDataWriter;
 struct Decoding;
@@ -109,6 +110,10 @@ inline constexpr std::size_t decodingTailSize = 3;
 // How many bytes more than it needs the last scalar may write over when it is written as a word of eight bytes.
 inline constexpr std::uint16_t wordSlack = 7;
 
+// Whether whatever bears that number is dropped when a message of that class is decoded; says so to the log if there is
+// one.
+using DropRule = bool(std::uint32_t number, std::string_view className, LineSink* log);
+
 // A field number is below this, so that the bits of all fields fit into one word.
 inline constexpr std::uint16_t fieldNumberLimit = 64;
 
@@ -132,6 +137,7 @@ struct MessageDescriptor {
   std::unique_ptr<PBCodable> (*make)();
   // Destroys the message and makes an empty one in its place.
   void (*renew)(PBCodable& message);
+  DropRule* drops;
 
   std::span<const FieldDescriptor> fields() const noexcept { return {rows, rowCount}; }
   // Null when there is no such field.

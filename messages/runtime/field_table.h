@@ -11,7 +11,8 @@
 //              repeated<message<TxPowerInfo>>);
 //   };
 //
-// and, in one source file, PB_DEFINE(KCellularLteTxPower). The accessors that the rows make:
+// and, in one source file, PB_DEFINE(KCellularLteTxPower), or, for a class whose decoding drops some numbers,
+// PB_DEFINE(KCellularLteTxPower, rule) with a constexpr DropRule. The accessors that the rows make:
 //
 //   PB_FIELD   a number or truth value: timestamp(), setTimestamp(value), hasTimestamp(), setHasTimestamp(present).
 //              A field that is not present reads as 0; its last value is back when it is made present again.
@@ -32,7 +33,6 @@
 
 #include "messages/runtime/codable.h"
 #include "messages/runtime/field_run.h"
-#include "messages/runtime/metric_utility.h"
 
 namespace probeview {
 
@@ -67,8 +67,11 @@ consteval std::size_t countFields() {
   (std::make_index_sequence<fieldNumberLimit>{});
 }
 
+// The rule of a class that decodes all that it knows.
+constexpr bool dropNothing(std::uint32_t, std::string_view, LineSink*) { return false; }
+
 // All rows of the class, ordered by number whatever their order in the class, and the row that ends them.
-template <typename Message>
+template <typename Message, DropRule* drops>
 consteval auto collectFields() {
   std::array<FieldDescriptor, countFields<Message>() + 1> rows;
   std::size_t count = 0;
@@ -78,20 +81,19 @@ consteval auto collectFields() {
   [&]<std::size_t... Numbers>(std::index_sequence<Numbers...>) { (collect.template operator()<Numbers>(), ...); }
   (std::make_index_sequence<fieldNumberLimit>{});
   for (FieldDescriptor& row : rows) {
-    // A number that is also that of a metric is dropped.
-    if (row.key != 0 && !KBBMetricUtility::isMetricId(row.number)) row.expectedKey = row.key;
+    if (row.key != 0 && !drops(row.number, {}, nullptr)) row.expectedKey = row.key;
   }
   return rows;
 }
 
-template <typename Message>
-inline constexpr auto fieldRows = collectFields<Message>();
+template <typename Message, DropRule* drops>
+inline constexpr auto fieldRows = collectFields<Message, drops>();
 
-template <typename Message>
+template <const auto& rows>
 consteval auto collectScalars() {
-  std::array<ScalarRow, fieldRows<Message>.size()> scalars;
+  std::array<ScalarRow, rows.size()> scalars;
   for (std::size_t index = 0; index + 1 < scalars.size(); ++index) {
-    const FieldDescriptor& row = fieldRows<Message>[index];
+    const FieldDescriptor& row = rows[index];
     ScalarRow& scalar = scalars[index];
     scalar.kind = row.kind;
     if (!isScalar(row.kind)) continue;
@@ -103,31 +105,33 @@ consteval auto collectScalars() {
   return scalars;
 }
 
-template <typename Message>
-inline constexpr auto scalarRows = collectScalars<Message>();
+template <const auto& rows>
+inline constexpr auto scalarRows = collectScalars<rows>();
 
-template <typename Message>
+template <typename Message, DropRule* drops = dropNothing>
 consteval MessageDescriptor describeMessage(std::string_view name) {
-  constexpr std::size_t count = fieldRows<Message>.size() - 1;
+  constexpr const auto& rows = fieldRows<Message, drops>;
+  constexpr std::size_t count = rows.size() - 1;
   MessageDescriptor descriptor{};
   descriptor.name = name;
-  descriptor.rows = fieldRows<Message>.data();
-  descriptor.scalars = scalarRows<Message>.data();
+  descriptor.rows = rows.data();
+  descriptor.scalars = scalarRows<rows>.data();
   descriptor.rowCount = count;
   descriptor.rowOfNumber.fill(count);
-  descriptor.scalarBound = FieldRun::roomFrom<fieldRows<Message>>(0);
+  descriptor.scalarBound = FieldRun::roomFrom<rows>(0);
   descriptor.isFlat = true;
   for (std::size_t index = 0; index < count; ++index) {
-    const FieldDescriptor& row = fieldRows<Message>[index];
+    const FieldDescriptor& row = rows[index];
     descriptor.rowOfNumber[row.number] = static_cast<std::uint8_t>(index);
     if (!isScalar(row.kind)) descriptor.isFlat = false;
   }
   descriptor.size = sizeof(Message);
-  descriptor.decodeInOrder = FieldRun::decode<fieldRows<Message>, scalarRows<Message>>;
-  descriptor.encodeFields = FieldRun::encode<fieldRows<Message>>;
+  descriptor.decodeInOrder = FieldRun::decode<rows, scalarRows<rows>>;
+  descriptor.encodeFields = FieldRun::encode<rows>;
   descriptor.makeElement = [](void* memory, Block& block) -> PBCodable* { return Message::make(memory, block); };
   descriptor.make = []() -> std::unique_ptr<PBCodable> { return std::make_unique<Message>(); };
   descriptor.renew = [](PBCodable& message) { Message::renew(static_cast<Message&>(message)); };
+  descriptor.drops = drops;
   return descriptor;
 }
 
@@ -160,9 +164,9 @@ consteval MessageDescriptor describeMessage(std::string_view name) {
   explicit Class(::probeview::Block& block) noexcept : PBCodable(block) {}                                   \
   using Self = Class;
 
-#define PB_DEFINE(Class)                                               \
-  constinit const ::probeview::MessageDescriptor Class::pbDescriptor = \
-      ::probeview::detail::describeMessage<Class>(#Class);             \
+#define PB_DEFINE(Class, ...)                                                         \
+  constinit const ::probeview::MessageDescriptor Class::pbDescriptor =                \
+      ::probeview::detail::describeMessage<Class __VA_OPT__(, ) __VA_ARGS__>(#Class); \
   const ::probeview::MessageDescriptor& Class::descriptor() const noexcept { return pbDescriptor; }
 
 #define PB_ROW(number, key, property, type)                                                          \

@@ -8,6 +8,7 @@
 
 #include "messages/gsm_messages.h"
 #include "messages/lte_messages.h"
+#include "messages/metric_utility.h"
 #include "messages/nas_messages.h"
 #include "messages/registry.h"
 #include "messages/umts_messages.h"
@@ -15,6 +16,15 @@
 
 namespace probeview {
 namespace {
+
+// What is no metric's message, such as a frame, is defined without a rule of what to drop.
+class AnyNumbers final : public PBCodable {
+  PB_MESSAGE(AnyNumbers)
+  PB_FIELD(18, "before", before, Before, uint32);
+  PB_FIELD(19, "metric", metric, Metric, uint32);
+  PB_FIELD(20, "after", after, After, uint32);
+};
+PB_DEFINE(AnyNumbers)
 
 using Lines = std::vector<std::string>;
 
@@ -261,6 +271,20 @@ TEST(Decoding, AFieldWithTheNumberOfAMetricIsLoggedAndDropped) {
     EXPECT_EQ(log.lines, (Lines{"valid metricId tag", line}));
     EXPECT_EQ(shown(message), R"(["timestamp": 5])");
   }
+}
+
+TEST(Decoding, AClassWithoutARuleOfWhatToDropDecodesAndSkipsNumbersOfMetricsToo) {
+  AnyNumbers inOrder;
+  LineLog log;
+  ASSERT_TRUE(decode(inOrder, "900101 980107 a00102", &log));
+  EXPECT_EQ(shown(inOrder), R"(["before": 1, "metric": 7, "after": 2])");
+  AnyNumbers reversed;
+  ASSERT_TRUE(decode(reversed, "a00102 980107 900101", &log));
+  EXPECT_EQ(reversed, inOrder);
+  AnyNumbers stranger;
+  ASSERT_TRUE(decode(stranger, "f2b01a 02 ffff 900101", &log));  // field 0xD30E: bytes, which are skipped as such
+  EXPECT_EQ(shown(stranger), R"(["before": 1])");
+  EXPECT_TRUE(log.lines.empty());
 }
 
 TEST(Decoding, AMetricFieldIsReadAsAVarintWhateverItsWireType) {

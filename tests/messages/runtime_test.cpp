@@ -7,7 +7,7 @@
 #include <thread>
 
 #include "messages/lte_messages.h"
-#include "messages/runtime/metric_utility.h"
+#include "messages/metric_utility.h"
 #include "messages/runtime/repeated_scalar.h"
 #include "tests/messages/support.h"
 

@@ -18,6 +18,7 @@
 #include "lte.pb.h"
 #include "messages/gsm_messages.h"
 #include "messages/lte_messages.h"
+#include "messages/metric_utility.h"
 #include "messages/nas_messages.h"
 #include "messages/registry.h"
 #include "nas.pb.h"
