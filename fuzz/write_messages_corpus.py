@@ -11,8 +11,8 @@ import sys
 TOP = pathlib.Path(__file__).resolve().parent.parent
 sys.path.insert(0, str(TOP / "tests" / "witness"))
 
-from generator import Payloads, flatten  # noqa: E402
-from model.wire import decode  # noqa: E402
+from generator import Payloads, flatten
+from model.wire import decode
 
 CLASSES = re.findall(r"&(\w+)::pbDescriptor", (TOP / "messages" / "registry.cpp").read_text("utf-8"))
 LONGEST = 250  # the length of the second payload is a byte

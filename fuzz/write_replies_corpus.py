@@ -64,8 +64,8 @@ def source(**more) -> dict:
 
 def client(**more) -> dict:
     return {"number": (UINT64, 1), "name": (TEXT, "probectl"), "process": (INT64, 7), "user": (INT64, 0),
-            "listening": (BOOLEAN, 1), "observes": (BOOLEAN, 1), "records": (UINT64, 10), "records_per_second": real(0.5),
-            "queued": (UINT64, 0), "lost": (UINT64, 0)} | more
+            "listening": (BOOLEAN, 1), "observes": (BOOLEAN, 1), "records": (UINT64, 10),
+            "records_per_second": real(0.5), "queued": (UINT64, 0), "lost": (UINT64, 0)} | more
 
 
 def event(**more) -> dict:
@@ -76,18 +76,23 @@ def event(**more) -> dict:
 INPUTS = {
     "report": report(source(), client()),
     "report_of_nothing": {},
-    "rate_that_is_no_number": report(source(records_per_second=real(float("nan"))), client(records_per_second=real(1e308))),
+    "rate_that_is_no_number": report(source(records_per_second=real(float("nan"))),
+                                     client(records_per_second=real(1e308))),
     "rate_below_nothing": report(source(records_per_second=real(-1e308)), client(records_per_second=(INT64, LEAST))),
-    "times_at_the_ends": report(source(last_record_age_ms=(INT64, LEAST), rows_read=(INT64, -1)), client(), uptime_ms=(INT64, LEAST)),
-    "times_at_the_other_ends": report(source(last_record_age_ms=(INT64, MOST), state=(LIST, [])), client(), uptime_ms=(INT64, MOST)),
-    "texts_that_steer": report(source(origin=(TEXT, STEERING), failure=(TEXT, STEERING)), client(name=(TEXT, STEERING))),
+    "times_at_the_ends": report(source(last_record_age_ms=(INT64, LEAST), rows_read=(INT64, -1)), client(),
+                                uptime_ms=(INT64, LEAST)),
+    "times_at_the_other_ends": report(source(last_record_age_ms=(INT64, MOST), state=(LIST, [])), client(),
+                                      uptime_ms=(INT64, MOST)),
+    "texts_that_steer": report(source(origin=(TEXT, STEERING), failure=(TEXT, STEERING)),
+                               client(name=(TEXT, STEERING))),
     "foreign_kinds": report(source(origin=(LIST, []), records=(TEXT, "x"), withheld=(DICTIONARY, {})),
                             client(number=(BYTES, b"\xff"), queued=real(0.5)), service=(BOOLEAN, 1)),
     "lists_that_are_none": {"sources": (TEXT, "x"), "clients": (LIST, [(INT64, 1), (LIST, [])])},
     "many_entries": {"clients": (LIST, [(DICTIONARY, {})] * 1100)},
     "event": event(),
     "event_with_a_text_that_steers": event(kKeyMetricID=(INT64, 0x3CD50D),
-                                           kKeyPayload=(BYTES, b"\x1a\x07\x1a\x05\x1b[2J\xff"), kKeyOrigin=(TEXT, STEERING)),
+                                           kKeyPayload=(BYTES, b"\x1a\x07\x1a\x05\x1b[2J\xff"),
+                                           kKeyOrigin=(TEXT, STEERING)),
     "event_at_the_end_of_time": event(kKeyTime=(INT64, MOST)),
     "event_before_time": event(kKeyTime=(INT64, LEAST), kKeyMetricID=(INT64, LEAST)),
     "event_of_foreign_kinds": event(kKeyPayload=(TEXT, "x"), kKeyOrigin=(BYTES, b"x"), kKeyTime=real(1e300)),

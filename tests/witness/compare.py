@@ -2,10 +2,11 @@
 # SPDX-License-Identifier: Apache-2.0
 """Asks probectl and the model the same random questions and compares every answer.
 
-    compare.py PROBECTL decode|sweep|store [--seed N|random] [--count N] [--seconds S] [--zone NAME] [--wildness W]
+    compare.py PROBECTL decode|sweep|store [--seed N|random] [--count N] [--seconds S] [--zone NAME]
+               [--wildness W]
 
-Without --seed, PROBEVIEW_SEED in the environment counts, without both the seed is 1. Ends with status 0 when all answers
-agree. On a difference it prints the seed and the smallest case that it could find, and ends with status 1.
+Without --seed, PROBEVIEW_SEED in the environment counts, without both the seed is 1. Ends with status 0 when all
+answers agree. On a difference it prints the seed and the smallest case that it could find, and ends with status 1.
 """
 
 import argparse
@@ -18,12 +19,12 @@ import time
 
 sys.path.insert(0, os.path.dirname(os.path.abspath(__file__)))
 
-import generator  # noqa: E402
-from generator import Payloads, Record, flatten  # noqa: E402
-from model import pages, store, wire  # noqa: E402
-from model.clock import Clock  # noqa: E402
-from model.tables import MESSAGES  # noqa: E402
-from model.text import Real, json_form  # noqa: E402
+import generator
+from generator import Payloads, Record, flatten
+from model import pages, store, wire
+from model.clock import Clock
+from model.tables import MESSAGES
+from model.text import Real, json_form
 
 PATIENCE_SECONDS = 60
 

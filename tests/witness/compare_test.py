@@ -10,8 +10,8 @@ import unittest
 
 sys.path.insert(0, str(pathlib.Path(__file__).parent))
 
-import compare  # noqa: E402
-from model.text import Real  # noqa: E402
+import compare
+from model.text import Real
 
 FOLDER = pathlib.Path(__file__).parent
 

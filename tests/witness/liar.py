@@ -8,10 +8,10 @@ import sys
 
 sys.path.insert(0, os.path.dirname(os.path.abspath(__file__)))
 
-import compare  # noqa: E402
-import generator  # noqa: E402
-from model import store, tables, wire  # noqa: E402
-from model.text import Real  # noqa: E402
+import compare
+import generator
+from model import store, tables
+from model.text import Real
 
 
 def written(value):

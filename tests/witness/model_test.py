@@ -9,11 +9,11 @@ import unittest
 
 sys.path.insert(0, os.path.dirname(os.path.abspath(__file__)))
 
-from model import pages, wire  # noqa: E402
-from model.clock import Clock  # noqa: E402
-from model.store import DISPLAY_DICTIONARIES, HANDLERS, Stop, Store  # noqa: E402
-from model.tables import CHOICES, MESSAGES, METRIC_TAGS  # noqa: E402
-from model.text import Real, bare, json_form, printed  # noqa: E402
+from model import pages, wire
+from model.clock import Clock
+from model.store import DISPLAY_DICTIONARIES, HANDLERS, Stop, Store
+from model.tables import CHOICES, MESSAGES, METRIC_TAGS
+from model.text import Real, bare, json_form, printed
 
 
 def decoded(name, hexadecimal):

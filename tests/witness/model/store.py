@@ -67,7 +67,11 @@ DB_RSRQ = real(lambda value: value * 0.5 - 19.5)
 DB_ECNO = real(lambda value: value * 0.5 - 24.5)
 HALF = real(lambda value: value * 0.5)
 HUNDREDTH = real(lambda value: value / 100.0)
-HALVED_TWICE = lambda value: over(2)(over(2)(value))  # two truncations, one after the other
+
+
+def halved_twice(value):
+    """Two truncations, one after the other."""
+    return over(2)(over(2)(value))
 
 
 # Steps.
@@ -146,7 +150,7 @@ HANDLERS = {
     0x3C4E04: ("KCellularLteRrcState", "myLTERRCStateDict", simple("Current RRC state is ")),
     0x3C4E18: ("KCellularLteCdrxConfig", "myLTECDRXConfigDict", simple("Current CDRX Config is ")),
     0x3C40C2: ("KCellularLteScellInfo", "myLTESCellInfoDict",
-               [stamp, change(dl_bw=HALVED_TWICE), say("Current Serving Cell Info is ")]),
+               [stamp, change(dl_bw=halved_twice), say("Current Serving Cell Info is ")]),
     0x3CD30E: ("KCellularLteSelReselCellInfo", "myLTESelReselDict",
                [say("Received LTE Cell Resel Info is "), stamp, flatten_bands, merge_reselection("LTE"),
                 collect("nbr_eutra", "LTE", "EutraNbrs", dl_bw=megahertz)]),
