@@ -51,8 +51,8 @@ struct Tool {
 // Whether nobody reads the tool's output any more, as far as that can be known without writing to it.
 bool readerIsGone(const Tool& tool);
 
-// Writes a line of an answer that goes on, and hands it on at once. The reader may take its time; while it is waited for,
-// SIGINT and SIGTERM end the program, as the loop that would hear them stands still.
+// Writes a line of an answer that goes on, and hands it on at once. The reader may take its time; while it is waited
+// for, SIGINT and SIGTERM end the program, as the loop that would hear them stands still.
 void writeLine(Tool& tool, std::string_view line);
 
 using AddSubcommand = void (*)(CLI::App& program, Tool& tool);

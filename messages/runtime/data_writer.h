@@ -59,8 +59,8 @@ class PBDataWriter {
   std::size_t size_ = 0;
 };
 
-// Written in place of a field number, a submessage's or a record's too: the value stands without a key, as the elements of
-// a packed record do.
+// Written in place of a field number, a submessage's or a record's too: the value stands without a key, as the elements
+// of a packed record do.
 inline constexpr std::uint32_t PBDataWriterNoField = 0xFFFFFFFF;
 
 void PBDataWriterWriteUint64Field(PBDataWriter& writer, std::uint64_t value, std::uint32_t fieldNumber);
