@@ -26,10 +26,10 @@ class Key {
   static Key constant(std::string_view text) noexcept { return Key(text); }
   static Key copy(std::string_view text);
   // The same as a constant, for a text that stands in memory as it is printed: behind a quotation mark and before one,
-  // a colon and a blank, with nothing in it to escape. It is printed by copying.
+  // a colon and a blank, with nothing in it to escape. It is printed by copying, if it is not too long for that.
   static Key framed(std::string_view text) noexcept {
     Key key(text);
-    key.isFramed_ = true;
+    key.isFramed_ = text.size() + frame <= longestFramed;
     return key;
   }
 
@@ -49,9 +49,14 @@ class Key {
 
   std::string_view text() const noexcept { return {data_, size_}; }
   bool isFramed() const noexcept { return isFramed_; }
+  // With what stands around it; only for a framed key.
+  std::string_view framedText() const noexcept { return {data_ - 1, size_ + frame}; }
+  static constexpr std::size_t longestFramed = 32;
   friend bool operator==(const Key& left, const Key& right) noexcept { return left.text() == right.text(); }
 
  private:
+  static constexpr std::size_t frame = 4;
+
   explicit Key(std::string_view text) noexcept
       : data_(text.data()), size_(static_cast<std::uint32_t>(text.size())), owned_(false) {}
 

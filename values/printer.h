@@ -13,6 +13,7 @@
 #include <string_view>
 
 #include "values/dictionary.h"
+#include "values/utf8.h"
 #include "values/value.h"
 
 namespace probeview {
@@ -35,10 +36,6 @@ void printNumber(double number, std::string& out);
 void printNumber(float number, std::string& out);
 void printNumber(std::int64_t number, std::string& out);
 void printNumber(std::uint64_t number, std::string& out);
-
-// Appends the text with each ill-formed UTF-8 sequence replaced by U+FFFD.
-void appendValidUtf8(std::string_view text, std::string& out);
-bool isValidUtf8(std::string_view text) noexcept;
 
 // Appends two lower-case hexadecimal digits per byte.
 void appendHex(std::string_view bytes, std::string& out);

@@ -129,9 +129,65 @@ TEST(Printer, IntegersArePlainDecimalWithAsciiMinus) {
   EXPECT_EQ(printed(Value(false)), "0");
 }
 
+TEST(Printer, AnIntegerOfEveryLengthHasItsDigits) {
+  // Around every power of ten, where a digit more begins, and every two and three digits inside.
+  std::uint64_t power = 1;
+  for (int digits = 1; digits <= 20; ++digits, power *= 10) {
+    for (const std::uint64_t number : {power - 1, power, power + 1, 9 * (power / 10) + 7, power / 7, power / 3 * 2}) {
+      EXPECT_EQ(printed(Value(number)), std::to_string(number));
+      const auto whole = static_cast<std::int64_t>(number);
+      EXPECT_EQ(printed(Value(whole)), std::to_string(whole));
+      EXPECT_EQ(printed(Value(-whole)), std::to_string(-whole));
+      const auto half = static_cast<std::uint32_t>(number);
+      EXPECT_EQ(printed(Value(half)), std::to_string(half));
+      const auto small = static_cast<std::int32_t>(half);
+      EXPECT_EQ(printed(Value(small)), std::to_string(small));
+    }
+  }
+  for (std::uint32_t number = 0; number < 20000; ++number) {
+    ASSERT_EQ(printed(Value(number)), std::to_string(number));
+    ASSERT_EQ(printed(Value(std::uint64_t{number} * 1'000'003)), std::to_string(std::uint64_t{number} * 1'000'003));
+  }
+}
+
+TEST(Printer, ALineOfAnyLengthIsTheSumOfItsParts) {
+  static constexpr std::string_view framed = "\"rsrp_of_first_antenna\": ";
+  const Key key = Key::framed(framed.substr(1, framed.size() - 4));
+  const Value parts[] = {std::numeric_limits<std::uint64_t>::max(),
+                         std::numeric_limits<std::int32_t>::min(),
+                         std::uint32_t{7},
+                         true,
+                         -std::numeric_limits<double>::denorm_min(),
+                         Value::text(std::string(40, 'x') + "\x01\xC3(\n"),
+                         Identifier{"NOT_CAMPED"},
+                         Value::bytes(std::vector<std::uint8_t>(700, 0xA5)),
+                         List{},
+                         List{List{List{List{Dictionary{{"key", std::uint32_t{1}}}}}}},
+                         Dictionary{}};
+  // Each part once at every distance from a buffer's end.
+  for (std::size_t before = 0; before < 4200; before += before < 3800 ? 100 : 1) {
+    const std::string text(before, 'a');
+    for (const Value& part : parts) {
+      Dictionary dictionary{{"before", Value::text(text)}};
+      dictionary.append(key, part);
+      dictionary.append(key, List{part, part});
+      const std::string one = printed(part);
+      ASSERT_EQ(printed(dictionary), "[\"before\": \"" + text + "\", " + std::string(framed) + one + ", " +
+                                         std::string(framed) + "[" + one + ", " + one + "]]");
+    }
+  }
+}
+
 TEST(Printer, BytesAreHexadecimalBetweenAngles) {
   EXPECT_EQ(printed(bytesOf({0x62, 0xf2, 0x10})), "<62f210>");
   EXPECT_EQ(printed(bytesOf({})), "<>");
+  std::vector<std::uint8_t> bytes;
+  std::string digits;
+  for (int byte = 0; byte < 256; ++byte) {
+    bytes.push_back(static_cast<std::uint8_t>(byte));
+    digits += {"0123456789abcdef"[byte / 16], "0123456789abcdef"[byte % 16]};
+    EXPECT_EQ(printed(Value::bytes(bytes)), '<' + digits + '>');
+  }
 }
 
 TEST(Printer, EmptyContainersAreABracketPair) {
