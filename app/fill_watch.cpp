@@ -19,7 +19,7 @@ bool FillWatch::isFilled() {
       expected_.emplace();
       for (const auto metric : *fillable) {
         // What nobody handles never shows.
-        if (const auto* handled = handledMetric(metric)) expected_->insert(handled->handler.dictionary);
+        if (const auto* handled = handledMetric(metric)) expected_->insert(handled->dictionary);
       }
     }
     nextQuestion_ = clock_.monotonicTime() + askAgainAfter;

@@ -94,7 +94,7 @@ std::span<const std::uint8_t> feedOneStore(std::span<const std::uint8_t> events)
     }
     // The identifier, the handler's line, the bands on their own, and that it was valid.
     must(console.count == 3 || console.count == 4);
-    const auto& latest = store.displayDictionary(handledMetric(identifier)->handler.dictionary);
+    const auto& latest = store.displayDictionary(handledMetric(identifier)->dictionary);
     must(latest.has_value());
     const Value* timestamp = latest->find("timestamp");
     must(timestamp == nullptr || timestamp->text());

@@ -1,62 +1,30 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-#include <array>
 #include <cstddef>
 #include <cstdint>
 #include <optional>
 #include <string_view>
 
+#include "messages/placed.h"
+
 namespace probeview {
 
-// The display dictionaries of the metric store, one per metric kind, in the order in which they are declared there.
+// The display dictionaries of the metric store, one per metric kind, in the order in which they are declared there:
+// such as DisplayDictionary::myLTERRCStateDict.
 enum class DisplayDictionary : std::uint8_t {
-  myLTERRCStateDict,
-  myLTECDRXConfigDict,
-  myLTESCellInfoDict,
-  myLTESCellMeasDict,
-  myLTESelReselDict,
-  myLTERsrpRsrqSinrDict,
-  myLTECompCarrDict,
-  myLTETxPowerDict,
-  myLTEInterRatMeasDict,
-  myLTEIntraRatMeasDict,
-  myLTECAStatusDict,
-  myLTEEMMContextDict,
-  myCellularMMCommonInfoDict,
-  myCellularActiveBearerDict,
-  myGMMContextDict,
-  myMMContextDict,
-  myUMTSRRCStateDict,
-  myUMTSRRCConfigDict,
-  myUMTSCellInfoDict,
-  myUMTSCellMeasDict,
-  myUMTSTxPowerDict,
-  myUMTSSelReselDict,
-  myUMTSNbrMeasDict,
-  myGSMScellInfoDict,
-  myGSMIdleConfigInfoDict,
-  myGSMIdleScellMeasDict,
-  myGSMConnRfMeasDict,
-  myGSMNbrMeasDict,
-  myGSMGPRSConfigDict,
-  mySIMFileInfoDict,
+#define METRIC(constant, identifier, Class, dictionary, place, ...) dictionary = place,
+#define METRIC_WITHOUT_HANDLER METRIC
+#include "messages/metrics.inc"
 };
 
 // Their names, in the order of the enumeration; for tools that list or find them by name.
-inline constexpr auto displayDictionaryNames = std::to_array<std::string_view>({
-    "myLTERRCStateDict",          "myLTECDRXConfigDict",        "myLTESCellInfoDict",  "myLTESCellMeasDict",
-    "myLTESelReselDict",          "myLTERsrpRsrqSinrDict",      "myLTECompCarrDict",   "myLTETxPowerDict",
-    "myLTEInterRatMeasDict",      "myLTEIntraRatMeasDict",      "myLTECAStatusDict",   "myLTEEMMContextDict",
-    "myCellularMMCommonInfoDict", "myCellularActiveBearerDict", "myGMMContextDict",    "myMMContextDict",
-    "myUMTSRRCStateDict",         "myUMTSRRCConfigDict",        "myUMTSCellInfoDict",  "myUMTSCellMeasDict",
-    "myUMTSTxPowerDict",          "myUMTSSelReselDict",         "myUMTSNbrMeasDict",   "myGSMScellInfoDict",
-    "myGSMIdleConfigInfoDict",    "myGSMIdleScellMeasDict",     "myGSMConnRfMeasDict", "myGSMNbrMeasDict",
-    "myGSMGPRSConfigDict",        "mySIMFileInfoDict",
+inline constexpr auto displayDictionaryNames = arranged<std::string_view>({
+#define METRIC(constant, identifier, Class, dictionary, place, ...) {place, #dictionary},
+#define METRIC_WITHOUT_HANDLER METRIC
+#include "messages/metrics.inc"
 });
 inline constexpr std::size_t displayDictionaryCount = displayDictionaryNames.size();
-static_assert(displayDictionaryCount == 30);
-static_assert(displayDictionaryCount == static_cast<std::size_t>(DisplayDictionary::mySIMFileInfoDict) + 1);
 
 constexpr std::string_view displayDictionaryName(DisplayDictionary dictionary) {
   return displayDictionaryNames[static_cast<std::size_t>(dictionary)];
@@ -66,6 +34,33 @@ constexpr std::string_view displayDictionaryName(DisplayDictionary dictionary) {
 constexpr std::optional<DisplayDictionary> displayDictionaryNamed(std::string_view name) {
   for (std::size_t index = 0; index < displayDictionaryCount; ++index) {
     if (displayDictionaryNames[index] == name) return static_cast<DisplayDictionary>(index);
+  }
+  return std::nullopt;
+}
+
+struct StoredMetric {
+  std::int64_t metricID;
+  DisplayDictionary dictionary;  // holds the metric's latest message
+};
+
+// The metrics that the store takes.
+inline constexpr StoredMetric storedMetrics[] = {
+#define METRIC(constant, identifier, Class, dictionary, ...) {identifier, DisplayDictionary::dictionary},
+#include "messages/metrics.inc"
+};
+
+// Absent for a metric that the store does not take.
+constexpr std::optional<DisplayDictionary> displayDictionaryOf(std::int64_t metricID) {
+  for (const StoredMetric& metric : storedMetrics) {
+    if (metric.metricID == metricID) return metric.dictionary;
+  }
+  return std::nullopt;
+}
+
+// Absent for the dictionary that nothing is stored into.
+constexpr std::optional<std::int64_t> metricOf(DisplayDictionary dictionary) {
+  for (const StoredMetric& metric : storedMetrics) {
+    if (metric.dictionary == dictionary) return metric.metricID;
   }
   return std::nullopt;
 }

@@ -22,17 +22,12 @@ void neighbourMeasurement(HandlerTurn& turn) {
 
 constexpr MetricHandler gsmTable[] = {
     // Without the "is" of the others.
-    {K_GSM_SCELL_INFO, DisplayDictionary::myGSMScellInfoDict, "Received GSM Serving Cell Info ", formatTimestampAndLog},
-    {K_GSM_IDLE_CONFIG, DisplayDictionary::myGSMIdleConfigInfoDict, "Received GSM Idle Config Info is ",
-     formatTimestampAndLog},
-    {K_GSM_IDLE_SCELL_MEAS, DisplayDictionary::myGSMIdleScellMeasDict, "Received GSM Idle Serving Cell Meas Info is ",
-     formatTimestampAndLog},
-    {K_GSM_CS_RF_MEAS, DisplayDictionary::myGSMConnRfMeasDict, "Received GSM Connected Serving Cell Meas Info is ",
-     formatTimestampAndLog},
-    {K_GSM_NCELL_MEAS, DisplayDictionary::myGSMNbrMeasDict, "Received GSM Nbr Cell Meas Info is ",
-     neighbourMeasurement},
-    {K_GSM_GPRS_CONFIG, DisplayDictionary::myGSMGPRSConfigDict, "Received GSM GPRS Config Info is ",
-     formatTimestampAndLog},
+    {K_GSM_SCELL_INFO, "Received GSM Serving Cell Info ", formatTimestampAndLog},
+    {K_GSM_IDLE_CONFIG, "Received GSM Idle Config Info is ", formatTimestampAndLog},
+    {K_GSM_IDLE_SCELL_MEAS, "Received GSM Idle Serving Cell Meas Info is ", formatTimestampAndLog},
+    {K_GSM_CS_RF_MEAS, "Received GSM Connected Serving Cell Meas Info is ", formatTimestampAndLog},
+    {K_GSM_NCELL_MEAS, "Received GSM Nbr Cell Meas Info is ", neighbourMeasurement},
+    {K_GSM_GPRS_CONFIG, "Received GSM GPRS Config Info is ", formatTimestampAndLog},
 };
 
 }  // namespace

@@ -3,6 +3,8 @@
 
 #include <algorithm>
 #include <array>
+#include <iterator>
+#include <optional>
 
 #include "messages/metric_identifiers.h"
 #include "platform/fatal_error.h"
@@ -11,7 +13,7 @@ namespace probeview {
 
 namespace {
 
-using HandledMetrics = std::array<HandledMetric, handledMetricCount>;
+using HandledMetrics = std::array<HandledMetric, std::size(storedMetrics)>;
 
 // In ascending order of the identifiers, so that the choice takes five comparisons.
 HandledMetrics handledMetricsInOrder() {
@@ -19,17 +21,14 @@ HandledMetrics handledMetricsInOrder() {
   std::size_t count = 0;
   for (const auto family : {lteHandlers(), umtsHandlers(), gsmHandlers(), nasHandlers()}) {
     for (const MetricHandler& handler : family) {
-      const MetricIdentifier* metric = metricWithId(handler.metricID);
-      if (count == metrics.size() || metric == nullptr || metric->message == nullptr) {
-        fatalError("a handler's metric is not among those that carry a message");
-      }
-      metrics[count++] = {handler, metric->message, 0};
+      const auto dictionary = displayDictionaryOf(handler.metricID);
+      if (count == metrics.size() || !dictionary) fatalError("a handler's metric is not among those that are stored");
+      metrics[count++] = {handler, metricWithId(handler.metricID)->message, *dictionary};
     }
   }
   if (count != metrics.size()) fatalError("a metric lacks its handler");
   std::sort(metrics.begin(), metrics.end(),
             [](const auto& left, const auto& right) { return left.handler.metricID < right.handler.metricID; });
-  for (std::size_t index = 0; index < metrics.size(); ++index) metrics[index].index = index;
   return metrics;
 }
 
@@ -46,13 +45,6 @@ const HandledMetric* handledMetric(std::int64_t metricID) {
       std::lower_bound(metrics.begin(), metrics.end(), metricID,
                        [](const HandledMetric& metric, std::int64_t id) { return metric.handler.metricID < id; });
   return found != metrics.end() && found->handler.metricID == metricID ? &*found : nullptr;
-}
-
-std::optional<std::int64_t> metricOf(DisplayDictionary dictionary) {
-  for (const HandledMetric& metric : handledMetrics()) {
-    if (metric.handler.dictionary == dictionary) return metric.handler.metricID;
-  }
-  return std::nullopt;
 }
 
 void formatTimestampAndLog(HandlerTurn& turn) {

@@ -1,9 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-#include <cstddef>
 #include <cstdint>
-#include <optional>
 #include <span>
 #include <string_view>
 
@@ -13,10 +11,9 @@
 
 namespace probeview {
 
-// One metric kind: where its latest message goes, how its log line begins, and what else is done with it.
+// One metric kind: how its log line begins, and what else is done with it.
 struct MetricHandler {
   std::int64_t metricID;
-  DisplayDictionary dictionary;
   std::string_view prefix;
   // Runs when the dictionary form of the message has been stored; formats the timestamp and writes the log line at the
   // place that is this metric's.
@@ -33,16 +30,11 @@ std::span<const MetricHandler> nasHandlers();
 struct HandledMetric {
   MetricHandler handler;
   const MessageDescriptor* message;  // the class of its payload
-  std::size_t index;                 // its place among all of them
+  DisplayDictionary dictionary;      // holds its latest message
 };
-
-inline constexpr std::size_t handledMetricCount = 29;
 
 // The handled metric of exactly this identifier; null for one that nobody handles.
 const HandledMetric* handledMetric(std::int64_t metricID);
-
-// The metric whose latest message that dictionary holds; absent for the one that no handler stores into.
-std::optional<std::int64_t> metricOf(DisplayDictionary dictionary);
 
 // What every handler does that has nothing more to do.
 void formatTimestampAndLog(HandlerTurn& turn);

@@ -64,18 +64,16 @@ void carrierAggregation(HandlerTurn& turn) {
 }
 
 constexpr MetricHandler lteTable[] = {
-    {K_LTE_RRC_STATE, DisplayDictionary::myLTERRCStateDict, "Current RRC state is ", formatTimestampAndLog},
-    {K_LTE_CDRX_CONFIG, DisplayDictionary::myLTECDRXConfigDict, "Current CDRX Config is ", formatTimestampAndLog},
-    {K_LTE_SCELL_INFO, DisplayDictionary::myLTESCellInfoDict, "Current Serving Cell Info is ", servingCellInfo},
-    {K_LTE_TX_POWER, DisplayDictionary::myLTETxPowerDict, "Received LTE Tx Power is ", txPower},
-    {K_LTE_COMPCARR_INFO, DisplayDictionary::myLTECompCarrDict, "Received Component Carrier info is ",
-     formatTimestampAndLog},
-    {K_LTE_SEL_RESEL_INFO, DisplayDictionary::myLTESelReselDict, "Received LTE Cell Resel Info is ", reselection},
-    {K_LTE_INTRARAT_MEAS, DisplayDictionary::myLTEIntraRatMeasDict, "Received LTE IRAT Meas is ", intraRatMeasurement},
-    {K_LTE_INTERRAT_MEAS, DisplayDictionary::myLTEInterRatMeasDict, "Received LTE InterRat Meas Info is ",
-     interRatMeasurement},
-    {K_LTE_CA_STATUS, DisplayDictionary::myLTECAStatusDict, "Received CA Status Dict is ", carrierAggregation},
-    {K_LTE_RSRP_RSRQ_SINR, DisplayDictionary::myLTERsrpRsrqSinrDict, "Received RSRP RSRQ SINR is : ", rsrpRsrqSinr},
+    {K_LTE_RRC_STATE, "Current RRC state is ", formatTimestampAndLog},
+    {K_LTE_CDRX_CONFIG, "Current CDRX Config is ", formatTimestampAndLog},
+    {K_LTE_SCELL_INFO, "Current Serving Cell Info is ", servingCellInfo},
+    {K_LTE_TX_POWER, "Received LTE Tx Power is ", txPower},
+    {K_LTE_COMPCARR_INFO, "Received Component Carrier info is ", formatTimestampAndLog},
+    {K_LTE_SEL_RESEL_INFO, "Received LTE Cell Resel Info is ", reselection},
+    {K_LTE_INTRARAT_MEAS, "Received LTE IRAT Meas is ", intraRatMeasurement},
+    {K_LTE_INTERRAT_MEAS, "Received LTE InterRat Meas Info is ", interRatMeasurement},
+    {K_LTE_CA_STATUS, "Received CA Status Dict is ", carrierAggregation},
+    {K_LTE_RSRP_RSRQ_SINR, "Received RSRP RSRQ SINR is : ", rsrpRsrqSinr},
 };
 
 }  // namespace

@@ -10,8 +10,6 @@
 
 namespace probeview {
 
-static_assert(handledMetricCount == 29, "the store keeps one message of each");
-
 namespace {
 
 // Upper-case hexadecimal of the low 32 bits, at least two characters wide.
@@ -70,7 +68,7 @@ bool MetricValidator::handleMetric(const Dictionary& event) {
     surroundings_.console.line("I dont care for this Metric");
     return false;
   }
-  HandlerTurn turn(*this, metric->handler.dictionary, metric->handler.prefix);
+  HandlerTurn turn(*this, metric->dictionary, metric->handler.prefix);
   turn.store(decode(*metric, event));
   metric->handler.rewrite(turn);
   return true;
@@ -80,7 +78,7 @@ Dictionary MetricValidator::decode(const HandledMetric& metric, const Dictionary
   const Value* payload = event.find(payloadKey);
   const auto bytes = payload == nullptr ? std::nullopt : payload->bytes();
   if (!bytes) fatalError("a metric event carries no payload for " + std::string(metric.message->name));
-  std::unique_ptr<PBCodable>& message = messages_[metric.index];
+  std::unique_ptr<PBCodable>& message = messages_[static_cast<std::size_t>(metric.dictionary)];
   if (message == nullptr) message = metric.message->make();
   PBDataReader reader(*bytes, &surroundings_.systemLog);
   const bool decoded = message->readFrom(reader);

@@ -83,97 +83,11 @@ class MetricValidator : public RadixWrapperDelegate {
   // its timestamp as text, with the changes of its handler. Handlers work through the mutable access, and what they
   // read back is what it gives, so that a subclass which overrides both is what the store stores into.
   virtual const std::optional<Dictionary>& displayDictionary(DisplayDictionary which) const;
-  const std::optional<Dictionary>& myLTERRCStateDict() const {
-    return displayDictionary(DisplayDictionary::myLTERRCStateDict);
-  }
-  const std::optional<Dictionary>& myLTECDRXConfigDict() const {
-    return displayDictionary(DisplayDictionary::myLTECDRXConfigDict);
-  }
-  const std::optional<Dictionary>& myLTESCellInfoDict() const {
-    return displayDictionary(DisplayDictionary::myLTESCellInfoDict);
-  }
-  // No handler stores into this one.
-  const std::optional<Dictionary>& myLTESCellMeasDict() const {
-    return displayDictionary(DisplayDictionary::myLTESCellMeasDict);
-  }
-  const std::optional<Dictionary>& myLTESelReselDict() const {
-    return displayDictionary(DisplayDictionary::myLTESelReselDict);
-  }
-  const std::optional<Dictionary>& myLTERsrpRsrqSinrDict() const {
-    return displayDictionary(DisplayDictionary::myLTERsrpRsrqSinrDict);
-  }
-  const std::optional<Dictionary>& myLTECompCarrDict() const {
-    return displayDictionary(DisplayDictionary::myLTECompCarrDict);
-  }
-  const std::optional<Dictionary>& myLTETxPowerDict() const {
-    return displayDictionary(DisplayDictionary::myLTETxPowerDict);
-  }
-  const std::optional<Dictionary>& myLTEInterRatMeasDict() const {
-    return displayDictionary(DisplayDictionary::myLTEInterRatMeasDict);
-  }
-  const std::optional<Dictionary>& myLTEIntraRatMeasDict() const {
-    return displayDictionary(DisplayDictionary::myLTEIntraRatMeasDict);
-  }
-  const std::optional<Dictionary>& myLTECAStatusDict() const {
-    return displayDictionary(DisplayDictionary::myLTECAStatusDict);
-  }
-  const std::optional<Dictionary>& myLTEEMMContextDict() const {
-    return displayDictionary(DisplayDictionary::myLTEEMMContextDict);
-  }
-  const std::optional<Dictionary>& myCellularMMCommonInfoDict() const {
-    return displayDictionary(DisplayDictionary::myCellularMMCommonInfoDict);
-  }
-  const std::optional<Dictionary>& myCellularActiveBearerDict() const {
-    return displayDictionary(DisplayDictionary::myCellularActiveBearerDict);
-  }
-  const std::optional<Dictionary>& myGMMContextDict() const {
-    return displayDictionary(DisplayDictionary::myGMMContextDict);
-  }
-  const std::optional<Dictionary>& myMMContextDict() const {
-    return displayDictionary(DisplayDictionary::myMMContextDict);
-  }
-  const std::optional<Dictionary>& myUMTSRRCStateDict() const {
-    return displayDictionary(DisplayDictionary::myUMTSRRCStateDict);
-  }
-  const std::optional<Dictionary>& myUMTSRRCConfigDict() const {
-    return displayDictionary(DisplayDictionary::myUMTSRRCConfigDict);
-  }
-  const std::optional<Dictionary>& myUMTSCellInfoDict() const {
-    return displayDictionary(DisplayDictionary::myUMTSCellInfoDict);
-  }
-  const std::optional<Dictionary>& myUMTSCellMeasDict() const {
-    return displayDictionary(DisplayDictionary::myUMTSCellMeasDict);
-  }
-  const std::optional<Dictionary>& myUMTSTxPowerDict() const {
-    return displayDictionary(DisplayDictionary::myUMTSTxPowerDict);
-  }
-  const std::optional<Dictionary>& myUMTSSelReselDict() const {
-    return displayDictionary(DisplayDictionary::myUMTSSelReselDict);
-  }
-  const std::optional<Dictionary>& myUMTSNbrMeasDict() const {
-    return displayDictionary(DisplayDictionary::myUMTSNbrMeasDict);
-  }
-  const std::optional<Dictionary>& myGSMScellInfoDict() const {
-    return displayDictionary(DisplayDictionary::myGSMScellInfoDict);
-  }
-  const std::optional<Dictionary>& myGSMIdleConfigInfoDict() const {
-    return displayDictionary(DisplayDictionary::myGSMIdleConfigInfoDict);
-  }
-  const std::optional<Dictionary>& myGSMIdleScellMeasDict() const {
-    return displayDictionary(DisplayDictionary::myGSMIdleScellMeasDict);
-  }
-  const std::optional<Dictionary>& myGSMConnRfMeasDict() const {
-    return displayDictionary(DisplayDictionary::myGSMConnRfMeasDict);
-  }
-  const std::optional<Dictionary>& myGSMNbrMeasDict() const {
-    return displayDictionary(DisplayDictionary::myGSMNbrMeasDict);
-  }
-  const std::optional<Dictionary>& myGSMGPRSConfigDict() const {
-    return displayDictionary(DisplayDictionary::myGSMGPRSConfigDict);
-  }
-  const std::optional<Dictionary>& mySIMFileInfoDict() const {
-    return displayDictionary(DisplayDictionary::mySIMFileInfoDict);
-  }
+  // Each of them by its name, such as myLTERRCStateDict().
+#define METRIC(constant, identifier, Class, dictionary, ...) \
+  const std::optional<Dictionary>& dictionary() const { return displayDictionary(DisplayDictionary::dictionary); }
+#define METRIC_WITHOUT_HANDLER METRIC
+#include "messages/metrics.inc"
 
  protected:
   // Recognises and stores one metric: true when it did.
@@ -193,8 +107,8 @@ class MetricValidator : public RadixWrapperDelegate {
   Common common_;
   std::array<std::optional<Dictionary>, displayDictionaryCount> displayDictionaries_;
   TimestampFormatter timestampFormatter_;
-  // One message of each handled metric, empty between events; kept for its memory.
-  std::array<std::unique_ptr<PBCodable>, 29> messages_;
+  // The message behind each of them, empty between events; kept for its memory.
+  std::array<std::unique_ptr<PBCodable>, displayDictionaryCount> messages_;
   // The line being built; kept for its memory, too.
   std::string line_;
   // What the wrapper holds weakly, and what ends when the store does. It owns nothing.

@@ -28,14 +28,12 @@ void simFiles(HandlerTurn& turn) {
 }
 
 constexpr MetricHandler nasTable[] = {
-    {K_CELLULAR_MM_INFO, DisplayDictionary::myCellularMMCommonInfoDict,
-     "Received MM Common Info Dict is : ", formatTimestampAndLog},
-    {K_CELLULAR_MM_CTXT, DisplayDictionary::myMMContextDict, "Received MM Context Info is ", formatTimestampAndLog},
-    {K_CELLULAR_GMM_CTXT, DisplayDictionary::myGMMContextDict, "Received GMM Context Info is ", formatTimestampAndLog},
-    {K_LTE_EMM_CTXT, DisplayDictionary::myLTEEMMContextDict, "Received EMM Context is ", emmContext},
-    {K_CELLULAR_ACTIVE_BEARER, DisplayDictionary::myCellularActiveBearerDict, "Received Bearer Context Info is ",
-     activeBearers},
-    {K_SIM_FILE_INFO, DisplayDictionary::mySIMFileInfoDict, "Received SIM Card File Info is ", simFiles},
+    {K_CELLULAR_MM_INFO, "Received MM Common Info Dict is : ", formatTimestampAndLog},
+    {K_CELLULAR_MM_CTXT, "Received MM Context Info is ", formatTimestampAndLog},
+    {K_CELLULAR_GMM_CTXT, "Received GMM Context Info is ", formatTimestampAndLog},
+    {K_LTE_EMM_CTXT, "Received EMM Context is ", emmContext},
+    {K_CELLULAR_ACTIVE_BEARER, "Received Bearer Context Info is ", activeBearers},
+    {K_SIM_FILE_INFO, "Received SIM Card File Info is ", simFiles},
 };
 
 }  // namespace

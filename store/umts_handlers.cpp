@@ -39,18 +39,13 @@ void neighbourMeasurement(HandlerTurn& turn) {
 }
 
 constexpr MetricHandler umtsTable[] = {
-    {K_UMTS_SCELL_MEAS, DisplayDictionary::myUMTSCellMeasDict, "Received UMTS Serving Cell Meas is ",
-     servingCellMeasurement},
-    {K_UMTS_TX_POWER, DisplayDictionary::myUMTSTxPowerDict, "Received Tx Power is ", txPower},
-    {K_UMTS_SEL_RESEL_INFO, DisplayDictionary::myUMTSSelReselDict, "Received UMTS Cell Resel Info is ", reselection},
-    {K_UMTS_NCELL_MEAS, DisplayDictionary::myUMTSNbrMeasDict, "Received UMTS InterRat Meas Info is ",
-     neighbourMeasurement},
-    {K_UMTS_RRC_STATE, DisplayDictionary::myUMTSRRCStateDict, "Received UMTS RRC Connection State is ",
-     formatTimestampAndLog},
-    {K_UMTS_RRC_CONFIG, DisplayDictionary::myUMTSRRCConfigDict, "Received UMTS RRC Configuration is ",
-     formatTimestampAndLog},
-    {K_UMTS_SCELL_INFO, DisplayDictionary::myUMTSCellInfoDict, "Received UMTS Serving Cell Info is ",
-     formatTimestampAndLog},
+    {K_UMTS_SCELL_MEAS, "Received UMTS Serving Cell Meas is ", servingCellMeasurement},
+    {K_UMTS_TX_POWER, "Received Tx Power is ", txPower},
+    {K_UMTS_SEL_RESEL_INFO, "Received UMTS Cell Resel Info is ", reselection},
+    {K_UMTS_NCELL_MEAS, "Received UMTS InterRat Meas Info is ", neighbourMeasurement},
+    {K_UMTS_RRC_STATE, "Received UMTS RRC Connection State is ", formatTimestampAndLog},
+    {K_UMTS_RRC_CONFIG, "Received UMTS RRC Configuration is ", formatTimestampAndLog},
+    {K_UMTS_SCELL_INFO, "Received UMTS Serving Cell Info is ", formatTimestampAndLog},
 };
 
 }  // namespace

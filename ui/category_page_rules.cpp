@@ -4,7 +4,7 @@
 #include <array>
 #include <unordered_map>
 
-#include "store/handlers.h"
+#include "store/display_dictionaries.h"
 
 namespace probeview {
 

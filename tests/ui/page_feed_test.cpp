@@ -105,7 +105,7 @@ TEST_F(PageFeeds, APageChangesWithExactlyTheMetricsThatItsRuleNames) {
 TEST_F(PageFeeds, EveryMetricThatIsHandledIsKnownByItsDictionary) {
   for (const auto& metric : metricIdentifiers()) {
     if (metric.isHandled) {
-      EXPECT_EQ(metricOf(handledMetric(metric.id)->handler.dictionary), metric.id) << metric.name;
+      EXPECT_EQ(metricOf(handledMetric(metric.id)->dictionary), metric.id) << metric.name;
     }
   }
   EXPECT_EQ(metricOf(DisplayDictionary::myLTESCellMeasDict), std::nullopt) << "no handler stores into it";

@@ -228,7 +228,7 @@ NONSENSE = ["dict myNoSuchDict", "record CDMA", "event", "event 0x3CD302", "even
 def story(random, wildness, length):
     commands = []
     payloads = Payloads(random, wildness)
-    favourites = random.sample(list(store.HANDLERS), random.choice([2, 4, 29]))
+    favourites = random.sample(list(store.HANDLERS), random.choice([2, 4, len(store.HANDLERS)]))
     for _ in range(length):
         roll = random.random()
         if roll < 0.62:

@@ -2,46 +2,20 @@
 """What a category page answers when it is asked for its sections, titles, rows and cells."""
 
 from .store import Stop
+from .tables import TABLES
 from .text import bare
 
-CATEGORIES = {
-    "Device Info": ["IMSI", "IMEISV", "SIM Files"],
-    "LTE": ["NAS", "RRC State", "Serving Cell Info", "Serving Cell Meas", "Tx Power", "Sel Resel Parameters",
-            "EUTRA Neighbor Info", "C-DRX", "LTE Neighbor Cell Meas", "UMTS Neighbor Cell Meas",
-            "GSM Neighbor Cell Meas", "CA Status", "Active Bearers"],
-    "UMTS": ["NAS GMM", "NAS MM", "RRC State", "RRC Configuration", "Serving Cell Info", "Serving Cell Meas",
-             "Tx Power", "Sel Resel Parameters", "EUTRA Neighbor Info", "UTRA Neighbor Info", "GSM Neighbor Info",
-             "LTE Neighbor Cell Meas", "UMTS Neighbor Cell Meas", "GSM Neighbor Cell Meas", "Active Bearers"],
-    "GSM": ["NAS GMM", "NAS MM", "Serving Cell Info", "Idle Config", "Idle Serv Cell Meas",
-            "Connected Serv Cell Meas", "GSM GPRS Config", "LTE Neighbor Cell Meas", "UMTS Neighbor Cell Meas",
-            "GSM Neighbor Cell Meas", "Active Bearers"],
-}
-PAGE_KEYS = [technology + " " + category for technology, names in CATEGORIES.items() for category in names]
+PAGE_KEYS = [page.key for page in TABLES.pages]
+
+
+def dictionaries(rule):
+    return {page.key: page.dictionary for page in TABLES.pages + TABLES.cells if page.rule == rule}
+
 
 # Whole dictionaries: one row for each entry.
-DICTIONARIES = {
-    "LTE NAS": "myLTEEMMContextDict",
-    "LTE RRC State": "myLTERRCStateDict",
-    "LTE Serving Cell Info": "myLTESCellInfoDict",
-    "LTE C-DRX": "myLTECDRXConfigDict",
-    "UMTS NAS GMM": "myGMMContextDict",
-    "GSM NAS GMM": "myGMMContextDict",
-    "UMTS NAS MM": "myMMContextDict",
-    "GSM NAS MM": "myMMContextDict",
-    "UMTS RRC State": "myUMTSRRCStateDict",
-    "UMTS RRC Configuration": "myUMTSRRCConfigDict",
-    "UMTS Serving Cell Info": "myUMTSCellInfoDict",
-}
-
+DICTIONARIES = dictionaries("all")
 # Dictionaries that only the cells know: one row, whatever the dictionary holds.
-ONE_ROW_DICTIONARIES = {
-    "GSM Serving Cell Info": "myGSMScellInfoDict",
-    "GSM Idle Config": "myGSMIdleConfigInfoDict",
-    "GSM Idle Serv Cell Meas": "myGSMIdleScellMeasDict",
-    "GSM GPRS Config": "myGSMGPRSConfigDict",
-    "Connected Serv Cell Meas": "myGSMConnRfMeasDict",
-    "LTE Component Carrier Info": "myLTECompCarrDict",
-}
+ONE_ROW_DICTIONARIES = dictionaries("first")
 
 # Lists of entries: a section for each, its title, a row for each field.
 LISTS = {

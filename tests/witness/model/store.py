@@ -6,6 +6,7 @@ A handler is a list of steps. Each step takes the store and the name of the disp
 
 from . import wire
 from .clock import Clock
+from .tables import TABLES
 from .text import printed
 
 PLACEHOLDER = "Waiting for Update"
@@ -141,90 +142,49 @@ def flatten(key, suits):
     return step
 
 
-def simple(prefix):
-    return [stamp, say(prefix)]
-
-
-HANDLERS = {
-    # LTE
-    0x3C4E04: ("KCellularLteRrcState", "myLTERRCStateDict", simple("Current RRC state is ")),
-    0x3C4E18: ("KCellularLteCdrxConfig", "myLTECDRXConfigDict", simple("Current CDRX Config is ")),
-    0x3C40C2: ("KCellularLteScellInfo", "myLTESCellInfoDict",
-               [stamp, change(dl_bw=halved_twice), say("Current Serving Cell Info is ")]),
-    0x3CD30E: ("KCellularLteSelReselCellInfo", "myLTESelReselDict",
-               [say("Received LTE Cell Resel Info is "), stamp, flatten_bands, merge_reselection("LTE"),
-                collect("nbr_eutra", "LTE", "EutraNbrs", dl_bw=megahertz)]),
-    0x3CD302: ("KCellularLteTxPower", "myLTETxPowerDict",
-               simple("Received LTE Tx Power is ") + [rewrite("tx_power_info")]),
-    0x3C4F6A: ("KCellularLteRsrpRsrqSinr", "myLTERsrpRsrqSinrDict",
-               [say("Received RSRP RSRQ SINR is : "), stamp, rewrite("inst_values", sinr0=HALF, sinr1=HALF)]),
-    0x3CD30B: ("KCellularLteComponentCarrierInfo", "myLTECompCarrDict",
-               simple("Received Component Carrier info is ")),
-    0x3CD313: ("KCellularLteCarrierAggregationStatus", "myLTECAStatusDict",
-               simple("Received CA Status Dict is ")
-               + [collect("scc_list", "LTE", "CAStatusList", dl_bandwidth=megahertz, rsrp=over(100), rssi=over(100),
-                          rsrq=HUNDREDTH)]),
-    0x3CD310: ("KCellularLteNbrInterRatCellMeas", "myLTEInterRatMeasDict",
-               simple("Received LTE InterRat Meas Info is ")
-               + [rewrite("meas_nbr_utra", rscp=DBM_UTRA, ecno=DB_ECNO), rewrite("meas_nbr_geran", rxlev=DBM_GSM)]),
-    0x3CD30F: ("KCellularLteNbrEutraCellMeas", "myLTEIntraRatMeasDict",
-               simple("Received LTE IRAT Meas is ")
-               + [rewrite("meas_nbr_eutra", nbr_rsrp=DBM_EUTRA, nbr_rsrq=DB_RSRQ)]),
-    # NAS, bearers, SIM
-    0x3CD509: ("KCellularMmCommonInfo", "myCellularMMCommonInfoDict", simple("Received MM Common Info Dict is : ")),
-    0x3CD50D: ("KCellularActivatedBearerContexts", "myCellularActiveBearerDict",
-               simple("Received Bearer Context Info is ") + [collect("bearer_contexts", "Common", "activeBearer")]),
-    0x3CD50C: ("KCellularEmmContext", "myLTEEMMContextDict",
-               [stamp, flatten("guti", lambda value: isinstance(value, dict)),
-                flatten("tai_list", lambda value: entries(value) is not None), say("Received EMM Context is ")]),
-    0x3CD50A: ("KCellularMmContext", "myMMContextDict", simple("Received MM Context Info is ")),
-    0x3CD50B: ("KCellularGmmContext", "myGMMContextDict", simple("Received GMM Context Info is ")),
-    # UMTS
-    0x3CD112: ("KCellularWcdmaRrcConnectionState", "myUMTSRRCStateDict",
-               simple("Received UMTS RRC Connection State is ")),
-    0x3CD113: ("KCellularWcdmaRrcConfiguration", "myUMTSRRCConfigDict", simple("Received UMTS RRC Configuration is ")),
-    0x3C300C: ("KCellularWcdmaCellInfo", "myUMTSCellInfoDict", simple("Received UMTS Serving Cell Info is ")),
-    0x3CD102: ("KCellularWcdmaScellMeasurement", "myUMTSCellMeasDict",
-               simple("Received UMTS Serving Cell Meas is ")
-               + [collect("rx_info", "UMTS", "rXInfo", with_keys=("timestamp", "connected_mode"))]),
-    0x3CD103: ("KCellularWcdmaTxPower", "myUMTSTxPowerDict",
-               simple("Received Tx Power is ") + [collect("tx_power_info", "UMTS", "TxPower")]),
-    0x3CD104: ("KCellularWcdmaSelReselCellInfo", "myUMTSSelReselDict",
-               simple("Received UMTS Cell Resel Info is ")
-               + [flatten_bands, merge_reselection("UMTS"), collect("eutra_prio_info", "UMTS", "eUtraNbrs"),
-                  collect("utra_prio_info", "UMTS", "utraNbrs"), collect("gsm_prio_info", "UMTS", "geraNbrs")]),
-    0x3CD105: ("KCellularWcdmaNbrCellMeas", "myUMTSNbrMeasDict",
-               simple("Received UMTS InterRat Meas Info is ")
-               + [collect("meas_utra_result", "UMTS", "utraNbrMeas", rscp=DBM_UTRA, ecno=DB_ECNO),
-                  collect("meas_gsm_result", "UMTS", "geraNbrMeas", rxlev=DBM_GSM),
-                  collect("meas_lte_result", "UMTS", "eUtraNbrMeas", rsrp=DBM_EUTRA, rsrq=DB_RSRQ)]),
-    # GSM
-    0x3C2E0C: ("KCellularGsmScellInfo", "myGSMScellInfoDict", simple("Received GSM Serving Cell Info ")),
-    0x3CD001: ("KCellularGsmIdleConfig", "myGSMIdleConfigInfoDict", simple("Received GSM Idle Config Info is ")),
-    0x3CD002: ("KCellularGsmIdleScellMeasurement", "myGSMIdleScellMeasDict",
-               simple("Received GSM Idle Serving Cell Meas Info is ")),
-    0x3CD003: ("KCellularGsmCsRfMeasurement", "myGSMConnRfMeasDict",
-               simple("Received GSM Connected Serving Cell Meas Info is ")),
-    0x3CD009: ("KCellularGsmGrrEventMeasCr", "myGSMNbrMeasDict",
-               simple("Received GSM Nbr Cell Meas Info is ")
-               + [collect("gsm_ncell_meas", "GSM", "geraNbrMeas", rxlev=DBM_GSM),
-                  # "cpich_ecno" is never there: the message says "cpich_ecn0", whose value stays raw.
-                  collect("umts_ncell_meas", "GSM", "utraNbrMeas", cpich_rscp=DBM_UTRA, cpich_ecno=DB_ECNO),
-                  collect("lte_ncell_meas", "GSM", "eUtraNbrMeas", rsrp=DBM_EUTRA, rsrq=DB_RSRQ)]),
-    0x3CD00C: ("KCellularGsmGprsConfig", "myGSMGPRSConfigDict", simple("Received GSM GPRS Config Info is ")),
-    0x3C0013: ("KCellularSimCardFiles", "mySIMFileInfoDict",
-               simple("Received SIM Card File Info is ") + [collect("ef_list", "Common", "simContents", with_keys=())]),
+# What is done beside the timestamp and the line of the log, in this order: the step that writes the line is handed in.
+STEPS = {
+    "K_LTE_SCELL_INFO": lambda line: [stamp, change(dl_bw=halved_twice), line],
+    "K_LTE_SEL_RESEL_INFO": lambda line: [
+        line, stamp, flatten_bands, merge_reselection("LTE"), collect("nbr_eutra", "LTE", "EutraNbrs", dl_bw=megahertz)],
+    "K_LTE_TX_POWER": lambda line: [stamp, line, rewrite("tx_power_info")],
+    "K_LTE_RSRP_RSRQ_SINR": lambda line: [line, stamp, rewrite("inst_values", sinr0=HALF, sinr1=HALF)],
+    "K_LTE_CA_STATUS": lambda line: [
+        stamp, line, collect("scc_list", "LTE", "CAStatusList", dl_bandwidth=megahertz, rsrp=over(100), rssi=over(100),
+                             rsrq=HUNDREDTH)],
+    "K_LTE_INTERRAT_MEAS": lambda line: [
+        stamp, line, rewrite("meas_nbr_utra", rscp=DBM_UTRA, ecno=DB_ECNO), rewrite("meas_nbr_geran", rxlev=DBM_GSM)],
+    "K_LTE_INTRARAT_MEAS": lambda line: [stamp, line, rewrite("meas_nbr_eutra", nbr_rsrp=DBM_EUTRA, nbr_rsrq=DB_RSRQ)],
+    "K_CELLULAR_ACTIVE_BEARER": lambda line: [stamp, line, collect("bearer_contexts", "Common", "activeBearer")],
+    "K_LTE_EMM_CTXT": lambda line: [
+        stamp, flatten("guti", lambda value: isinstance(value, dict)),
+        flatten("tai_list", lambda value: entries(value) is not None), line],
+    "K_UMTS_SCELL_MEAS": lambda line: [
+        stamp, line, collect("rx_info", "UMTS", "rXInfo", with_keys=("timestamp", "connected_mode"))],
+    "K_UMTS_TX_POWER": lambda line: [stamp, line, collect("tx_power_info", "UMTS", "TxPower")],
+    "K_UMTS_SEL_RESEL_INFO": lambda line: [
+        stamp, line, flatten_bands, merge_reselection("UMTS"), collect("eutra_prio_info", "UMTS", "eUtraNbrs"),
+        collect("utra_prio_info", "UMTS", "utraNbrs"), collect("gsm_prio_info", "UMTS", "geraNbrs")],
+    "K_UMTS_NCELL_MEAS": lambda line: [
+        stamp, line, collect("meas_utra_result", "UMTS", "utraNbrMeas", rscp=DBM_UTRA, ecno=DB_ECNO),
+        collect("meas_gsm_result", "UMTS", "geraNbrMeas", rxlev=DBM_GSM),
+        collect("meas_lte_result", "UMTS", "eUtraNbrMeas", rsrp=DBM_EUTRA, rsrq=DB_RSRQ)],
+    "K_GSM_NCELL_MEAS": lambda line: [
+        stamp, line, collect("gsm_ncell_meas", "GSM", "geraNbrMeas", rxlev=DBM_GSM),
+        # "cpich_ecno" is never there: the message says "cpich_ecn0", whose value stays raw.
+        collect("umts_ncell_meas", "GSM", "utraNbrMeas", cpich_rscp=DBM_UTRA, cpich_ecno=DB_ECNO),
+        collect("lte_ncell_meas", "GSM", "eUtraNbrMeas", rsrp=DBM_EUTRA, rsrq=DB_RSRQ)],
+    "K_SIM_FILE_INFO": lambda line: [stamp, line, collect("ef_list", "Common", "simContents", with_keys=())],
 }
 
-UNHANDLED = {"K_LTE_RLF": 0x3C4E25, "K_LTE_SCELL_MEAS": 0x3CD301}
 
-DISPLAY_DICTIONARIES = """
-    myLTERRCStateDict myLTECDRXConfigDict myLTESCellInfoDict myLTESCellMeasDict myLTESelReselDict
-    myLTERsrpRsrqSinrDict myLTECompCarrDict myLTETxPowerDict myLTEInterRatMeasDict myLTEIntraRatMeasDict
-    myLTECAStatusDict myLTEEMMContextDict myCellularMMCommonInfoDict myCellularActiveBearerDict myGMMContextDict
-    myMMContextDict myUMTSRRCStateDict myUMTSRRCConfigDict myUMTSCellInfoDict myUMTSCellMeasDict myUMTSTxPowerDict
-    myUMTSSelReselDict myUMTSNbrMeasDict myGSMScellInfoDict myGSMIdleConfigInfoDict myGSMIdleScellMeasDict
-    myGSMConnRfMeasDict myGSMNbrMeasDict myGSMGPRSConfigDict mySIMFileInfoDict""".split()
+def steps_of(metric):
+    return STEPS.get(metric.constant, lambda line: [stamp, line])(say(metric.prefix))
+
+
+HANDLERS = {number: (metric.message, metric.dictionary, steps_of(metric)) for number, metric in TABLES.metrics.items()}
+UNHANDLED = TABLES.left_alone
+DISPLAY_DICTIONARIES = TABLES.dictionaries
 
 LTE_RESELECTION = """
     timestamp ims_emergency_support ac_barring_for_emergency mo_signalling_ac_barring_factor

@@ -1,8 +1,21 @@
 # SPDX-License-Identifier: Apache-2.0
-"""The message tables, read from messages.table."""
+"""What there is of metrics, pages and messages, read from second_opinion.table."""
 
 import pathlib
 from typing import NamedTuple
+
+
+class Metric(NamedTuple):
+    constant: str
+    message: str
+    dictionary: str
+    prefix: str  # of its line in the log
+
+
+class Page(NamedTuple):
+    key: str
+    rule: str  # "all" or "first" entries of a dictionary; empty for a page of something else
+    dictionary: str
 
 
 class Field(NamedTuple):
@@ -18,55 +31,46 @@ def _field(number, key, kind, detail=""):
     return Field(number, key, kind[:-1] if repeated else kind, repeated, detail)
 
 
-def _read():
-    messages, choices, row = {}, {}, None
-    for line in pathlib.Path(__file__).with_name("messages.table").read_text("utf-8").splitlines():
-        words = line.partition("#")[0].split()
-        if not words:
-            continue
-        if words[0] == "message":
-            rows, row = messages.setdefault(words[1], {}), _field
-        elif words[0] == "choices":
-            rows, row = choices.setdefault(words[1], {}), lambda number, name: name
-        else:
-            assert int(words[0]) not in rows, line
-            rows[int(words[0])] = row(int(words[0]), *words[1:])
-    return messages, choices
+class Tables:
+    def __init__(self, text):
+        self.messages, self.choices, self.metrics, self.left_alone, self.tags = {}, {}, {}, {}, {}
+        self.dictionaries, self.pages, self.cells = [], [], []
+        self.rows, self.row = {}, None
+        for line in text.splitlines():
+            if words := line.partition("#")[0].split():
+                self.read(words[0], words[1:], line)
+
+    def read(self, kind, words, line):
+        match kind:
+            case "metric":
+                self.metrics[int(words[1], 16)] = Metric(words[0], words[2], words[3], line.split('"')[1])
+            case "left-alone":
+                self.left_alone[words[0]] = int(words[1], 16)
+            case "dictionary":
+                self.dictionaries += words
+            case "tag":
+                self.tags[int(words[0], 16)] = words[1]
+            case "page":
+                technology, category, *shown = " ".join(words).split(" | ")
+                self.pages.append(self.page(technology + " " + category, shown))
+            case "cells":
+                key, *shown = " ".join(words).split(" | ")
+                self.cells.append(self.page(key, shown))
+            case "message":
+                self.rows, self.row = self.messages.setdefault(words[0], {}), _field
+            case "choices":
+                self.rows, self.row = self.choices.setdefault(words[0], {}), lambda number, name: name
+            case number:
+                assert int(number) not in self.rows, line
+                self.rows[int(number)] = self.row(int(number), *words)
+
+    @staticmethod
+    def page(key, shown):
+        return Page(key, *(shown[0].split() if shown else ("", "")))
 
 
-MESSAGES, CHOICES = _read()
+TABLES = Tables(pathlib.Path(__file__).with_name("second_opinion.table").read_text("utf-8"))
+MESSAGES, CHOICES = TABLES.messages, TABLES.choices
 
 # Field numbers that the decoder takes for a metric identifier, with the name each has in the decoder's own table.
-METRIC_TAGS = {
-    0x4E04: "KCellularLteRrcState",
-    0x4E18: "KCellularLteCdrxConfig",
-    0x4E25: "KCellularLteRadioLinkFailure",
-    0x40C2: "KCellularLteScellInfo",
-    0xD30E: "KCellularLteSelReselCellInfo",
-    0xD301: "KCellularLteServingCellMeasurement",
-    0xD302: "KCellularLteTxPower",
-    0x4F6A: "KCellularRsrpRsrqSinr",
-    0xD50C: "KCellularEmmContext",
-    0xD30B: "KCellularLteComponentCarrierInfo",
-    0xD313: "KCellularLteCarrierAggregationStatus",
-    0xD310: "KCellularLteNbrInterRatCellMeas",
-    0xD30F: "KCellularLteNbrEutraCellMeas",
-    0xD509: "KCellularMmCommonInfo",
-    0xD50D: "KCellularActivatedBearerContexts",
-    0xD112: "KCellularWcdmaRrcConnectionState",
-    0x300C: "KCellularWcdmaCellInfo",
-    0xD102: "KCellularWcdmaScellMeasurement",
-    0xD103: "KCellularWcdmaTxPower",
-    0xD105: "KCellularWcdmaNbrCellMeas",
-    0xD104: "KCellularWcdmaSelReselCellInfo",
-    0xD113: "KCellularWcdmaRrcConfiguration",
-    0xD50A: "KCellularMmContext",
-    0xD50B: "KCellularGmmContext",
-    0x2E0C: "kCellularGsmScellInfo",
-    0xD001: "kCellularGsmIdleConfig",
-    0xD002: "kCellularGsmIdleScellMeasurement",
-    0xD003: "kCellularGsmCsRfMeasurement",
-    0xD009: "kCellularGsmGrrEventMeasCr",
-    0xD00C: "kCellularGsmGprsConfig",
-    0x0013: "kCellularSimCardFiles",
-}
+METRIC_TAGS = TABLES.tags
