@@ -12,6 +12,7 @@
 #include <string>
 #include <string_view>
 #include <system_error>
+#include <utility>
 
 #include "app/application.h"
 #include "platform/console_log.h"
@@ -66,41 +67,50 @@ bool chooseLogs(const ViewerOptions& options, FrontKind front, std::ostream& err
 // The toolkit aborts without them.
 constexpr std::size_t descriptorsOfAWindow = 64;
 
-std::unique_ptr<Front> makeFront(FrontKind kind, const MakeWindow& makeWindow, std::string& error) {
+// A front, and what it is to know of the session before it shows it.
+struct MadeFront {
+  std::unique_ptr<Front> front;  // null, with the error, when there can be none
+  BeforeShowing prepare;
+};
+
+MadeFront makePrintFront(std::ostream& errors) {
+  auto front = std::make_unique<PrintFront>(STDOUT_FILENO);
+  PrintFront& print = *front;
+  return {std::move(front), [&print, &errors](MetricSession& session) {
+            print.failWith([&session] { return session.serviceTrouble(); }, errors);
+            print.waitUntil([&session] { return session.isFilled(); });
+          }};
+}
+
+MadeFront makeFront(FrontKind kind, const MakeWindow& makeWindow, std::ostream& errors, std::string& error) {
   switch (kind) {
     case FrontKind::Window:
-      if (makeWindow && mayOpenDescriptors(descriptorsOfAWindow)) return makeWindow();
+      if (makeWindow && mayOpenDescriptors(descriptorsOfAWindow)) return {makeWindow(), {}};
       error = makeWindow ? "a window needs " + std::to_string(descriptorsOfAWindow) +
                                " more open files than this process may have; raise the limit (ulimit -n)"
                          : "this build has no window; --terminal and --print show the pages without one";
-      return nullptr;
+      return {};
     case FrontKind::Terminal:
-      return terminal::TerminalFront::make(error);
+      return {terminal::TerminalFront::make(error), {}};
     case FrontKind::Print:
-      return std::make_unique<PrintFront>(STDOUT_FILENO);
+      return makePrintFront(errors);
   }
-  return nullptr;
+  return {};
 }
-
-}  // namespace
-
-namespace {
 
 int show(const ViewerOptions& options, const MakeWindow& makeWindow, std::ostream& errors) {
   const auto kind = chooseFront(frontCircumstances(options.front, makeWindow != nullptr));
   if (!chooseLogs(options, kind, errors)) return 1;
   std::string error;
-  const auto front = makeFront(kind, makeWindow, error);
-  if (!front) {
+  const MadeFront made = makeFront(kind, makeWindow, errors, error);
+  if (!made.front) {
     errors << error << "\n";
     return 1;
   }
-  return applicationMain("AppDelegate", *front, [&](MetricSession& session) {
+  AppDelegate delegate;
+  return applicationMain(delegate, *made.front, [&](MetricSession& session) {
     if (options.pageKey) openPage(session.navigation(), *options.pageKey);
-    if (auto* print = dynamic_cast<PrintFront*>(front.get())) {
-      print->failWith([&session] { return session.serviceTrouble(); }, errors);
-      print->waitUntil([&session] { return session.isFilled(); });
-    }
+    if (made.prepare) made.prepare(session);
   });
 }
 

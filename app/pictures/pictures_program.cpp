@@ -68,7 +68,8 @@ int runPicturesProgram(int argc, char** argv, std::ostream& output, std::ostream
   qt::logToolkitMessages();
   int noArguments = 1;
   const auto front = qt::makePicturesFront(noArguments, argv, options, errors);
-  return applicationMain("AppDelegate", *front,
+  AppDelegate delegate;
+  return applicationMain(delegate, *front,
                          [&](MetricSession& session) { front->waitUntil([&session] { return session.isFilled(); }); });
 }
 

@@ -223,9 +223,57 @@ TEST(AppDelegateLife, LaunchingIsAllowedAndNothingElseIsDone) {
   EXPECT_EQ(delegate.window, nullptr);
 }
 
-TEST(AppDelegateLife, TheApplicationKnowsItsDelegateByTheNameOfItsClass) {
-  EXPECT_NE(dynamic_cast<AppDelegate*>(makeApplicationDelegate("AppDelegate").get()), nullptr);
-  EXPECT_EQ(makeApplicationDelegate("OtherDelegate"), nullptr);
+// Writes down what it hears of the application's life, and the front's part in it.
+class WritingDelegate final : public ApplicationDelegate {
+ public:
+  WritingDelegate(Lines& life, bool letsLaunch) : life_(life), letsLaunch_(letsLaunch) {}
+
+  bool didFinishLaunchingWithOptions() override {
+    life_.emplace_back("launched");
+    return letsLaunch_;
+  }
+  void applicationWillResignActive() override { life_.emplace_back("resigns"); }
+  void applicationDidEnterBackground() override { life_.emplace_back("background"); }
+  void applicationWillEnterForeground() override { life_.emplace_back("foreground"); }
+  void applicationDidBecomeActive() override { life_.emplace_back("active"); }
+  void applicationWillTerminate() override { life_.emplace_back("terminates"); }
+
+ private:
+  Lines& life_;
+  bool letsLaunch_;
+};
+
+class WritingFront final : public Front {
+ public:
+  explicit WritingFront(Lines& life) : life_(life) {}
+
+  TaskQueue& mainQueue() override { return loop_; }
+  Scheduler& scheduler() override { return loop_; }
+  int run(NavigationStack& navigation, const StatusSource&) override {
+    life_.push_back("shows " + navigation.topPage().title());
+    return 7;
+  }
+
+ private:
+  ManualLoop loop_;
+  Lines& life_;
+};
+
+TEST(AppDelegateLife, TheDelegateHearsOfLaunchAndEndAroundWhatTheFrontShows) {
+  Lines life;
+  WritingFront front(life);
+  WritingDelegate delegate(life, true);
+  EXPECT_EQ(applicationMain(delegate, front, [&](MetricSession&) { life.emplace_back("prepared"); }), 7);
+  EXPECT_EQ(life, (Lines{"launched", "prepared", "active", "shows probeview", "terminates"}));
+  EXPECT_EQ(delegate.window, &front);
+}
+
+TEST(AppDelegateLife, ADelegateThatDoesNotLetTheApplicationLaunchEndsIt) {
+  Lines life;
+  WritingFront front(life);
+  WritingDelegate delegate(life, false);
+  EXPECT_EQ(applicationMain(delegate, front), 1);
+  EXPECT_EQ(life, Lines{"launched"});
 }
 
 class FillWatching : public testing::Test {

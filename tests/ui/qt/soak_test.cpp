@@ -171,7 +171,8 @@ TEST(WindowSoak, ARestlessHandStopsNothingLosesNothingAndLeaksNothing) {
   bool filled = false;
   const auto begin = Drive::Clock::now();
   ScheduledTaskHandle moving;
-  const int status = applicationMain("AppDelegate", *front, [&](MetricSession& session) {
+  AppDelegate delegate;
+  const int status = applicationMain(delegate, *front, [&](MetricSession& session) {
     moving = front->scheduler().every(10ms, [&] {
       const auto windows = QGuiApplication::topLevelWindows();
       if (windows.isEmpty() || !windows.front()->isExposed()) return;
