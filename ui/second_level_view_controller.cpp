@@ -2,7 +2,6 @@
 #include "ui/second_level_view_controller.h"
 
 #include "platform/fatal_error.h"
-#include "ui/category_page.h"
 #include "ui/category_page_rules.h"
 
 namespace probeview {
@@ -17,20 +16,18 @@ std::string SecondLevelViewController::title() const { return seguedThroughRow.v
 
 std::optional<PageFeed> SecondLevelViewController::feed() const { return feedOf(categoryPageRule(key())); }
 
-std::size_t SecondLevelViewController::numberOfSectionsInTableView() {
-  return CategoryPage(key(), myMetricValidator, consoleLog_).numberOfSectionsInTableView();
-}
+std::size_t SecondLevelViewController::numberOfSectionsInTableView() { return page().numberOfSectionsInTableView(); }
 
 std::optional<std::string> SecondLevelViewController::titleForHeaderInSection(std::size_t section) {
-  return CategoryPage(key(), myMetricValidator, consoleLog_).titleForHeaderInSection(section);
+  return page().titleForHeaderInSection(section);
 }
 
 std::size_t SecondLevelViewController::numberOfRowsInSection(std::size_t section) {
-  return CategoryPage(key(), myMetricValidator, consoleLog_).numberOfRowsInSection(section);
+  return page().numberOfRowsInSection(section);
 }
 
 void SecondLevelViewController::cellForRowAtIndexPath(std::size_t section, std::size_t row, ListCell& cell) {
-  CategoryPage(key(), myMetricValidator, consoleLog_).cellForRowAtIndexPath(section, row, cell);
+  page().cellForRowAtIndexPath(section, row, cell);
 }
 
 double SecondLevelViewController::heightForRowAtIndexPath(std::size_t, std::size_t) const { return automaticDimension; }
@@ -45,6 +42,11 @@ void SecondLevelViewController::viewDidLoad() {
 }
 
 void SecondLevelViewController::update() { mainQueue_.post(reloadTask()); }
+
+CategoryPage& SecondLevelViewController::page() {
+  if (!page_) page_.emplace(key(), myMetricValidator, consoleLog_);
+  return *page_;
+}
 
 std::string SecondLevelViewController::key() const {
   if (!firstSelection || !seguedThroughRow) {

@@ -3,6 +3,7 @@
 
 #include <chrono>
 
+#include "ui/category_page.h"
 #include "ui/list_page.h"
 #include "ui/page_environment.h"
 #include "ui/varnet_view_items.h"
@@ -43,7 +44,10 @@ class SecondLevelViewController final : public ListPage {
 
  private:
   std::string key() const;
+  // Made when the first question comes, as the selection is set by then.
+  CategoryPage& page();
 
+  std::optional<CategoryPage> page_;
   TaskQueue& mainQueue_;
   Scheduler& scheduler_;
   LineSink& consoleLog_;
