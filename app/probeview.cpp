@@ -1,35 +1,34 @@
 // SPDX-License-Identifier: Apache-2.0
-#include <CLI/CLI.hpp>
+#include <optional>
 #include <ostream>
 
 #include "app/viewer.h"
+#include "platform/command_line.h"
 
 namespace probeview {
 
 int runProbeview(int argc, const char* const* argv, const MakeWindow& makeWindow, std::ostream& output,
                  std::ostream& errors) {
-  CLI::App program(
+  CommandLine program(
+      "probeview",
       "Shows the live state of the phone's cellular radio: LTE, UMTS and GSM cells, measurements, connection states,\n"
-      "mobility contexts, bearers and SIM files, as the baseband service radixd reports them.",
-      "probeview");
-  program.set_version_flag("--version", "probeview " PROBEVIEW_VERSION);
+      "mobility contexts, bearers and SIM files, as the baseband service radixd reports them.");
   ViewerOptions options;
-  auto* window = program.add_flag_callback(
-      "--window", [&] { options.front = FrontKind::Window; },
-      "Show the pages in a window (default where there is a display)");
-  auto* terminal = program.add_flag_callback(
-      "--terminal", [&] { options.front = FrontKind::Terminal; },
-      "Show the pages in the terminal (default where there is no display)");
-  auto* print = program.add_flag_callback(
-      "--print", [&] { options.front = FrontKind::Print; },
-      "Wait until every metric has come once, at most 15 s, then print every page as plain text and end");
-  window->excludes(terminal)->excludes(print);
-  terminal->excludes(print);
+  bool asksForWindow = false, asksForTerminal = false, asksForText = false;
+  CommandOption window =
+      program.flag("--window", asksForWindow, "Show the pages in a window (default where there is a display)");
+  CommandOption terminal =
+      program.flag("--terminal", asksForTerminal, "Show the pages in the terminal (default where there is no display)");
+  CommandOption print =
+      program.flag("--print", asksForText,
+                   "Wait until every metric has come once, at most 15 s, then print every page as plain text and end");
+  window.excludes(terminal).excludes(print);
+  terminal.excludes(print);
   program
-      .add_option("--log", options.logFile,
-                  "Write the console log of every metric to this file, - for standard output (default: with the window "
-                  "standard output, else nowhere)")
-      ->type_name("FILE");
+      .option("--log", options.logFile,
+              "Write the console log of every metric to this file, - for standard output (default: with the window "
+              "standard output, else nowhere)")
+      .typeName("FILE");
   program.footer(
       "Keys: arrows, Page Up, Page Down, Home and End move, Return opens; Esc, Backspace and Left go back. In the "
       "window\n"
@@ -40,11 +39,10 @@ int runProbeview(int argc, const char* const* argv, const MakeWindow& makeWindow
       "Exit status: 0 when all went well, 1 when the pages could not be shown or there is no service to print them "
       "of,\n"
       "2 when the command line was not understood.");
-  try {
-    program.parse(argc, argv);
-  } catch (const CLI::ParseError& error) {
-    return program.exit(error, output, errors) == 0 ? 0 : 2;
-  }
+  if (const std::optional<int> status = program.parse(argumentsOf(argc, argv), output, errors)) return *status;
+  if (asksForWindow) options.front = FrontKind::Window;
+  if (asksForTerminal) options.front = FrontKind::Terminal;
+  if (asksForText) options.front = FrontKind::Print;
   return runViewer(options, makeWindow, errors);
 }
 

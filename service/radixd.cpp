@@ -3,15 +3,16 @@
 
 #include <signal.h>
 
-#include <CLI/CLI.hpp>
 #include <cerrno>
 #include <cstring>
 #include <exception>
+#include <iostream>
 #include <memory>
 #include <utility>
 #include <vector>
 
 #include "platform/clock.h"
+#include "platform/command_line.h"
 #include "platform/event_loop.h"
 #include "radix/socket_path.h"
 #include "service/log.h"
@@ -24,7 +25,6 @@ namespace probeview {
 namespace {
 
 constexpr int failure = 1;
-constexpr int usageError = 2;
 
 constexpr std::string_view defaultSource = "scenario";
 
@@ -41,25 +41,23 @@ std::optional<LogLevel> logLevel(std::string_view name) {
   return std::nullopt;
 }
 
-void describe(CLI::App& program, Options& options) {
-  program.set_version_flag("--version", std::string("radixd ") + PROBEVIEW_VERSION, "Show the version and exit");
-  program.set_help_flag("-h,--help", "Show this help and exit");
+void describe(CommandLine& program, Options& options) {
+  program.describeHelpAndVersion("Show this help and exit", "Show the version and exit");
   program
-      .add_option("--socket", options.socket,
-                  "Where to listen; otherwise $XDG_RUNTIME_DIR/radixd.sock (the system's service listens at\n"
-                  "/run/radixd/radix.sock)")
-      ->type_name("PATH")
-      ->check(radix::socketPathTrouble);
+      .option("--socket", options.socket,
+              "Where to listen; otherwise $XDG_RUNTIME_DIR/radixd.sock (the system's service listens at\n"
+              "/run/radixd/radix.sock)")
+      .typeName("PATH")
+      .check(radix::socketPathTrouble);
   program
-      .add_option("--source", options.sources,
-                  "What feeds the service, may be given several times: scenario[:NAME][,seed=N][,speed=N] (the\n"
-                  "default), trace:FILE[,speed=N][,loop]")
-      ->type_name("SOURCE")
-      ->expected(1)
-      ->take_all();
-  program.add_option("--log-level", options.logLevel, "How much to log: error, warning, info (the default), debug")
-      ->type_name("LEVEL")
-      ->check([](const std::string& name) { return logLevel(name) ? "" : "'" + name + "' is no level of the log"; });
+      .option("--source", options.sources,
+              "What feeds the service, may be given several times: scenario[:NAME][,seed=N][,speed=N] (the\n"
+              "default), trace:FILE[,speed=N][,loop]")
+      .typeName("SOURCE")
+      .shownAsOne();
+  program.option("--log-level", options.logLevel, "How much to log: error, warning, info (the default), debug")
+      .typeName("LEVEL")
+      .check([](const std::string& name) { return logLevel(name) ? "" : "'" + name + "' is no level of the log"; });
   program.footer(
       "The service runs in the foreground, logs to standard error and ends cleanly on SIGTERM.\n"
       "\n"
@@ -152,16 +150,10 @@ int serveWithin(const Options& options, LineSink& sink, LogLevel level) {
 }  // namespace
 
 int runRadixd(std::span<const std::string> arguments, LineSink& sink) {
-  CLI::App program("Serves metrics of the phone's radio to its clients over a local socket.", "radixd");
+  CommandLine program("radixd", "Serves metrics of the phone's radio to its clients over a local socket.");
   Options options;
   describe(program, options);
-  try {
-    // The library takes the arguments last first.
-    program.parse(std::vector<std::string>(arguments.rbegin(), arguments.rend()));
-  } catch (const CLI::ParseError& error) {
-    // Help and version arrive here too, as errors with status 0.
-    return program.exit(error) == 0 ? 0 : usageError;
-  }
+  if (const std::optional<int> status = program.parse(arguments, std::cout, std::cerr)) return *status;
   const LogLevel level = logLevel(options.logLevel).value_or(LogLevel::Info);
   const int status = serveWithin(options, sink, level);
   // The last line comes also when there were too many before it.

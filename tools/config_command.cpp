@@ -1,7 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/config_command.h"
 
-#include <CLI/CLI.hpp>
 #include <memory>
 #include <ostream>
 #include <string>
@@ -38,22 +37,22 @@ ExitStatus clear(Tool& tool) {
 
 }  // namespace
 
-void addConfigCommand(CLI::App& program, Tool& tool) {
-  CLI::App* command = program.add_subcommand("config", "Set or clear the service's base configuration");
-  command->require_subcommand(1);
-  command->footer(
+void addConfigCommand(Command program, Tool& tool) {
+  Command command = program.subcommand("config", "Set or clear the service's base configuration");
+  command.requireSubcommand();
+  command.footer(
       "The base configuration counts as that of one more client until it is cleared or the service ends.\n"
       "Exit status 1 when it is refused, with the line and the column of what is wrong.\n"
       "\n"
       "Examples:\n"
       "  probectl config push kiv_test_lte.deviceconfig\n"
       "  probectl config clear");
-  CLI::App* pushing = command->add_subcommand("push", "Set it to the content of a file");
+  Command pushing = command.subcommand("push", "Set it to the content of a file");
   auto path = std::make_shared<std::string>();
-  pushing->add_option("FILE", *path, "A configuration file: metrics, their periods, triggers")->required();
-  pushing->callback([path, &tool] { tool.run = [path, &tool] { return push(*path, tool); }; });
-  CLI::App* clearing = command->add_subcommand("clear", "Take it away");
-  clearing->callback([&tool] { tool.run = [&tool] { return clear(tool); }; });
+  pushing.option("FILE", *path, "A configuration file: metrics, their periods, triggers").required();
+  pushing.whenChosen([path, &tool] { tool.run = [path, &tool] { return push(*path, tool); }; });
+  Command clearing = command.subcommand("clear", "Take it away");
+  clearing.whenChosen([&tool] { tool.run = [&tool] { return clear(tool); }; });
 }
 
 }  // namespace probeview

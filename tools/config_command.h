@@ -6,6 +6,6 @@
 namespace probeview {
 
 // probectl config: the service's base configuration.
-void addConfigCommand(CLI::App& program, Tool& tool);
+void addConfigCommand(Command program, Tool& tool);
 
 }  // namespace probeview

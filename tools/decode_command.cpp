@@ -1,7 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/decode_command.h"
 
-#include <CLI/CLI.hpp>
 #include <algorithm>
 #include <ostream>
 #include <string>
@@ -128,19 +127,19 @@ ExitStatus runBatch(Tool& tool) {
 
 }  // namespace
 
-void addDecodeCommand(CLI::App& program, Tool& tool) {
-  CLI::App* command = program.add_subcommand("decode", "Decode payloads by hand");
+void addDecodeCommand(Command program, Tool& tool) {
+  Command command = program.subcommand("decode", "Decode payloads by hand");
   auto options = std::make_shared<DecodeOptions>();
-  CLI::Option* reference = command->add_option("CLASS|METRIC", options->reference,
-                                               "A message class, a metric, or a metric's identifier (decimal or 0x…)");
-  CLI::Option* hex = command->add_option(
+  const CommandOption reference = command.option(
+      "CLASS|METRIC", options->reference, "A message class, a metric, or a metric's identifier (decimal or 0x…)");
+  const CommandOption hex = command.option(
       "HEX", options->hex, "The payload in hexadecimal, - for an empty one; blanks, line ends and 0x do no harm");
   command
-      ->add_flag("--batch", options->batch,
-                 "Read lines \"CLASS|METRIC HEX\" from standard input, answer each with a line of JSON")
-      ->excludes(reference)
-      ->excludes(hex);
-  command->footer(
+      .flag("--batch", options->batch,
+            "Read lines \"CLASS|METRIC HEX\" from standard input, answer each with a line of JSON")
+      .excludes(reference)
+      .excludes(hex);
+  command.footer(
       "Prints a line \"key: value\" for each field; with --batch one JSON object a line:\n"
       "  {\"class\":…,\"ok\":true|false,\"dict\":{…},\"reencoded\":\"hex\",\"log\":[…]}\n"
       "or {\"error\":…} for a line that is not understood. Blank lines and lines that begin with # are ignored.\n"
@@ -153,9 +152,9 @@ void addDecodeCommand(CLI::App& program, Tool& tool) {
       "  probectl decode K_LTE_RRC_STATE 0x10 0x03 0x18 0x01\n"
       "  probectl decode KCellularLteTxPower -\n"
       "  echo '0x3C4E04 1003' | probectl decode --batch");
-  command->callback([options, &tool] {
+  command.whenChosen([options, &tool] {
     if (!options->batch && (options->reference.empty() || options->hex.empty())) {
-      throw CLI::RequiredError("CLASS|METRIC and HEX, or --batch,");
+      throw UsageError("CLASS|METRIC and HEX, or --batch, is required");
     }
     tool.run = [options, &tool] { return options->batch ? runBatch(tool) : decodeForAPerson(*options, tool); };
   });

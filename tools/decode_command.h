@@ -6,6 +6,6 @@
 namespace probeview {
 
 // probectl decode: payloads by hand, one for a person or many for a program.
-void addDecodeCommand(CLI::App& program, Tool& tool);
+void addDecodeCommand(Command program, Tool& tool);
 
 }  // namespace probeview

@@ -1,7 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/metrics_command.h"
 
-#include <CLI/CLI.hpp>
 #include <algorithm>
 #include <memory>
 #include <ostream>
@@ -133,13 +132,12 @@ ExitStatus showMetrics(const MetricsOptions& options, Tool& tool) {
 
 }  // namespace
 
-void addMetricsCommand(CLI::App& program, Tool& tool) {
-  CLI::App* command = program.add_subcommand("metrics", "List and explain the metrics that there are");
+void addMetricsCommand(Command program, Tool& tool) {
+  Command command = program.subcommand("metrics", "List and explain the metrics that there are");
   auto options = std::make_shared<MetricsOptions>();
-  command->add_option("METRIC", options->metrics,
-                      "Those alone, with their fields; by name or identifier (decimal or 0x…)");
-  command->add_flag("--json", options->json, "One JSON object a line for each metric, always with its fields");
-  command->footer(
+  command.option("METRIC", options->metrics, "Those alone, with their fields; by name or identifier (decimal or 0x…)");
+  command.flag("--json", options->json, "One JSON object a line for each metric, always with its fields");
+  command.footer(
       "Without METRIC each metric with its identifier, its message, what it tells and the pages that show it. No\n"
       "service is asked; 'probectl status' says what its sources can fill.\n"
       "\n"
@@ -152,7 +150,7 @@ void addMetricsCommand(CLI::App& program, Tool& tool) {
       "  probectl metrics\n"
       "  probectl metrics K_LTE_RRC_STATE\n"
       "  probectl metrics --json | jq -r 'select(.fields[]?.key == \"phy_cell_id\") | .metric'");
-  command->callback([options, &tool] { tool.run = [options, &tool] { return showMetrics(*options, tool); }; });
+  command.whenChosen([options, &tool] { tool.run = [options, &tool] { return showMetrics(*options, tool); }; });
 }
 
 }  // namespace probeview

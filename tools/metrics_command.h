@@ -6,6 +6,6 @@
 namespace probeview {
 
 // probectl metrics: what each metric is, and what its fields mean. Asks no service.
-void addMetricsCommand(CLI::App& program, Tool& tool);
+void addMetricsCommand(Command program, Tool& tool);
 
 }  // namespace probeview

@@ -1,7 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/names.h"
 
-#include <CLI/CLI.hpp>
 #include <memory>
 #include <ostream>
 
@@ -48,14 +47,12 @@ std::string unknownMetric(std::string_view text) {
   return quotedExcerpt(text) + " is no metric and no metric's identifier" + didYouMean(text, metricNames());
 }
 
-void addNamesCommand(CLI::App& program, Tool& tool) {
-  CLI::App* command = program.add_subcommand("names", "Print the names of metrics, classes or pages, one a line");
+void addNamesCommand(Command program, Tool& tool) {
+  Command command = program.subcommand("names", "Print the names of metrics, classes or pages, one a line");
   auto what = std::make_shared<std::string>();
-  command->add_option("WHAT", *what, "metrics, classes or pages")
-      ->required()
-      ->check(CLI::IsMember({"metrics", "classes", "pages"}));
-  command->footer("What the completion of command lines offers.\n\nExamples:\n  probectl names metrics");
-  command->callback([what, &tool] { tool.run = [what, &tool] { return showNames(*what, tool); }; });
+  command.option("WHAT", *what, "metrics, classes or pages").required().oneOf({"metrics", "classes", "pages"});
+  command.footer("What the completion of command lines offers.\n\nExamples:\n  probectl names metrics");
+  command.whenChosen([what, &tool] { tool.run = [what, &tool] { return showNames(*what, tool); }; });
 }
 
 }  // namespace probeview

@@ -23,6 +23,6 @@ std::optional<std::int64_t> metricOnCommandLine(std::string_view text);
 std::string unknownMetric(std::string_view text);
 
 // probectl names: metrics, classes or pages, one a line, for the completion of command lines.
-void addNamesCommand(CLI::App& program, Tool& tool);
+void addNamesCommand(Command program, Tool& tool);
 
 }  // namespace probeview

@@ -1,7 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/pages_command.h"
 
-#include <CLI/CLI.hpp>
 #include <algorithm>
 #include <memory>
 #include <ostream>
@@ -48,20 +47,20 @@ ExitStatus showPages(const PagesOptions& options, Tool& tool) {
 
 }  // namespace
 
-void addPagesCommand(CLI::App& program, Tool& tool) {
-  CLI::App* command = program.add_subcommand("pages", "Show the viewer's pages as text");
+void addPagesCommand(Command program, Tool& tool) {
+  Command command = program.subcommand("pages", "Show the viewer's pages as text");
   auto options = std::make_shared<PagesOptions>();
-  command->add_option("KEY", options->key, "The page to show, as LTE Serving Cell Info, in any case; without it, all");
+  command.option("KEY", options->key, "The page to show, as LTE Serving Cell Info, in any case; without it, all");
   command
-      ->add_option("--log", options->logFile,
-                   "Write the console log of every metric to this file, - for standard output; else it is dropped")
-      ->type_name("FILE");
-  command->footer(
+      .option("--log", options->logFile,
+              "Write the console log of every metric to this file, - for standard output; else it is dropped")
+      .typeName("FILE");
+  command.footer(
       "In a terminal the pages are live: arrows move, Return opens, Esc goes back, q ends. Elsewhere each page is\n"
       "printed once, when every metric has come or after 15 s.\n\n"
       "'probectl names pages' lists the keys.\n\n"
       "Examples:\n  probectl pages\n  probectl pages lte serving cell info\n  probectl pages 'UMTS RRC State' | cat");
-  command->callback([options, &tool] { tool.run = [options, &tool] { return showPages(*options, tool); }; });
+  command.whenChosen([options, &tool] { tool.run = [options, &tool] { return showPages(*options, tool); }; });
 }
 
 }  // namespace probeview

@@ -6,6 +6,6 @@
 namespace probeview {
 
 // probectl pages: the viewer's pages as text, live in a terminal.
-void addPagesCommand(CLI::App& program, Tool& tool);
+void addPagesCommand(Command program, Tool& tool);
 
 }  // namespace probeview

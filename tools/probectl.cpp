@@ -4,7 +4,6 @@
 #include <poll.h>
 #include <unistd.h>
 
-#include <CLI/CLI.hpp>
 #include <algorithm>
 #include <climits>
 #include <csignal>
@@ -20,7 +19,6 @@
 #include "radix/socket_path.h"
 #include "tools/batch.h"
 #include "values/near_matches.h"
-#include "values/plain_text.h"
 
 namespace probeview {
 
@@ -62,23 +60,22 @@ class EndableBySignals {
 };
 
 // Where the command line names a subcommand that there is none of, what to say of it; empty otherwise.
-std::string unknownSubcommand(const CLI::App& program, std::span<const std::string> arguments) {
-  const CLI::App* command = &program;
-  std::string path = program.get_name();
+std::string unknownSubcommand(const Command& program, std::span<const std::string> arguments) {
+  Command command = program;
+  std::string path = program.name();
   for (std::size_t index = 0; index < arguments.size(); ++index) {
     const std::string& word = arguments[index];
     if (word.starts_with("-")) {
       if (word == "--socket") ++index;
       continue;
     }
-    const auto subcommands = command->get_subcommands([](const CLI::App*) { return true; });
+    const std::vector<Command> subcommands = command.subcommands();
     if (subcommands.empty()) return {};
-    const auto found =
-        std::ranges::find_if(subcommands, [&](const CLI::App* each) { return each->get_name() == word; });
+    const auto found = std::ranges::find(subcommands, word, &Command::name);
     if (found == subcommands.end()) {
-      std::vector<std::string_view> names;
-      for (const CLI::App* each : subcommands) names.push_back(each->get_name());
-      const std::string near = didYouMean(word, names);
+      std::vector<std::string> names;
+      for (const Command& each : subcommands) names.push_back(each.name());
+      const std::string near = didYouMean(word, std::vector<std::string_view>(names.begin(), names.end()));
       return "probectl: there is no subcommand " + quotedExcerpt(word) + (near.empty() ? ";" : near) + " '" + path +
              " --help' lists all\n";
     }
@@ -103,47 +100,34 @@ void writeLine(Tool& tool, std::string_view line) {
   tool.output.flush();
 }
 
-std::unique_ptr<CLI::App> makeProbectlGrammar(Tool& tool) {
-  auto program =
-      std::make_unique<CLI::App>("Looks into the metrics of the phone's radio, live or by hand.", "probectl");
-  program->set_version_flag("--version", std::string("probectl ") + PROBEVIEW_VERSION, "Show the version and exit");
-  program->set_help_flag("-h,--help", "Show this help and exit; also after a subcommand");
+CommandLine makeProbectlGrammar(Tool& tool) {
+  CommandLine program("probectl", "Looks into the metrics of the phone's radio, live or by hand.");
+  program.describeHelpAndVersion("Show this help and exit; also after a subcommand", "Show the version and exit");
   program
-      ->add_option("--socket", tool.socketPath,
-                   "The service's socket; otherwise $RADIXD_SOCKET, the user's, then the system's")
-      ->check(radix::socketPathTrouble);
-  program->require_subcommand(1);
-  program->get_formatter()->column_width(36);
-  program->footer(
+      .option("--socket", tool.socketPath,
+              "The service's socket; otherwise $RADIXD_SOCKET, the user's, then the system's")
+      .check(radix::socketPathTrouble);
+  program.requireSubcommand();
+  program.helpColumn(36);
+  program.footer(
       "Exit status: 0 done; 1 the answer is no (a payload does not decode, the service refuses or\n"
       "is away, a file cannot be read, the disk is full); 2 the command line is not understood; 3 what\n"
       "was fed stops the program.\n"
       "\n"
       "'probectl SUBCOMMAND --help' shows a subcommand's options with examples.");
-  addSubcommands(*program, tool);
+  addSubcommands(program, tool);
   return program;
 }
 
 int runProbectl(std::span<const std::string> arguments, std::istream& input, std::ostream& output,
                 std::ostream& errors) {
   Tool tool{.input = input, .output = output, .errors = errors, .socketPath = {}, .run = {}};
-  const std::unique_ptr<CLI::App> program = makeProbectlGrammar(tool);
-  try {
-    // The library takes the arguments last first.
-    program->parse(std::vector<std::string>(arguments.rbegin(), arguments.rend()));
-  } catch (const CLI::ParseError& error) {
-    // Help and version arrive here too, as errors with status 0.
-    std::ostringstream said;
-    const int status = program->exit(error, output, said);
-    const std::string unknown = status == 0 ? std::string() : unknownSubcommand(*program, arguments);
-    if (!unknown.empty()) {
-      errors << unknown;
-    } else {
-      // The arguments that it quotes may be names of files, which may hold anything.
-      std::istringstream lines(said.str());
-      for (std::string line; std::getline(lines, line);) errors << onOneLine(line) << '\n';
-    }
-    return finished(tool, status == 0 ? ExitStatus::Success : ExitStatus::UsageError);
+  CommandLine program = makeProbectlGrammar(tool);
+  std::ostringstream said;
+  if (const std::optional<int> status = program.parse(arguments, output, said)) {
+    const std::string unknown = *status == 0 ? std::string() : unknownSubcommand(program, arguments);
+    errors << (unknown.empty() ? said.str() : unknown);
+    return finished(tool, static_cast<ExitStatus>(*status));
   }
   if (const auto trouble = settleTimeZone()) tool.errors << "probectl: " << *trouble << '\n';
   if (tool.socketPath) setenv("RADIXD_SOCKET", tool.socketPath->c_str(), 1);

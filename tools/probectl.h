@@ -2,7 +2,6 @@
 #pragma once
 
 #include <iosfwd>
-#include <memory>
 #include <span>
 #include <string>
 
@@ -16,6 +15,6 @@ int runProbectl(std::span<const std::string> arguments, std::istream& input, std
                 std::ostream& errors);
 
 // The command line's grammar alone, for the help, the shell completion and the check of the manual page.
-std::unique_ptr<CLI::App> makeProbectlGrammar(Tool& tool);
+CommandLine makeProbectlGrammar(Tool& tool);
 
 }  // namespace probeview

@@ -1,7 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/query_command.h"
 
-#include <CLI/CLI.hpp>
 #include <chrono>
 #include <memory>
 #include <optional>
@@ -60,20 +59,20 @@ ExitStatus query(const QueryOptions& options, Tool& tool) {
 
 }  // namespace
 
-void addQueryCommand(CLI::App& program, Tool& tool) {
-  CLI::App* command = program.add_subcommand("query", "Ask the service to report one metric now");
+void addQueryCommand(Command program, Tool& tool) {
+  Command command = program.subcommand("query", "Ask the service to report one metric now");
   auto options = std::make_shared<QueryOptions>();
-  command->add_option("METRIC", options->metric, "A metric, or a metric's identifier (decimal or 0x…)")->required();
-  command->add_flag("--json", options->text.json, "One JSON object instead of text, as watch prints it");
-  command->add_flag("--personal", options->text.personal,
-                    "Show IMSI, TMSI, GUTI, addresses and SIM contents, which are … otherwise");
-  command->footer(
+  command.option("METRIC", options->metric, "A metric, or a metric's identifier (decimal or 0x…)").required();
+  command.flag("--json", options->text.json, "One JSON object instead of text, as watch prints it");
+  command.flag("--personal", options->text.personal,
+               "Show IMSI, TMSI, GUTI, addresses and SIM contents, which are … otherwise");
+  command.footer(
       "Prints the record that answers. Exit status 1 when no source can fill the metric.\n"
       "\n"
       "Examples:\n"
       "  probectl query K_SIM_FILE_INFO\n"
       "  probectl query 0x3C4E04 --json");
-  command->callback([options, &tool] { tool.run = [options, &tool] { return query(*options, tool); }; });
+  command.whenChosen([options, &tool] { tool.run = [options, &tool] { return query(*options, tool); }; });
 }
 
 }  // namespace probeview

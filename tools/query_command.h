@@ -6,6 +6,6 @@
 namespace probeview {
 
 // probectl query: one metric, now.
-void addQueryCommand(CLI::App& program, Tool& tool);
+void addQueryCommand(Command program, Tool& tool);
 
 }  // namespace probeview

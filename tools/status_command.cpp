@@ -1,7 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/status_command.h"
 
-#include <CLI/CLI.hpp>
 #include <memory>
 #include <ostream>
 #include <string>
@@ -80,11 +79,11 @@ void showReport(const Dictionary& reply, std::ostream& output) {
   showLeftOut(report, "clients", output);
 }
 
-void addStatusCommand(CLI::App& program, Tool& tool) {
-  CLI::App* command = program.add_subcommand("status", "Show the service's sources and clients, rates and losses");
+void addStatusCommand(Command program, Tool& tool) {
+  Command command = program.subcommand("status", "Show the service's sources and clients, rates and losses");
   auto json = std::make_shared<bool>(false);
-  command->add_flag("--json", *json, "One JSON object instead of text");
-  command->footer(
+  command.flag("--json", *json, "One JSON object instead of text");
+  command.footer(
       "A source runs, has ended (a trace that was played) or has failed; how old its last record is, is told by a "
       "clock\n"
       "that is never set. Rates are the mean of the last ten seconds. Withheld records did not decode; lost ones a "
@@ -94,7 +93,7 @@ void addStatusCommand(CLI::App& program, Tool& tool) {
       "Examples:\n"
       "  probectl status\n"
       "  probectl --socket /tmp/test/radixd.sock status --json");
-  command->callback([json, &tool] { tool.run = [json, &tool] { return showStatus(*json, tool); }; });
+  command.whenChosen([json, &tool] { tool.run = [json, &tool] { return showStatus(*json, tool); }; });
 }
 
 }  // namespace probeview

@@ -9,7 +9,7 @@
 namespace probeview {
 
 // probectl status: sources, clients, rates, losses.
-void addStatusCommand(CLI::App& program, Tool& tool);
+void addStatusCommand(Command program, Tool& tool);
 
 // The report for a person, whatever the service has answered.
 void showReport(const Dictionary& report, std::ostream& output);

@@ -1,8 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/store_command.h"
 
-#include <CLI/CLI.hpp>
-
 #include "tools/batch.h"
 #include "tools/store_session.h"
 
@@ -28,12 +26,11 @@ ExitStatus runStoreBatch(Tool& tool) {
 
 }  // namespace
 
-void addStoreCommand(CLI::App& program, Tool& tool) {
-  CLI::App* command = program.add_subcommand("store", "Feed a store by hand and look at what it keeps and shows");
-  command->add_flag("--batch")
-      ->description("Read commands from standard input, one a line, and answer each with a line of JSON")
-      ->required();
-  command->footer(
+void addStoreCommand(Command program, Tool& tool) {
+  Command command = program.subcommand("store", "Feed a store by hand and look at what it keeps and shows");
+  command.flag("--batch", "Read commands from standard input, one a line, and answer each with a line of JSON")
+      .required();
+  command.footer(
       "Commands: event ID HEX, trigger, dict NAME, record LTE|UMTS|GSM|Common, state, page KEY, pages, reset.\n"
       "ID is decimal, 0x… or negative; HEX is the payload, - an empty one; either may be none. Blank lines and\n"
       "lines that begin with # are ignored. No service is contacted.\n"
@@ -44,7 +41,7 @@ void addStoreCommand(CLI::App& program, Tool& tool) {
       "Examples:\n"
       "  printf 'event 0x3C4E04 1003\\npage LTE RRC State\\n' | probectl store --batch\n"
       "  echo pages | probectl store --batch");
-  command->callback([&tool] { tool.run = [&tool] { return runStoreBatch(tool); }; });
+  command.whenChosen([&tool] { tool.run = [&tool] { return runStoreBatch(tool); }; });
 }
 
 }  // namespace probeview

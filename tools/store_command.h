@@ -6,6 +6,6 @@
 namespace probeview {
 
 // probectl store --batch: one store fed by hand, without a service; its answers are JSON.
-void addStoreCommand(CLI::App& program, Tool& tool);
+void addStoreCommand(Command program, Tool& tool);
 
 }  // namespace probeview

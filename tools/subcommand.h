@@ -2,13 +2,13 @@
 //
 // How a subcommand of probectl is made. Each lies in a file of its own and offers one function that declares it:
 //
-//   void addStatusCommand(CLI::App& program, Tool& tool) {
-//     CLI::App* command = program.add_subcommand("status", "Show sources, clients, rates and losses");
+//   void addStatusCommand(Command program, Tool& tool) {
+//     Command command = program.subcommand("status", "Show sources, clients, rates and losses");
 //     struct Options { bool json = false; };
 //     auto options = std::make_shared<Options>();
-//     command->add_flag("--json", options->json, "One JSON object instead of text");
-//     command->footer("Examples:\n  probectl status");
-//     command->callback([options, &tool] { tool.run = [options, &tool] { return showStatus(*options, tool); }; });
+//     command.flag("--json", options->json, "One JSON object instead of text");
+//     command.footer("Examples:\n  probectl status");
+//     command.whenChosen([options, &tool] { tool.run = [options, &tool] { return showStatus(*options, tool); }; });
 //   }
 //
 // and one line in subcommands.cpp. The callback only chooses what to run; it runs after the whole command line has been
@@ -21,19 +21,16 @@
 #include <string>
 #include <string_view>
 
-// Only the files that describe a command line include its library, which takes the compiler seconds each time.
-namespace CLI {
-class App;
-}
+#include "platform/command_line.h"
 
 namespace probeview {
 
 // The exit statuses of probectl; the manual page lists them.
 enum class ExitStatus : int {
   Success = 0,
-  Failure = 1,         // the answer is no: a payload does not decode, the service refuses, the disk is full …
-  UsageError = 2,      // the command line is not understood
-  BrokenContract = 3,  // what was fed stops the program (store --batch)
+  Failure = 1,  // the answer is no: a payload does not decode, the service refuses, the disk is full …
+  UsageError = usageErrorStatus,  // the command line is not understood
+  BrokenContract = 3,             // what was fed stops the program (store --batch)
 };
 
 // What a subcommand is given to live on. Streams are handed in, so that tests can put their own in their place.
@@ -55,9 +52,9 @@ bool readerIsGone(const Tool& tool);
 // for, SIGINT and SIGTERM end the program, as the loop that would hear them stands still.
 void writeLine(Tool& tool, std::string_view line);
 
-using AddSubcommand = void (*)(CLI::App& program, Tool& tool);
+using AddSubcommand = void (*)(Command program, Tool& tool);
 
 // Declares every subcommand, in the order of --help.
-void addSubcommands(CLI::App& program, Tool& tool);
+void addSubcommands(Command program, Tool& tool);
 
 }  // namespace probeview

@@ -23,7 +23,7 @@ constexpr AddSubcommand subcommands[] = {
 
 }  // namespace
 
-void addSubcommands(CLI::App& program, Tool& tool) {
+void addSubcommands(Command program, Tool& tool) {
   for (const AddSubcommand add : subcommands) add(program, tool);
 }
 

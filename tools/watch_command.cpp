@@ -3,7 +3,6 @@
 
 #include <signal.h>
 
-#include <CLI/CLI.hpp>
 #include <chrono>
 #include <cstdint>
 #include <memory>
@@ -110,24 +109,24 @@ ExitStatus watch(const WatchOptions& options, Tool& tool) {
 
 }  // namespace
 
-void addWatchCommand(CLI::App& program, Tool& tool) {
-  CLI::App* command = program.add_subcommand("watch", "Print each metric as it arrives from the service");
+void addWatchCommand(Command program, Tool& tool) {
+  Command command = program.subcommand("watch", "Print each metric as it arrives from the service");
   auto options = std::make_shared<WatchOptions>();
-  command->add_option("METRIC", options->metrics,
-                      "Those metrics alone, by name or identifier (decimal or 0x…); without it, all");
-  command->add_flag("--json", options->text.json, "One JSON object a line instead of text");
-  command->add_flag("--changes", options->changes,
-                    "Of each metric the first record, then only what changes, timestamps apart");
-  command->add_flag("--personal", options->text.personal,
-                    "Show IMSI, TMSI, GUTI, addresses and SIM contents, which are … otherwise");
-  command->add_option("--count", options->count, "End after so many records")
-      ->type_name("N")
-      ->check([](const std::string& text) {
+  command.option("METRIC", options->metrics,
+                 "Those metrics alone, by name or identifier (decimal or 0x…); without it, all");
+  command.flag("--json", options->text.json, "One JSON object a line instead of text");
+  command.flag("--changes", options->changes,
+               "Of each metric the first record, then only what changes, timestamps apart");
+  command.flag("--personal", options->text.personal,
+               "Show IMSI, TMSI, GUTI, addresses and SIM contents, which are … otherwise");
+  command.option("--count", options->count, "End after so many records")
+      .typeName("N")
+      .check([](const std::string& text) {
         const auto count = parseNumber<std::uint64_t>(text, 10);
         if (count && *count > 0) return std::string();
         return quotedExcerpt(text) + " is no number of records: a whole number, at least 1";
       });
-  command->footer(
+  command.footer(
       "Begins with the last record of each metric; then every metric comes, at its source's own period or shorter\n"
       "where a configuration asks. Waits for the service while there is none. Ends on Ctrl-C.\n"
       "\n"
@@ -139,7 +138,7 @@ void addWatchCommand(CLI::App& program, Tool& tool) {
       "  probectl watch\n"
       "  probectl watch --changes K_LTE_RRC_STATE K_UMTS_RRC_STATE\n"
       "  probectl watch --json | jq 'select(.metric == \"K_LTE_RRC_STATE\") | .dict.state'");
-  command->callback([options, &tool] { tool.run = [options, &tool] { return watch(*options, tool); }; });
+  command.whenChosen([options, &tool] { tool.run = [options, &tool] { return watch(*options, tool); }; });
 }
 
 }  // namespace probeview

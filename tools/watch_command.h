@@ -6,6 +6,6 @@
 namespace probeview {
 
 // probectl watch: every metric as it arrives.
-void addWatchCommand(CLI::App& program, Tool& tool);
+void addWatchCommand(Command program, Tool& tool);
 
 }  // namespace probeview

@@ -1,11 +1,12 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "app/pictures/pictures_program.h"
 
-#include <CLI/CLI.hpp>
 #include <cstdlib>
+#include <optional>
 #include <ostream>
 
 #include "app/application.h"
+#include "platform/command_line.h"
 #include "platform/console_log.h"
 #include "platform/file_descriptor.h"
 #include "platform/system_log.h"
@@ -24,38 +25,30 @@ constexpr std::size_t descriptorsNeeded = 64;
 }  // namespace
 
 int runPicturesProgram(int argc, char** argv, std::ostream& output, std::ostream& errors) {
-  CLI::App program(
+  CommandLine program(
+      "probeview-pictures",
       "Draws pages of the viewer into one PNG file, without a display: the launch list, a category list and category\n"
-      "pages, in a light and a dark look. Waits until every metric has come once, at most 15 s.",
-      "probeview-pictures");
-  program.set_version_flag("--version", "probeview-pictures " PROBEVIEW_VERSION);
+      "pages, in a light and a dark look. Waits until every metric has come once, at most 15 s.");
   qt::PicturesOptions options;
   options.pageKeys = {"LTE RRC State", "LTE Serving Cell Info", "LTE EUTRA Neighbor Info"};
-  program.add_option("OUTPUT", options.outputPath, "The PNG file")->required();
-  std::string socketPath;
-  auto* socket = program
-                     .add_option("--socket", socketPath,
-                                 "The service's socket; otherwise $RADIXD_SOCKET, the user's, then the system's")
-                     ->type_name("PATH")
-                     ->check(radix::socketPathTrouble);
+  program.option("OUTPUT", options.outputPath, "The PNG file").required();
+  std::optional<std::string> socketPath;
   program
-      .add_option("--page", options.pageKeys,
-                  "A category page, such as \"LTE Serving Cell Info\"; may be given several times (default: three "
-                  "pages of LTE)")
-      ->type_name("KEY")
-      ->allow_extra_args(false);
+      .option("--socket", socketPath, "The service's socket; otherwise $RADIXD_SOCKET, the user's, then the system's")
+      .typeName("PATH")
+      .check(radix::socketPathTrouble);
+  program
+      .option("--page", options.pageKeys,
+              "A category page, such as \"LTE Serving Cell Info\"; may be given several times (default: three "
+              "pages of LTE)")
+      .typeName("KEY")
+      .oneEachTime();
   std::string look = "both";
-  program.add_option("--look", look, "light, dark or both")
-      ->check(CLI::IsMember({"light", "dark", "both"}))
-      ->capture_default_str();
-  try {
-    program.parse(argc, argv);
-  } catch (const CLI::ParseError& error) {
-    return program.exit(error, output, errors) == 0 ? 0 : 2;
-  }
+  program.option("--look", look, "light, dark or both").oneOf({"light", "dark", "both"}).showDefault();
+  if (const std::optional<int> status = program.parse(argumentsOf(argc, argv), output, errors)) return *status;
   options.light = look != "dark";
   options.dark = look != "light";
-  if (*socket) setenv("RADIXD_SOCKET", socketPath.c_str(), 1);
+  if (socketPath) setenv("RADIXD_SOCKET", socketPath->c_str(), 1);
   if (const auto trouble = settleTimeZone()) errors << *trouble << "\n";
   if (!mayOpenDescriptors(descriptorsNeeded)) {
     errors << "the pictures need " << descriptorsNeeded

@@ -3,11 +3,9 @@
 // The manual pages and the completion know every subcommand and option that the programs have.
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
-#include <CLI/CLI.hpp>
 
 #include <algorithm>
 #include <filesystem>
-#include <memory>
 #include <regex>
 #include <set>
 #include <vector>
@@ -53,24 +51,21 @@ std::string sectionsOf(const std::string& page, const std::string& subcommand) {
   return text;
 }
 
-void requireDocumented(const CLI::App& command, const std::string& path, const std::string& page,
+void requireDocumented(const Command& command, const std::string& path, const std::string& page,
                        const std::string& completion) {
-  for (const CLI::App* subcommand : command.get_subcommands([](const CLI::App*) { return true; })) {
-    const std::string name = path.empty() ? subcommand->get_name() : path + " " + subcommand->get_name();
-    const bool hasSubcommands = !subcommand->get_subcommands([](const CLI::App*) { return true; }).empty();
+  for (const Command& subcommand : command.subcommands()) {
+    const std::string name = path.empty() ? subcommand.name() : path + " " + subcommand.name();
     const std::string section = sectionsOf(page, name);
-    if (!hasSubcommands) {
+    if (subcommand.subcommands().empty()) {
       EXPECT_NE(section, "") << name << " is missing in the manual";
     }
-    EXPECT_THAT(completion, HasSubstr(subcommand->get_name()));
-    for (const CLI::Option* option : subcommand->get_options()) {
-      for (const std::string& longName : option->get_lnames()) {
-        if (longName == "help") continue;
-        EXPECT_THAT(section, HasSubstr("--" + longName)) << name;
-        EXPECT_THAT(completion, HasSubstr("--" + longName)) << name;
-      }
+    EXPECT_THAT(completion, HasSubstr(subcommand.name()));
+    for (const std::string& option : subcommand.longOptions()) {
+      if (option == "help") continue;
+      EXPECT_THAT(section, HasSubstr("--" + option)) << name;
+      EXPECT_THAT(completion, HasSubstr("--" + option)) << name;
     }
-    requireDocumented(*subcommand, name, page, completion);
+    requireDocumented(subcommand, name, page, completion);
   }
 }
 
@@ -78,10 +73,10 @@ TEST(Manual, ProbectlsPageAndCompletionKnowEverySubcommandAndOption) {
   std::istringstream input;
   std::ostringstream output;
   Tool tool{.input = input, .output = output, .errors = output, .socketPath = {}, .run = {}};
-  const std::unique_ptr<CLI::App> grammar = makeProbectlGrammar(tool);
+  const CommandLine grammar = makeProbectlGrammar(tool);
   const std::string page = manual("probectl.1");
   const std::string completion = contentOf("packaging/completion/probectl");
-  requireDocumented(*grammar, "", page, completion);
+  requireDocumented(grammar, "", page, completion);
   for (const std::string& option : optionsOf(probectl({"--help"}).output)) {
     EXPECT_THAT(page, HasSubstr(option));
     EXPECT_THAT(completion, HasSubstr(option));
