@@ -8,11 +8,11 @@ namespace {
 
 using Bytes = std::vector<std::uint8_t>;
 
-constexpr unsigned kFirstAccessPoint = 4;  // identities below 5 are reserved (3GPP TS 24.007, 11.2.3.1.5)
-const char* const kInternet = "internet.example";
-const char* const kIms = "ims";
-const char* const kMessages = "mms.example";
-const char* const kPositioning = "supl.example";
+constexpr unsigned firstAccessPoint = 4;  // identities below 5 are reserved (3GPP TS 24.007, 11.2.3.1.5)
+const char* const internetName = "internet.example";
+const char* const imsName = "ims";
+const char* const messagesName = "mms.example";
+const char* const positioningName = "supl.example";
 
 Bytes ipv4(std::uint8_t block, std::uint8_t host) {
   // 192.0.2.0/24 or 198.51.100.0/24
@@ -31,25 +31,25 @@ Bytes ipv6(std::uint16_t network, std::uint64_t host) {
 Bearer Bearers::make(unsigned connection, const std::string& name, AddressType type) {
   Bearer bearer;
   bearer.connection = connection;
-  bearer.accessPoint = kFirstAccessPoint + connection;
+  bearer.accessPoint = firstAccessPoint + connection;
   bearer.name = name;
   bearer.type = type;
   const auto host = static_cast<std::uint8_t>(random_.integerBetween(2, 200));
   const auto network = static_cast<std::uint16_t>(random_.integerBetween(0x100, 0xFFF));
-  if (type != AddressType::kIpv6) bearer.address = ipv4(192, host);
-  if (type != AddressType::kIpv4) {
+  if (type != AddressType::Ipv6) bearer.address = ipv4(192, host);
+  if (type != AddressType::Ipv4) {
     const Bytes six = ipv6(network, random_.next() & 0xFDFFFFFFFFFFFFFFU);
     bearer.address.insert(bearer.address.end(), six.begin(), six.end());
   }
-  if (type == AddressType::kIpv6) {
-    bearer.primaryDnsType = bearer.secondaryDnsType = AddressType::kIpv6;
+  if (type == AddressType::Ipv6) {
+    bearer.primaryDnsType = bearer.secondaryDnsType = AddressType::Ipv6;
     bearer.primaryDns = ipv6(0, 0x35);
     bearer.secondaryDns = ipv6(1, 0x35);
   } else {
     bearer.primaryDns = ipv4(198, 53);
     bearer.secondaryDns = ipv4(198, 54);
-    if (type == AddressType::kIpv4AndIpv6) {
-      bearer.secondaryDnsType = AddressType::kIpv6;
+    if (type == AddressType::Ipv4AndIpv6) {
+      bearer.secondaryDnsType = AddressType::Ipv6;
       bearer.secondaryDns = ipv6(0, 0x35);
     }
   }
@@ -73,34 +73,34 @@ void Bearers::advance(Milliseconds now, unsigned attaches, bool packetService, b
     active_.clear();
     changed = true;
   }
-  if (packetService && attaches_ > 0 && !has(kInternet)) {
-    active_.insert(active_.begin(), make(1, kInternet, AddressType::kIpv4AndIpv6));
+  if (packetService && attaches_ > 0 && !has(internetName)) {
+    active_.insert(active_.begin(), make(1, internetName, AddressType::Ipv4AndIpv6));
     changed = true;
   }
   const bool wantsIms = packetService && voiceOverIms;
-  if (wantsIms != has(kIms)) {
+  if (wantsIms != has(imsName)) {
     if (wantsIms) {
-      active_.push_back(make(2, kIms, AddressType::kIpv6));
+      active_.push_back(make(2, imsName, AddressType::Ipv6));
     } else {
-      drop(kIms);
+      drop(imsName);
     }
     changed = true;
   }
   if (packetService && attaches_ > 0 && now >= extraAt_) {
-    const char* name = extraIsMessages_ ? kMessages : kPositioning;
+    const char* name = extraIsMessages_ ? messagesName : positioningName;
     if (extraOn_) {
       drop(name);
       extraOn_ = false;
-      extraAt_ = now + kStep * random_.integerBetween(1000, 4000);
+      extraAt_ = now + stepTime * random_.integerBetween(1000, 4000);
     } else {
       extraIsMessages_ = random_.chance(0.5);
-      active_.push_back(make(3, extraIsMessages_ ? kMessages : kPositioning, AddressType::kIpv4));
+      active_.push_back(make(3, extraIsMessages_ ? messagesName : positioningName, AddressType::Ipv4));
       extraOn_ = true;
-      extraAt_ = now + kStep * random_.integerBetween(200, 800);
+      extraAt_ = now + stepTime * random_.integerBetween(200, 800);
     }
     changed = true;
   }
-  if (changed) facts.learn(Fact::kBearers, now);
+  if (changed) facts.learn(Fact::Bearers, now);
 }
 
 }  // namespace probeview::scenario

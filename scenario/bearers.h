@@ -11,18 +11,18 @@
 namespace probeview::scenario {
 
 // The numbers are those of the metric service; the types of packet data connections of EPS.
-enum class AddressType : std::int32_t { kIpv4 = 0, kIpv6 = 1, kIpv4AndIpv6 = 2 };
+enum class AddressType : std::int32_t { Ipv4 = 0, Ipv6 = 1, Ipv4AndIpv6 = 2 };
 
 // One packet data connection. Addresses are of the blocks set aside for documentation (RFC 5737, RFC 3849).
 struct Bearer {
   unsigned connection = 0;   // the number by which the phone's applications know it
   unsigned accessPoint = 0;  // NSAPI, or EPS bearer identity: 5 to 15
   std::string name;          // of the access point
-  AddressType type = AddressType::kIpv4;
+  AddressType type = AddressType::Ipv4;
   std::vector<std::uint8_t> address;  // 4, 16 or 20 bytes
-  AddressType primaryDnsType = AddressType::kIpv4;
+  AddressType primaryDnsType = AddressType::Ipv4;
   std::vector<std::uint8_t> primaryDns;
-  AddressType secondaryDnsType = AddressType::kIpv4;
+  AddressType secondaryDnsType = AddressType::Ipv4;
   std::vector<std::uint8_t> secondaryDns;
   bool keepsAddress = false;  // when the technology changes
 };

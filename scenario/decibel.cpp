@@ -16,18 +16,18 @@ double logarithmOfTwo(double number) {
   const double square = t * t;
   const double natural =
       2.0 * t * (1.0 + square * (1.0 / 3 + square * (1.0 / 5 + square * (1.0 / 7 + square * (1.0 / 9)))));
-  constexpr double kTwoOfNatural = 1.4426950408889634;
-  return static_cast<double>(exponent) + natural * kTwoOfNatural;
+  constexpr double twoOfNatural = 1.4426950408889634;
+  return static_cast<double>(exponent) + natural * twoOfNatural;
 }
 
 double toDecibels(double ratio) {
-  constexpr double kDecibelsPerOctave = 3.0102999566398120;
-  return logarithmOfTwo(ratio) * kDecibelsPerOctave;
+  constexpr double decibelsPerOctave = 3.0102999566398120;
+  return logarithmOfTwo(ratio) * decibelsPerOctave;
 }
 
 double fromDecibels(double decibels) {
-  constexpr double kOctavesPerDecibel = 0.3321928094887362;
-  const double octaves = decibels * kOctavesPerDecibel;
+  constexpr double octavesPerDecibel = 0.3321928094887362;
+  const double octaves = decibels * octavesPerDecibel;
   const double whole = std::floor(octaves + 0.5);  // exact, as floor always is
   const double x = (octaves - whole) * 0.6931471805599453;
   const double fraction =
@@ -42,8 +42,8 @@ double arcCosineDegrees(double cosine) {
   const double bounded = x > 1.0 ? 1.0 : x;
   const double radians =
       std::sqrt(1.0 - bounded) * (1.5707288 + bounded * (-0.2121144 + bounded * (0.0742610 + bounded * -0.0187293)));
-  constexpr double kDegrees = 57.29577951308232;
-  const double degrees = radians * kDegrees;
+  constexpr double degreesPerRadian = 57.29577951308232;
+  const double degrees = radians * degreesPerRadian;
   return cosine < 0 ? 180.0 - degrees : degrees;
 }
 

@@ -14,61 +14,61 @@ namespace probeview::scenario {
 namespace {
 
 // The variants before those that walk through the enumerations.
-enum class Shape : std::uint8_t { kEverything, kNoLists, kLongLists, kSmallest, kLargest, kTimestampOnly, kWalk };
-constexpr std::size_t kShapes = static_cast<std::size_t>(Shape::kWalk);
+enum class Shape : std::uint8_t { Everything, NoLists, LongLists, Smallest, Largest, TimestampOnly, Walk };
+constexpr std::size_t shapeCount = static_cast<std::size_t>(Shape::Walk);
 
-constexpr std::size_t kLongList = 32;
+constexpr std::size_t longListLength = 32;
 // A reader takes up to 140 away from what it shows in dBm, and the smallest number would not survive that.
-constexpr std::int32_t kSmallestSigned = std::numeric_limits<std::int32_t>::min() + 140;
-constexpr std::int32_t kLargestSigned = std::numeric_limits<std::int32_t>::max();
-constexpr std::uint32_t kLargestUnsigned = std::numeric_limits<std::uint32_t>::max();
+constexpr std::int32_t smallestSigned = std::numeric_limits<std::int32_t>::min() + 140;
+constexpr std::int32_t largestSigned = std::numeric_limits<std::int32_t>::max();
+constexpr std::uint32_t largestUnsigned = std::numeric_limits<std::uint32_t>::max();
 
 struct Variant {
-  Shape shape = Shape::kEverything;
+  Shape shape = Shape::Everything;
   std::uint32_t step = 0;  // of the walk; otherwise a small number that makes elements differ
 
   std::size_t listLength() const {
     switch (shape) {
-      case Shape::kNoLists:
-      case Shape::kTimestampOnly:
+      case Shape::NoLists:
+      case Shape::TimestampOnly:
         return 0;
-      case Shape::kLongLists:
-        return kLongList;
-      case Shape::kSmallest:
+      case Shape::LongLists:
+        return longListLength;
+      case Shape::Smallest:
         return 1;
-      case Shape::kEverything:
-      case Shape::kLargest:
-      case Shape::kWalk:
+      case Shape::Everything:
+      case Shape::Largest:
+      case Shape::Walk:
         return 2;
     }
     return 0;
   }
   std::uint32_t unsignedNumber() const {
     switch (shape) {
-      case Shape::kSmallest:
+      case Shape::Smallest:
         return 0;
-      case Shape::kLargest:
-        return kLargestUnsigned;
-      case Shape::kEverything:
-      case Shape::kNoLists:
-      case Shape::kLongLists:
-      case Shape::kTimestampOnly:
-      case Shape::kWalk:
+      case Shape::Largest:
+        return largestUnsigned;
+      case Shape::Everything:
+      case Shape::NoLists:
+      case Shape::LongLists:
+      case Shape::TimestampOnly:
+      case Shape::Walk:
         return step;
     }
     return 0;
   }
   std::int32_t signedNumber() const {
     switch (shape) {
-      case Shape::kSmallest:
-        return kSmallestSigned;
-      case Shape::kLargest:
-        return kLargestSigned;
-      case Shape::kEverything:
-      case Shape::kNoLists:
-      case Shape::kLongLists:
-      case Shape::kTimestampOnly:
-      case Shape::kWalk:
+      case Shape::Smallest:
+        return smallestSigned;
+      case Shape::Largest:
+        return largestSigned;
+      case Shape::Everything:
+      case Shape::NoLists:
+      case Shape::LongLists:
+      case Shape::TimestampOnly:
+      case Shape::Walk:
         return step % 2 == 0 ? static_cast<std::int32_t>(step) : -static_cast<std::int32_t>(step);
     }
     return 0;
@@ -77,16 +77,16 @@ struct Variant {
   std::int32_t enumerationNumber(const EnumerationTable& table) const {
     const auto entries = table.entries();
     switch (shape) {
-      case Shape::kSmallest:
+      case Shape::Smallest:
         return entries.front().value;
-      case Shape::kLargest:
-        return kLargestSigned;
-      case Shape::kEverything:
-      case Shape::kNoLists:
-      case Shape::kLongLists:
-      case Shape::kTimestampOnly:
+      case Shape::Largest:
+        return largestSigned;
+      case Shape::Everything:
+      case Shape::NoLists:
+      case Shape::LongLists:
+      case Shape::TimestampOnly:
         return entries[step % entries.size()].value;
-      case Shape::kWalk:
+      case Shape::Walk:
         return step % (entries.size() + 1) == entries.size() ? entries.back().value + 1
                                                              : entries[step % (entries.size() + 1)].value;
     }
@@ -94,30 +94,30 @@ struct Variant {
   }
   std::vector<std::uint8_t> bytes() const {
     switch (shape) {
-      case Shape::kSmallest:
+      case Shape::Smallest:
         return {};
-      case Shape::kLargest:
+      case Shape::Largest:
         return std::vector<std::uint8_t>(255, 0xFF);
-      case Shape::kEverything:
-      case Shape::kNoLists:
-      case Shape::kLongLists:
-      case Shape::kTimestampOnly:
-      case Shape::kWalk:
+      case Shape::Everything:
+      case Shape::NoLists:
+      case Shape::LongLists:
+      case Shape::TimestampOnly:
+      case Shape::Walk:
         return {0x00, 0xF1, static_cast<std::uint8_t>(0x10 + step)};
     }
     return {};
   }
   std::string_view text() const {
     switch (shape) {
-      case Shape::kSmallest:
+      case Shape::Smallest:
         return "";
-      case Shape::kLargest:
+      case Shape::Largest:
         return "a \"quoted\" name,\na second line\tand an umlaut: \xC3\xBC";
-      case Shape::kEverything:
-      case Shape::kNoLists:
-      case Shape::kLongLists:
-      case Shape::kTimestampOnly:
-      case Shape::kWalk:
+      case Shape::Everything:
+      case Shape::NoLists:
+      case Shape::LongLists:
+      case Shape::TimestampOnly:
+      case Shape::Walk:
         return "internet.example";
     }
     return "";
@@ -207,22 +207,22 @@ const MessageDescriptor& messageOf(Fact fact) { return *metricWithId(reportOf(fa
 
 }  // namespace
 
-std::size_t EdgesStory::variants(const MessageDescriptor& message) { return kShapes + mostNames(message) + 1; }
+std::size_t EdgesStory::variants(const MessageDescriptor& message) { return shapeCount + mostNames(message) + 1; }
 
 std::vector<std::uint8_t> EdgesStory::variant(const MessageDescriptor& message, std::size_t number,
                                               std::uint64_t timestamp) {
   const std::size_t which = number % variants(message);
-  Variant variant{Shape::kWalk, 0};
-  if (which < kShapes) {
+  Variant variant{Shape::Walk, 0};
+  if (which < shapeCount) {
     variant = {static_cast<Shape>(which), 3};
   } else {
-    variant.step = static_cast<std::uint32_t>(which - kShapes);
+    variant.step = static_cast<std::uint32_t>(which - shapeCount);
   }
   PBDataWriter writer;
   for (const FieldDescriptor& field : message.fields()) {
     if (field.name == "timestamp") {
       PBDataWriterWriteUint64Field(writer, timestamp, field.number);
-    } else if (variant.shape != Shape::kTimestampOnly) {
+    } else if (variant.shape != Shape::TimestampOnly) {
       writeField(writer, field, variant);
     }
   }
@@ -230,8 +230,8 @@ std::vector<std::uint8_t> EdgesStory::variant(const MessageDescriptor& message, 
 }
 
 void EdgesStory::advance() {
-  now_ += kStep;
-  if (now_ % kNewsTime != 0) return;
+  now_ += stepTime;
+  if (now_ % newsTime != 0) return;
   for (const Report& report : reports()) facts_.learn(report.fact, now_);
 }
 

@@ -23,16 +23,16 @@ class EdgesStory final : public Story {
   std::vector<std::uint8_t> tell(Fact fact, std::uint64_t timestamp) override;
 
   // How often there is something new to tell.
-  static constexpr Milliseconds kNewsTime = 400;
+  static constexpr Milliseconds newsTime = 400;
   // How many variants a message has before they begin anew.
   static std::size_t variants(const MessageDescriptor& message);
   static std::vector<std::uint8_t> variant(const MessageDescriptor& message, std::size_t number,
                                            std::uint64_t timestamp);
 
  private:
-  Milliseconds now_ = -kStep;
+  Milliseconds now_ = -stepTime;
   Facts facts_;
-  std::array<std::size_t, kFacts> told_{};
+  std::array<std::size_t, factCount> told_{};
 };
 
 }  // namespace probeview::scenario

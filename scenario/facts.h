@@ -11,44 +11,44 @@ namespace probeview::scenario {
 using Milliseconds = std::int64_t;
 
 // The model goes forward in steps of this length; everything in it happens at a multiple.
-constexpr Milliseconds kStep = 40;
+constexpr Milliseconds stepTime = 40;
 // How often the technology in service is measured: the layer 1 period of 3GPP TS 36.133, 8.1.2.2.1.
-constexpr Milliseconds kMeasurementPeriod = 200;
+constexpr Milliseconds measurementPeriod = 200;
 
 // The things about the phone that can be reported, one for each metric. What is learnt at one moment is reported in
 // this order: which cell serves before what has been measured of it.
 enum class Fact : std::uint8_t {
-  kLteConnection,
-  kLteServingCell,
-  kLteSelection,
-  kLteComponentCarriers,
-  kLteAggregation,
-  kLteDrx,
-  kUmtsConnection,
-  kUmtsServingCell,
-  kUmtsSelection,
-  kUmtsConfiguration,
-  kGsmServingCell,
-  kGsmIdleConfiguration,
-  kGsmPacketConfiguration,
-  kLteSamples,
-  kLteTransmitPower,
-  kLteNeighbours,
-  kLteInterRatNeighbours,
-  kUmtsServingMeasurement,
-  kUmtsTransmitPower,
-  kUmtsNeighbours,
-  kGsmIdleMeasurement,
-  kGsmDedicatedMeasurement,
-  kGsmNeighbours,
-  kEpsContext,
-  kGprsContext,
-  kMobilityContext,
-  kMobilityCommon,
-  kBearers,
-  kSimFiles,
+  LteConnection,
+  LteServingCell,
+  LteSelection,
+  LteComponentCarriers,
+  LteAggregation,
+  LteDrx,
+  UmtsConnection,
+  UmtsServingCell,
+  UmtsSelection,
+  UmtsConfiguration,
+  GsmServingCell,
+  GsmIdleConfiguration,
+  GsmPacketConfiguration,
+  LteSamples,
+  LteTransmitPower,
+  LteNeighbours,
+  LteInterRatNeighbours,
+  UmtsServingMeasurement,
+  UmtsTransmitPower,
+  UmtsNeighbours,
+  GsmIdleMeasurement,
+  GsmDedicatedMeasurement,
+  GsmNeighbours,
+  EpsContext,
+  GprsContext,
+  MobilityContext,
+  MobilityCommon,
+  Bearers,
+  SimFiles,
 };
-constexpr std::size_t kFacts = 29;
+constexpr std::size_t factCount = 29;
 
 // When each fact was last learnt. A report is due when the revision has moved on.
 class Facts {
@@ -91,7 +91,7 @@ class Facts {
   const Entry& operator[](Fact fact) const { return entries_[static_cast<std::size_t>(fact)]; }
 
  private:
-  std::array<Entry, kFacts> entries_{};
+  std::array<Entry, factCount> entries_{};
 };
 
 }  // namespace probeview::scenario

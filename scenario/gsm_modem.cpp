@@ -8,22 +8,22 @@ namespace {
 
 // RXQUAL by carrier to interference ratio: each step doubles the bit error rate (3GPP TS 45.008, 8.2.4).
 unsigned qualityFor(double ratio) {
-  constexpr double kBestRatio = 16, kDecibelsPerStep = 2;
-  return static_cast<unsigned>(std::clamp((kBestRatio - ratio) / kDecibelsPerStep, 0.0, 7.0));
+  constexpr double bestRatio = 16, decibelsPerStep = 2;
+  return static_cast<unsigned>(std::clamp((bestRatio - ratio) / decibelsPerStep, 0.0, 7.0));
 }
 
 }  // namespace
 
 void GsmModem::change(GsmConnection to, const Circumstances& c) {
   state_.connection = to;
-  c.facts.learn(Fact::kGsmServingCell, c.now);
-  if (to == GsmConnection::kDedicated) {
+  c.facts.learn(Fact::GsmServingCell, c.now);
+  if (to == GsmConnection::Dedicated) {
     state_.transmitPowers.clear();
     powerStep_ = 0;
     measure(c);
-    c.facts.end(Fact::kGsmIdleMeasurement);
+    c.facts.end(Fact::GsmIdleMeasurement);
   } else {
-    c.facts.end(Fact::kGsmDedicatedMeasurement);
+    c.facts.end(Fact::GsmDedicatedMeasurement);
   }
 }
 
@@ -33,23 +33,23 @@ void GsmModem::serve(CellIndex cell, const Circumstances& c) {
   cellFailingSince_ = -1;
   reselection_.clear();
   handover_.clear();
-  c.facts.learn(Fact::kGsmServingCell, c.now);
-  c.facts.learn(Fact::kGsmIdleConfiguration, c.now);
-  c.facts.learn(Fact::kGsmPacketConfiguration, c.now);
+  c.facts.learn(Fact::GsmServingCell, c.now);
+  c.facts.learn(Fact::GsmIdleConfiguration, c.now);
+  c.facts.learn(Fact::GsmPacketConfiguration, c.now);
   measure(c);
 }
 
 void GsmModem::enter(CellIndex cell, Manner manner, const Circumstances& c) {
-  state_.connection = manner == Manner::kHandover ? GsmConnection::kDedicated : GsmConnection::kIdle;
+  state_.connection = manner == Manner::Handover ? GsmConnection::Dedicated : GsmConnection::Idle;
   state_.transmitPowers.clear();
   powerStep_ = 0;
   serve(cell, c);
 }
 
 void GsmModem::leave(const Circumstances& c) {
-  change(GsmConnection::kInactive, c);
-  for (const Fact fact : {Fact::kGsmServingCell, Fact::kGsmIdleConfiguration, Fact::kGsmIdleMeasurement,
-                          Fact::kGsmDedicatedMeasurement, Fact::kGsmNeighbours, Fact::kGsmPacketConfiguration}) {
+  change(GsmConnection::Inactive, c);
+  for (const Fact fact : {Fact::GsmServingCell, Fact::GsmIdleConfiguration, Fact::GsmIdleMeasurement,
+                          Fact::GsmDedicatedMeasurement, Fact::GsmNeighbours, Fact::GsmPacketConfiguration}) {
     c.facts.leave(fact);
   }
 }
@@ -58,37 +58,37 @@ void GsmModem::measure(const Circumstances& c) {
   const CellIndex serving = *state_.serving;
   state_.rxLev = c.surroundings.strength(serving);
   listAllHeard(c, serving, state_.neighbours);
-  c.facts.learn(Fact::kGsmNeighbours, c.now);
-  if (state_.connection != GsmConnection::kDedicated) {
-    c.facts.learn(Fact::kGsmIdleMeasurement, c.now);
+  c.facts.learn(Fact::GsmNeighbours, c.now);
+  if (state_.connection != GsmConnection::Dedicated) {
+    c.facts.learn(Fact::GsmIdleMeasurement, c.now);
     return;
   }
   state_.rxQual = qualityFor(c.surroundings.interferenceRatio(serving));
   state_.dedicatedCell = serving;
   state_.dedicatedRxLev = state_.rxLev;
   // The network steps the power towards a target level at its own receiver, 2 dB at a time (45.008, 4.7.1).
-  const double wanted = std::clamp(-52.0 - state_.rxLev, 5.0, double{GsmSelection::kMaximumPower});
-  const int wantedStep = (GsmSelection::kMaximumPower - static_cast<int>(wanted)) / 2;
+  const double wanted = std::clamp(-52.0 - state_.rxLev, 5.0, double{GsmSelection::maximumPower});
+  const int wantedStep = (GsmSelection::maximumPower - static_cast<int>(wanted)) / 2;
   powerStep_ += wantedStep > powerStep_ ? 1 : wantedStep < powerStep_ ? -1 : 0;
   if (state_.transmitPowers.size() == 4) state_.transmitPowers.erase(state_.transmitPowers.begin());
-  state_.transmitPowers.push_back(GsmSelection::kMaximumPower - 2 * powerStep_);
+  state_.transmitPowers.push_back(GsmSelection::maximumPower - 2 * powerStep_);
   state_.antenna = c.random.chance(0.1) ? 1U - state_.antenna : state_.antenna;
-  c.facts.learn(Fact::kGsmDedicatedMeasurement, c.now);
+  c.facts.learn(Fact::GsmDedicatedMeasurement, c.now);
 }
 
 std::optional<CellIndex> GsmModem::reselectionCandidate(const Circumstances& c) const {
   const CellIndex serving = *state_.serving;
   const bool unsuitable = c.forbidden.knownForbidden(serving);
   if (!c.firstSearch) {
-    if (const auto cell = strongestAllowed(c, Technology::kLte, GsmSelection::kLteHigh)) return cell;
+    if (const auto cell = strongestAllowed(c, Technology::Lte, GsmSelection::lteHigh)) return cell;
   }
-  if (const auto cell = strongestAllowed(c, Technology::kUmts, GsmSelection::kUmtsHigh)) return cell;
-  if (const auto cell = strongestAllowed(c, Technology::kLte, GsmSelection::kLteHigh)) return cell;
-  for (const CellIndex cell : c.surroundings.heard(Technology::kGsm)) {
+  if (const auto cell = strongestAllowed(c, Technology::Umts, GsmSelection::umtsHigh)) return cell;
+  if (const auto cell = strongestAllowed(c, Technology::Lte, GsmSelection::lteHigh)) return cell;
+  for (const CellIndex cell : c.surroundings.heard(Technology::Gsm)) {
     if (cell == serving || c.forbidden.knownForbidden(cell)) continue;
     // Only a change of the location area has to overcome the hysteresis (45.008, 6.6.2).
     const bool sameArea = network_.cells[cell].areaCode == network_.cells[serving].areaCode;
-    const double margin = sameArea ? 2 : GsmSelection::kReselectHysteresis;
+    const double margin = sameArea ? 2 : GsmSelection::reselectHysteresis;
     if (unsuitable || c.surroundings.strength(cell) > state_.rxLev + margin) return cell;
     break;
   }
@@ -99,7 +99,7 @@ std::optional<Departure> GsmModem::advance(const Circumstances& c) {
   if (!state_.camped()) return std::nullopt;
   if (c.measured) {
     measure(c);
-    const bool failing = state_.rxLev <= GsmSelection::kRxLevAccessMin - 2;
+    const bool failing = state_.rxLev <= GsmSelection::rxLevAccessMin - 2;
     if (!failing) {
       cellFailingSince_ = -1;
     } else if (cellFailingSince_ < 0) {
@@ -107,45 +107,45 @@ std::optional<Departure> GsmModem::advance(const Circumstances& c) {
     }
   }
   const bool dedicated = c.demand.voice || c.demand.signalling;
-  if (state_.connection == GsmConnection::kIdle) {
+  if (state_.connection == GsmConnection::Idle) {
     if (c.measured) {
       std::optional<CellIndex> target;
-      Milliseconds patience = c.firstSearch ? 0 : GsmSelection::kReselectionTime;
+      Milliseconds patience = c.firstSearch ? 0 : GsmSelection::reselectionTime;
       if (cellFailingSince_ >= 0 && c.now - cellFailingSince_ >= 1200) {
         patience = 0;
-        target = strongestAllowed(c, Technology::kLte, LteSelection::kQRxLevMin);
-        if (!target) target = strongestAllowed(c, Technology::kUmts, UmtsSelection::kQRxLevMin);
-        if (!target) target = strongestAllowed(c, Technology::kGsm, GsmSelection::kRxLevAccessMin);
+        target = strongestAllowed(c, Technology::Lte, LteSelection::qRxLevMin);
+        if (!target) target = strongestAllowed(c, Technology::Umts, UmtsSelection::qRxLevMin);
+        if (!target) target = strongestAllowed(c, Technology::Gsm, GsmSelection::rxLevAccessMin);
         lost_ = !target && c.now - cellFailingSince_ >= 3000;
         if (target == state_.serving) target.reset();
       } else if (c.mayLeave) {
         target = reselectionCandidate(c);
       }
       if (reselection_.holds(target, c.now, patience)) {
-        if (network_.technologyOf(*target) != Technology::kGsm) return Departure{*target, Manner::kReselection};
+        if (network_.technologyOf(*target) != Technology::Gsm) return Departure{*target, Manner::Reselection};
         serve(*target, c);
         return std::nullopt;
       }
     }
-    if (dedicated && !c.forbidden.knownForbidden(*state_.serving)) change(GsmConnection::kDedicated, c);
+    if (dedicated && !c.forbidden.knownForbidden(*state_.serving)) change(GsmConnection::Dedicated, c);
     return std::nullopt;
   }
   if (!dedicated) {
-    change(GsmConnection::kIdle, c);
+    change(GsmConnection::Idle, c);
     return std::nullopt;
   }
   if (!c.measured) return std::nullopt;
   if (cellFailingSince_ >= 0 && c.now - cellFailingSince_ >= 4000) {  // the radio link timeout has run down
-    change(GsmConnection::kIdle, c);
+    change(GsmConnection::Idle, c);
     return std::nullopt;
   }
   std::optional<CellIndex> better;
-  for (const CellIndex cell : c.surroundings.heard(Technology::kGsm)) {
+  for (const CellIndex cell : c.surroundings.heard(Technology::Gsm)) {
     if (cell == state_.serving || network_.cells[cell].areaCode == network_.forbiddenAreaCode) continue;
-    if (c.surroundings.strength(cell) > state_.rxLev + GsmSelection::kHandoverMargin) better = cell;
+    if (c.surroundings.strength(cell) > state_.rxLev + GsmSelection::handoverMargin) better = cell;
     break;
   }
-  if (handover_.holds(better, c.now, GsmSelection::kHandoverTime)) serve(*better, c);
+  if (handover_.holds(better, c.now, GsmSelection::handoverTime)) serve(*better, c);
   return std::nullopt;
 }
 

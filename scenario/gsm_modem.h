@@ -9,10 +9,10 @@
 
 namespace probeview::scenario {
 
-enum class GsmConnection : std::uint8_t { kInactive, kIdle, kDedicated };
+enum class GsmConnection : std::uint8_t { Inactive, Idle, Dedicated };
 
 struct GsmState {
-  GsmConnection connection = GsmConnection::kInactive;
+  GsmConnection connection = GsmConnection::Inactive;
   std::optional<CellIndex> serving;        // the cell that serves, or the last one that did
   double rxLev = 0;                        // dBm
   unsigned rxQual = 0;                     // 0 to 7; of dedicated mode
@@ -22,7 +22,7 @@ struct GsmState {
   unsigned antenna = 0;
   NeighbourLists neighbours;
 
-  bool camped() const { return connection != GsmConnection::kInactive; }
+  bool camped() const { return connection != GsmConnection::Inactive; }
 };
 
 // The phone in GSM: idle mode, calls and signalling in dedicated mode, handover, packet data on the side.

@@ -9,7 +9,7 @@ namespace probeview::scenario {
 namespace {
 
 // System information counts some differences in steps.
-constexpr std::uint32_t kGsmDecibelsPerStep = 2;
+constexpr std::uint32_t gsmDecibelsPerStep = 2;
 
 // The power control level of the largest power in the band (3GPP TS 45.005, 4.1.1).
 std::uint32_t largestPowerLevel(const Carrier& carrier) { return carrier.band == 1800 ? 0 : 5; }
@@ -17,7 +17,7 @@ std::uint32_t largestPowerLevel(const Carrier& carrier) { return carrier.band ==
 }  // namespace
 
 void report(const Phone& phone, KCellularGsmScellInfo& message) {
-  if (phone.gsm().connection == GsmConnection::kInactive) {
+  if (phone.gsm().connection == GsmConnection::Inactive) {
     // The cell that was left serves no more.
     message.setState(KCellularGsmScellInfo::State::NON_DEDICATED_STATE);
     return;
@@ -25,17 +25,17 @@ void report(const Phone& phone, KCellularGsmScellInfo& message) {
   const CellIndex serving = *phone.gsm().serving;
   const Cell& cell = phone.network().cells[serving];
   const Carrier& carrier = phone.network().carrierOf(serving);
-  message.setMcc(kCountryCode);
-  message.setMnc(kNetworkCode);
+  message.setMcc(countryCode);
+  message.setMnc(networkCode);
   message.setLac(cell.areaCode);
   message.setCellId(cell.identity);
   message.setGsmBand(bandCode(carrier));
   message.setArfcn(carrier.channel);
   message.setBsic(cell.physicalIdentity);
-  message.setState(phone.gsm().connection == GsmConnection::kDedicated
+  message.setState(phone.gsm().connection == GsmConnection::Dedicated
                        ? KCellularGsmScellInfo::State::DEDICATED_STATE
                        : KCellularGsmScellInfo::State::NON_DEDICATED_STATE);
-  message.setNumMncDigits(kNetworkCodeDigits);
+  message.setNumMncDigits(networkCodeDigits);
 }
 
 // What system information 3 and 4 say (3GPP TS 44.018, 9.1.35 and 10.5.2).
@@ -44,8 +44,8 @@ void report(const Phone& phone, KCellularGsmIdleConfig& message) {
   const Cell& cell = phone.network().cells[serving];
   const Carrier& carrier = phone.network().carrierOf(serving);
   message.setArfcnBcch(carrier.channel);
-  message.setMcc(kCountryCode);
-  message.setMnc(kNetworkCode);
+  message.setMcc(countryCode);
+  message.setMnc(networkCode);
   message.setLac(cell.areaCode);
   message.setCi(cell.identity);
   message.setBsic(cell.physicalIdentity);
@@ -54,7 +54,7 @@ void report(const Phone& phone, KCellularGsmIdleConfig& message) {
   message.setMultibRep(2);         // neighbours of the other band to report
   message.setGsmBand(static_cast<std::uint32_t>(bandCode(carrier)));
   message.setMsTxpwr(largestPowerLevel(carrier));
-  message.setRxAccMin(units::gsmRxLev.toUnsigned(GsmSelection::kRxLevAccessMin));
+  message.setRxAccMin(units::gsmRxLev.toUnsigned(GsmSelection::rxLevAccessMin));
   message.setCbq(0);
   message.setCba(0);
   message.setC2Valid(1);
@@ -98,8 +98,8 @@ void report(const Phone& phone, KCellularGsmGrrEventMeasCr& message) {
   for (const CellMeasurement& measured : phone.gsm().neighbours.gsm) {
     const Cell& cell = network.cells[measured.cell];
     GsmNcellMeas& neighbour = message.addGsmNcellMeas();
-    neighbour.setMcc(kCountryCode);
-    neighbour.setMnc(kNetworkCode);
+    neighbour.setMcc(countryCode);
+    neighbour.setMnc(networkCode);
     neighbour.setLac(cell.areaCode);
     neighbour.setCi(cell.identity);
     neighbour.setBsic(cell.physicalIdentity);
@@ -133,7 +133,7 @@ void report(const Phone& phone, KCellularGsmGprsConfig& message) {
   message.setSpPgCy(true);
   message.setNco(0);  // the phone chooses its cells itself
   message.setNom(2);  // circuit and packet services page apart
-  message.setCrHyst(GsmSelection::kReselectHysteresis / kGsmDecibelsPerStep);
+  message.setCrHyst(GsmSelection::reselectHysteresis / gsmDecibelsPerStep);
   message.setAccThr(6);
   message.setExtUplTbfSupported(true);
   message.setPriorityClass(0);

@@ -13,39 +13,39 @@ namespace probeview::scenario {
 
 // The numbers are those of the metric service.
 enum class LteConnection : std::int32_t {
-  kNull = 0,
-  kIdle = 1,
-  kAttemptingConnection = 2,
-  kConnected = 3,
-  kEnding = 4,
-  kAttemptingOutboundMobility = 5,
-  kAttemptingInboundMobility = 6,
+  Null = 0,
+  Idle = 1,
+  AttemptingConnection = 2,
+  Connected = 3,
+  Ending = 4,
+  AttemptingOutboundMobility = 5,
+  AttemptingInboundMobility = 6,
 };
 
 enum class LteCause : std::int32_t {
-  kEstablishMobileTerminated = 2,
-  kEstablishSignalling = 3,
-  kEstablishData = 4,
-  kReestablishHandoverFailure = 7,
-  kReleaseT311Expired = 11,
-  kReleaseReestablishmentRejected = 13,
-  kReleaseLoadBalancing = 14,
-  kReleaseOther = 15,
-  kReleaseMobilityFromEutran = 20,
-  kEstablishMobilityToEutran = 21,
-  kEstablishNoResponse = 22,
-  kReestablishT310Expired = 27,
-  kNoService = 254,
-  kNotApplicable = 255,
+  EstablishMobileTerminated = 2,
+  EstablishSignalling = 3,
+  EstablishData = 4,
+  ReestablishHandoverFailure = 7,
+  ReleaseT311Expired = 11,
+  ReleaseReestablishmentRejected = 13,
+  ReleaseLoadBalancing = 14,
+  ReleaseOther = 15,
+  ReleaseMobilityFromEutran = 20,
+  EstablishMobilityToEutran = 21,
+  EstablishNoResponse = 22,
+  ReestablishT310Expired = 27,
+  NoService = 254,
+  NotApplicable = 255,
 };
 
 // The numbers are those of the metric service.
-enum class SecondaryState : std::int32_t { kDeconfigured = 0, kDeactivated = 1, kActivated = 2 };
+enum class SecondaryState : std::int32_t { Deconfigured = 0, Deactivated = 1, Activated = 2 };
 
 struct SecondaryCarrier {
   CellIndex cell = 0;
   std::uint32_t index = 1;  // from 1; stays as long as the carrier is there, whatever becomes of the others
-  SecondaryState state = SecondaryState::kDeactivated;
+  SecondaryState state = SecondaryState::Deactivated;
   double rsrp = 0, rsrq = 0, sinr = 0, rssi = 0;
 };
 
@@ -65,11 +65,11 @@ struct TransmitPower {
 };
 
 struct LteState {
-  LteConnection connection = LteConnection::kNull;
+  LteConnection connection = LteConnection::Null;
   std::optional<LteConnection> previous;  // none before the first change
   Milliseconds since = 0;
   Milliseconds previousDuration = 0;
-  LteCause cause = LteCause::kNotApplicable;
+  LteCause cause = LteCause::NotApplicable;
   std::optional<CellIndex> serving;  // the cell that serves, or the last one that did
   double rsrp = 0, rsrq = 0, sinr = 0;
   NeighbourLists neighbours;
@@ -81,8 +81,8 @@ struct LteState {
   // C-DRX is configured with the connection and ends with it, also when the phone leaves, looks for a cell in which to
   // go on or is on its way to another technology (3GPP TS 36.331, 5.3.7.2, 5.3.12 and 5.4.3).
   bool drxConfigured() const { return connected(); }
-  bool connected() const { return connection == LteConnection::kConnected; }
-  bool camped() const { return connection != LteConnection::kNull; }
+  bool connected() const { return connection == LteConnection::Connected; }
+  bool camped() const { return connection != LteConnection::Null; }
 };
 
 // The phone in E-UTRA: idle mode, connections, handover, carrier aggregation, radio link failure.

@@ -16,7 +16,7 @@ std::uint32_t bandwidthIndex(const Carrier& carrier) {
 }
 
 // System information counts levels in steps of 2 dB (3GPP TS 36.331, 6.3.4: Q-RxLevMin, ReselectionThreshold).
-constexpr int kLteDecibelsPerStep = 2;
+constexpr int lteDecibelsPerStep = 2;
 
 void fill(RsrpRsrqSinr& values, const Network& network, const LteSample& sample) {
   values.setPhyCellId(network.cells[sample.cell].physicalIdentity);
@@ -45,12 +45,12 @@ void report(const Phone& phone, KCellularLteCdrxConfig& message) {
   message.setRrcState(static_cast<std::int32_t>(lte.connection));
   message.setCdrxConfigStatus(lte.drxConfigured() ? 1 : 0);
   if (!lte.drxConfigured()) return;
-  message.setOnDurationMs(LteDrx::kOnDuration);
-  message.setDrxInactivityMs(LteDrx::kInactivity);
-  message.setDrxRetxTimerMs(LteDrx::kRetransmission);
-  message.setLongDrxCycleMs(LteDrx::kLongCycle);
-  message.setShortDrxCycleMs(LteDrx::kShortCycle);
-  message.setDrxShortCycleNum(LteDrx::kShortCycles);
+  message.setOnDurationMs(LteDrx::onDuration);
+  message.setDrxInactivityMs(LteDrx::inactivity);
+  message.setDrxRetxTimerMs(LteDrx::retransmission);
+  message.setLongDrxCycleMs(LteDrx::longCycle);
+  message.setShortDrxCycleMs(LteDrx::shortCycle);
+  message.setDrxShortCycleNum(LteDrx::shortCycles);
   message.setTransmissionMode(lte.transmissionMode);
 }
 
@@ -60,15 +60,15 @@ void report(const Phone& phone, KCellularLteScellInfo& message) {
   const Carrier& carrier = phone.network().carrierOf(serving);
   message.setPhyCellId(cell.physicalIdentity);
   message.setDlFreq(carrier.channel);
-  message.setUlFreq(carrier.channel + kUplinkChannelOffset);
+  message.setUlFreq(carrier.channel + uplinkChannelOffset);
   message.setDlBw(units::lteServingDownlinkBandwidth(bandwidthMegahertz(carrier)));
   message.setUlBw(units::lteServingUplinkBandwidth(bandwidthMegahertz(carrier)));
   message.setCellId(cell.identity);
   message.setFreqBandInd(carrier.band);
   message.setTrackingAreaCode(cell.areaCode);
-  message.setNumMncDigits(kNetworkCodeDigits);
-  message.setSelPlmnMcc(kCountryCode);
-  message.setSelPlmnMnc(kNetworkCode);
+  message.setNumMncDigits(networkCodeDigits);
+  message.setSelPlmnMcc(countryCode);
+  message.setSelPlmnMnc(networkCode);
 }
 
 void report(const Phone& phone, KCellularLteSelReselCellInfo& message) {
@@ -78,29 +78,29 @@ void report(const Phone& phone, KCellularLteSelReselCellInfo& message) {
   if (serving.band == 3) message.addMultiBandInfo(9);
   message.setImsEmergencySupport(network.hasVoiceOverIms(*phone.lte().serving) ? 1 : 0);
   message.setAcBarringForEmergency(0);
-  message.setQRxLevMin(LteSelection::kQRxLevMin / kLteDecibelsPerStep);
-  message.setQQualMin(LteSelection::kQQualMin);
-  message.setQHyst(LteSelection::kHysteresis);
-  message.setSNonIntraSearchP(LteSelection::kNonIntraSearchP / kLteDecibelsPerStep);
-  message.setSNonIntraSearchQ(LteSelection::kNonIntraSearchQ);
-  message.setSIntraSearchP(LteSelection::kIntraSearchP / kLteDecibelsPerStep);
-  message.setSIntraSearchQ(LteSelection::kIntraSearchQ);
-  message.setThreshServingLowP(LteSelection::kServingLowP / kLteDecibelsPerStep);
+  message.setQRxLevMin(LteSelection::qRxLevMin / lteDecibelsPerStep);
+  message.setQQualMin(LteSelection::qQualMin);
+  message.setQHyst(LteSelection::hysteresis);
+  message.setSNonIntraSearchP(LteSelection::nonIntraSearchP / lteDecibelsPerStep);
+  message.setSNonIntraSearchQ(LteSelection::nonIntraSearchQ);
+  message.setSIntraSearchP(LteSelection::intraSearchP / lteDecibelsPerStep);
+  message.setSIntraSearchQ(LteSelection::intraSearchQ);
+  message.setThreshServingLowP(LteSelection::servingLowP / lteDecibelsPerStep);
   message.setPriorityOperatingFreq(serving.priority);
   std::set<std::uint32_t> listed{serving.channel};
   for (const Carrier& carrier : network.carriers) {
-    if (carrier.technology != Technology::kLte || !listed.insert(carrier.channel).second) continue;
+    if (carrier.technology != Technology::Lte || !listed.insert(carrier.channel).second) continue;
     NbrEutra& neighbour = message.addNbrEutra();
     neighbour.setEarfcn(carrier.channel);
-    neighbour.setQRxlevMin(LteSelection::kQRxLevMin / kLteDecibelsPerStep);
-    neighbour.setQQualMin(LteSelection::kQQualMin);
+    neighbour.setQRxlevMin(LteSelection::qRxLevMin / lteDecibelsPerStep);
+    neighbour.setQQualMin(LteSelection::qQualMin);
     neighbour.setQOffset(0);
-    neighbour.setPmax(LteSelection::kMaximumPower);
+    neighbour.setPmax(LteSelection::maximumPower);
     neighbour.setDlBw(bandwidthIndex(carrier));
-    neighbour.setThresXHighP(LteSelection::kCandidateHighP / kLteDecibelsPerStep);
-    neighbour.setThresXLowP(LteSelection::kCandidateLowP / kLteDecibelsPerStep);
-    neighbour.setThresXHighQ(LteSelection::kCandidateHighQ);
-    neighbour.setThresXLowQ(LteSelection::kCandidateLowQ);
+    neighbour.setThresXHighP(LteSelection::candidateHighP / lteDecibelsPerStep);
+    neighbour.setThresXLowP(LteSelection::candidateLowP / lteDecibelsPerStep);
+    neighbour.setThresXHighQ(LteSelection::candidateHighQ);
+    neighbour.setThresXLowQ(LteSelection::candidateLowQ);
     neighbour.setPriority(carrier.priority);
     neighbour.setFrameType(NbrEutra::FrameType::FDD);
     neighbour.setBand(carrier.band);
@@ -119,8 +119,8 @@ void report(const Phone& phone, KCellularLteTxPower& message) {
 void report(const Phone& phone, KCellularLteRsrpRsrqSinr& message) {
   const auto& samples = phone.lte().samples;
   const auto count = static_cast<std::uint32_t>(samples.size());
-  const auto period = static_cast<std::uint32_t>(kStep);
-  if (phone.traffic().activity() == Activity::kVoice) {
+  const auto period = static_cast<std::uint32_t>(stepTime);
+  if (phone.traffic().activity() == Activity::Voice) {
     message.setCallId("call " + std::to_string(phone.traffic().calls()));
   }
   message.setLastYSamples(count);
@@ -150,7 +150,7 @@ void report(const Phone& phone, KCellularLteComponentCarrierInfo& message) {
   message.setPccBandwidth(bandwidthIndex(primary));
   unsigned secondary = 0;
   for (const SecondaryCarrier& entry : phone.lte().secondaries) {
-    if (entry.state == SecondaryState::kDeconfigured) continue;
+    if (entry.state == SecondaryState::Deconfigured) continue;
     const Carrier& carrier = network.carrierOf(entry.cell);
     if (secondary == 0) {
       message.setScc0Earfcn(carrier.channel);
@@ -174,8 +174,8 @@ void report(const Phone& phone, KCellularLteCarrierAggregationStatus& message) {
     listed.setDlEarfcn(carrier.channel);
     listed.setDlRfBand(carrier.band);
     listed.setDlBandwidth(bandwidthIndex(carrier));
-    listed.setHasUplink(false);                                  // the phone sends on its primary carrier only
-    if (entry.state == SecondaryState::kDeconfigured) continue;  // and is not measured any more
+    listed.setHasUplink(false);                                 // the phone sends on its primary carrier only
+    if (entry.state == SecondaryState::Deconfigured) continue;  // and is not measured any more
     listed.setRsrp(units::lteCarrierRsrp.toSigned(entry.rsrp));
     listed.setRsrq(units::lteCarrierRsrq.toSigned(entry.rsrq));
     listed.setSnr(wholeDecibels(entry.sinr));

@@ -54,12 +54,12 @@ struct Circumstances {
   Random& random;
 };
 
-enum class Manner : std::uint8_t { kReselection, kRedirection, kHandover, kFallbackForVoice };
+enum class Manner : std::uint8_t { Reselection, Redirection, Handover, FallbackForVoice };
 
 // The wish to go on in another cell, of another technology or of the same one after service was lost.
 struct Departure {
   CellIndex cell = 0;
-  Manner manner = Manner::kReselection;
+  Manner manner = Manner::Reselection;
 };
 
 // Something that must stay true for a while before it counts: a time to trigger or a reselection timer.
@@ -92,9 +92,9 @@ inline void listHeard(const Circumstances& c, Technology technology, std::option
 }
 
 inline void listAllHeard(const Circumstances& c, std::optional<CellIndex> except, NeighbourLists& lists) {
-  listHeard(c, Technology::kLte, except, 8, lists.lte);
-  listHeard(c, Technology::kUmts, except, 8, lists.umts);
-  listHeard(c, Technology::kGsm, except, 6, lists.gsm);
+  listHeard(c, Technology::Lte, except, 8, lists.lte);
+  listHeard(c, Technology::Umts, except, 8, lists.umts);
+  listHeard(c, Technology::Gsm, except, 6, lists.gsm);
 }
 
 // The strongest cell of a technology in which the phone may register and which is at least so strong.

@@ -8,33 +8,33 @@ namespace {
 
 // North and its third parts of a circle, and the same turned by 30, 60 and 90 degrees.
 Point direction(double degrees) {
-  constexpr double kHalfRootOfThree = 0.8660254037844386;
+  constexpr double halfRootOfThree = 0.8660254037844386;
   const auto twelfth = static_cast<int>(degrees / 30.0 + 0.5) % 12;
   switch (twelfth) {
     case 0:
       return {0, 1};
     case 1:
-      return {0.5, kHalfRootOfThree};
+      return {0.5, halfRootOfThree};
     case 2:
-      return {kHalfRootOfThree, 0.5};
+      return {halfRootOfThree, 0.5};
     case 3:
       return {1, 0};
     case 4:
-      return {kHalfRootOfThree, -0.5};
+      return {halfRootOfThree, -0.5};
     case 5:
-      return {0.5, -kHalfRootOfThree};
+      return {0.5, -halfRootOfThree};
     case 6:
       return {0, -1};
     case 7:
-      return {-0.5, -kHalfRootOfThree};
+      return {-0.5, -halfRootOfThree};
     case 8:
-      return {-kHalfRootOfThree, -0.5};
+      return {-halfRootOfThree, -0.5};
     case 9:
       return {-1, 0};
     case 10:
-      return {-kHalfRootOfThree, 0.5};
+      return {-halfRootOfThree, 0.5};
     default:
-      return {-0.5, kHalfRootOfThree};
+      return {-0.5, halfRootOfThree};
   }
 }
 
@@ -73,15 +73,15 @@ void NetworkBuilder::add(const SitePlan& plan) {
       cell.load = 0.25 + 0.5 * static_cast<double>(scramble(seed_ + network_.cells.size()) % 100) / 100.0;
       const std::uint32_t number = (site + offset) * 3 + sector;
       switch (technology) {
-        case Technology::kLte:
+        case Technology::Lte:
           cell.physicalIdentity = number % 504;
           cell.identity = (0x0A00 + site) << 8 | (layer * 3 + sector + 1);
           break;
-        case Technology::kUmts:
+        case Technology::Umts:
           cell.physicalIdentity = (number * 8) % 512;
           cell.identity = 0x0101U << 16 | (site * 16 + layer * 3 + sector + 1);
           break;
-        case Technology::kGsm:
+        case Technology::Gsm:
           // Network colour codes 2 to 5, and base station colour codes so that re-used channels tell apart.
           cell.physicalIdentity = 2 * 8 + (site + offset) % 32;
           cell.identity = 10001 + site * 10 + sector + layer % 3;
@@ -89,7 +89,7 @@ void NetworkBuilder::add(const SitePlan& plan) {
       }
       network_.cells.push_back(cell);
       // The sectors of a GSM site have each a carrier of their own.
-      if (technology == Technology::kGsm) break;
+      if (technology == Technology::Gsm) break;
     }
     ++layer;
   }
@@ -97,7 +97,7 @@ void NetworkBuilder::add(const SitePlan& plan) {
   if (plan.sectors > 1) {
     std::uint32_t sector = 0;
     for (auto& cell : network_.cells) {
-      if (cell.site != site || network_.carriers[cell.carrier].technology != Technology::kGsm) continue;
+      if (cell.site != site || network_.carriers[cell.carrier].technology != Technology::Gsm) continue;
       cell.facing = direction(plan.turnDegrees + 360.0 / plan.sectors * (sector % plan.sectors));
       cell.identity = 10001 + site * 10 + sector;
       ++sector;

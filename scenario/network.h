@@ -14,16 +14,16 @@
 
 namespace probeview::scenario {
 
-enum class Technology : std::uint8_t { kGsm, kUmts, kLte };
-constexpr std::size_t kTechnologies = 3;
+enum class Technology : std::uint8_t { Gsm, Umts, Lte };
+constexpr std::size_t technologyCount = 3;
 
-constexpr std::uint32_t kCountryCode = 1;  // 001
-constexpr std::uint32_t kNetworkCode = 1;  // 01
-constexpr std::uint32_t kNetworkCodeDigits = 2;
+constexpr std::uint32_t countryCode = 1;  // 001
+constexpr std::uint32_t networkCode = 1;  // 01
+constexpr std::uint32_t networkCodeDigits = 2;
 
 // A carrier frequency, and what its cells broadcast about it.
 struct Carrier {
-  Technology technology = Technology::kLte;
+  Technology technology = Technology::Lte;
   std::uint32_t channel = 0;  // downlink EARFCN (3GPP TS 36.101, 5.7.3), UARFCN (25.101, 5.4) or ARFCN (45.005, 2)
   std::uint32_t band = 0;     // the band's number: 3 for E-UTRA band 3, 8 for UTRA band VIII, 900 or 1800 for GSM
   double megahertz = 0;       // downlink
@@ -33,7 +33,7 @@ struct Carrier {
 };
 
 // The offset between an E-UTRA FDD carrier's downlink and uplink channel numbers (3GPP TS 36.101, table 5.7.3-1).
-constexpr std::uint32_t kUplinkChannelOffset = 18000;
+constexpr std::uint32_t uplinkChannelOffset = 18000;
 
 // Whole megahertz; the scenarios use 5, 10 and 20 MHz carriers.
 std::uint32_t bandwidthMegahertz(const Carrier& carrier);

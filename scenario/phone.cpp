@@ -8,10 +8,10 @@
 namespace probeview::scenario {
 namespace {
 
-constexpr Milliseconds kOtherTechnologiesPeriod = 1000;
-constexpr Milliseconds kFirstSearchAtMost = 5000;
-constexpr double kFilterWeight = 0.5;           // filter coefficient 4 (3GPP TS 36.331, 5.5.3.2)
-constexpr double kSlowMeasurementWeight = 0.7;  // what is measured rarely is worth more
+constexpr Milliseconds otherTechnologiesPeriod = 1000;
+constexpr Milliseconds firstSearchAtMost = 5000;
+constexpr double filterWeight = 0.5;           // filter coefficient 4 (3GPP TS 36.331, 5.5.3.2)
+constexpr double slowMeasurementWeight = 0.7;  // what is measured rarely is worth more
 
 }  // namespace
 
@@ -29,11 +29,11 @@ Phone::Phone(World world, std::uint64_t seed)
 std::optional<CellIndex> Phone::servingCell() const {
   if (!technology_) return std::nullopt;
   switch (*technology_) {
-    case Technology::kGsm:
+    case Technology::Gsm:
       return gsm().serving;
-    case Technology::kUmts:
+    case Technology::Umts:
       return umts().serving;
-    case Technology::kLte:
+    case Technology::Lte:
       return lte().serving;
   }
   return std::nullopt;
@@ -42,25 +42,25 @@ std::optional<CellIndex> Phone::servingCell() const {
 bool Phone::connected() const {
   if (!technology_) return false;
   switch (*technology_) {
-    case Technology::kGsm:
-      return gsm().connection == GsmConnection::kDedicated;
-    case Technology::kUmts:
+    case Technology::Gsm:
+      return gsm().connection == GsmConnection::Dedicated;
+    case Technology::Umts:
       return umts().connected();
-    case Technology::kLte:
+    case Technology::Lte:
       return lte().connected();
   }
   return false;
 }
 
 void Phone::measure() {
-  measured_ = now_ % kMeasurementPeriod == 0;
+  measured_ = now_ % measurementPeriod == 0;
   if (!measured_) return;
-  for (const Technology technology : {Technology::kGsm, Technology::kUmts, Technology::kLte}) {
+  for (const Technology technology : {Technology::Gsm, Technology::Umts, Technology::Lte}) {
     const Point where = world_.route.position();
     if (technology == technology_) {
-      surroundings_.measure(technology, where, kFilterWeight);
-    } else if (firstSearch_ || now_ % kOtherTechnologiesPeriod == 0) {
-      surroundings_.measure(technology, where, kSlowMeasurementWeight);
+      surroundings_.measure(technology, where, filterWeight);
+    } else if (firstSearch_ || now_ % otherTechnologiesPeriod == 0) {
+      surroundings_.measure(technology, where, slowMeasurementWeight);
     }
   }
 }
@@ -79,9 +79,9 @@ Circumstances Phone::circumstances() {
                   .random = random_};
   traffic_.addTo(c.demand);
   registration_.addTo(c.demand);
-  if (technology_ == Technology::kGsm) {
+  if (technology_ == Technology::Gsm) {
     // In GSM, packets and packet registration need no connection; only calls and location updates do.
-    const bool located = registration_.mobility().update == LocationUpdate::kUpdated;
+    const bool located = registration_.mobility().update == LocationUpdate::Updated;
     c.demand.signalling = c.demand.signalling && registration_.circuitProcedure();
     c.demand.registering = c.demand.signalling;
     if (firstSearch_) c.mayLeave = located;
@@ -90,21 +90,21 @@ Circumstances Phone::circumstances() {
 }
 
 void Phone::powerOn() {
-  facts_.learn(Fact::kSimFiles, now_);
-  facts_.learn(Fact::kMobilityCommon, now_);
-  facts_.learn(Fact::kMobilityContext, now_);
-  facts_.learn(Fact::kGprsContext, now_);
-  facts_.learn(Fact::kEpsContext, now_);
-  facts_.learn(Fact::kBearers, now_);
+  facts_.learn(Fact::SimFiles, now_);
+  facts_.learn(Fact::MobilityCommon, now_);
+  facts_.learn(Fact::MobilityContext, now_);
+  facts_.learn(Fact::GprsContext, now_);
+  facts_.learn(Fact::EpsContext, now_);
+  facts_.learn(Fact::Bearers, now_);
   search();
 }
 
 // Any cell will do at first, GSM before the others because it answers soonest; later the best technology.
 void Phone::search() {
   const Circumstances c = circumstances();
-  const auto lte = [&] { return strongestAllowed(c, Technology::kLte, LteSelection::kQRxLevMin + 2); };
-  const auto umts = [&] { return strongestAllowed(c, Technology::kUmts, UmtsSelection::kQRxLevMin + 2); };
-  const auto gsm = [&] { return strongestAllowed(c, Technology::kGsm, GsmSelection::kRxLevAccessMin + 2); };
+  const auto lte = [&] { return strongestAllowed(c, Technology::Lte, LteSelection::qRxLevMin + 2); };
+  const auto umts = [&] { return strongestAllowed(c, Technology::Umts, UmtsSelection::qRxLevMin + 2); };
+  const auto gsm = [&] { return strongestAllowed(c, Technology::Gsm, GsmSelection::rxLevAccessMin + 2); };
   std::optional<CellIndex> found;
   if (firstSearch_) {
     found = gsm();
@@ -115,23 +115,23 @@ void Phone::search() {
     if (!found) found = umts();
     if (!found) found = gsm();
   }
-  if (found) go({*found, Manner::kReselection});
+  if (found) go({*found, Manner::Reselection});
 }
 
 void Phone::leave(Manner manner) {
   if (!technology_) return;
   const Circumstances c = circumstances();
   switch (*technology_) {
-    case Technology::kGsm:
+    case Technology::Gsm:
       gsm_.leave(c);
       break;
-    case Technology::kUmts:
+    case Technology::Umts:
       umts_.leave(c);
       break;
-    case Technology::kLte: {
-      LteCause cause = LteCause::kNotApplicable;
-      if (manner == Manner::kHandover) cause = LteCause::kReleaseMobilityFromEutran;
-      if (manner == Manner::kRedirection || manner == Manner::kFallbackForVoice) cause = LteCause::kReleaseOther;
+    case Technology::Lte: {
+      LteCause cause = LteCause::NotApplicable;
+      if (manner == Manner::Handover) cause = LteCause::ReleaseMobilityFromEutran;
+      if (manner == Manner::Redirection || manner == Manner::FallbackForVoice) cause = LteCause::ReleaseOther;
       lte_.leave(cause, c);
       break;
     }
@@ -144,13 +144,13 @@ void Phone::go(const Departure& departure) {
   technology_ = world_.network.technologyOf(departure.cell);
   const Circumstances c = circumstances();
   switch (*technology_) {
-    case Technology::kGsm:
+    case Technology::Gsm:
       gsm_.enter(departure.cell, departure.manner, c);
       break;
-    case Technology::kUmts:
+    case Technology::Umts:
       umts_.enter(departure.cell, departure.manner, c);
       break;
-    case Technology::kLte:
+    case Technology::Lte:
       lte_.enter(departure.cell, departure.manner, c);
       break;
   }
@@ -161,14 +161,14 @@ void Phone::go(const Departure& departure) {
 void Phone::loseService() {
   const Circumstances c = circumstances();
   switch (*technology_) {
-    case Technology::kGsm:
+    case Technology::Gsm:
       gsm_.leave(c);
       break;
-    case Technology::kUmts:
+    case Technology::Umts:
       umts_.leave(c);
       break;
-    case Technology::kLte:
-      lte_.leave(LteCause::kNoService, c);
+    case Technology::Lte:
+      lte_.leave(LteCause::NoService, c);
       break;
   }
   technology_.reset();
@@ -178,8 +178,8 @@ void Phone::loseService() {
 }
 
 void Phone::advance() {
-  now_ += kStep;
-  if (now_ > 0) world_.route.advance(static_cast<double>(kStep) / 1000.0);
+  now_ += stepTime;
+  if (now_ > 0) world_.route.advance(static_cast<double>(stepTime) / 1000.0);
   measure();
   if (now_ == 0) {
     powerOn();
@@ -187,7 +187,7 @@ void Phone::advance() {
   }
   if (!technology_) {
     traffic_.advance(now_, false);
-    if (measured_ && now_ % kOtherTechnologiesPeriod == 0) search();
+    if (measured_ && now_ % otherTechnologiesPeriod == 0) search();
     bearers_.advance(now_, registration_.epsAttaches(), false, false, facts_);
     return;
   }
@@ -198,15 +198,15 @@ void Phone::advance() {
   std::optional<Departure> departure;
   bool lost = false;
   switch (*technology_) {
-    case Technology::kGsm:
+    case Technology::Gsm:
       departure = gsm_.advance(c);
       lost = gsm_.lost();
       break;
-    case Technology::kUmts:
+    case Technology::Umts:
       departure = umts_.advance(c);
       lost = umts_.lost();
       break;
-    case Technology::kLte:
+    case Technology::Lte:
       departure = lte_.advance(c);
       lost = lte_.lost();
       break;
@@ -236,9 +236,9 @@ void Phone::advance() {
     firstSearch_ = false;
     traffic_.fetch(now_);
   }
-  if (now_ >= kFirstSearchAtMost) firstSearch_ = false;
+  if (now_ >= firstSearchAtMost) firstSearch_ = false;
   bearers_.advance(now_, registration_.epsAttaches(), technology_.has_value(),
-                   technology_ == Technology::kLte && registration_.eps().voiceOverIms, facts_);
+                   technology_ == Technology::Lte && registration_.eps().voiceOverIms, facts_);
 }
 
 }  // namespace probeview::scenario

@@ -25,7 +25,7 @@ class Phone {
   Phone(const Phone&) = delete;
   Phone& operator=(const Phone&) = delete;
 
-  // One step of kStep. The first one is the moment of power-on.
+  // One step of stepTime. The first one is the moment of power-on.
   void advance();
 
   Milliseconds now() const { return now_; }
@@ -62,7 +62,7 @@ class Phone {
   GsmModem gsm_;
   Facts facts_;
   Random random_;
-  Milliseconds now_ = -kStep;
+  Milliseconds now_ = -stepTime;
   std::optional<Technology> technology_;
   std::optional<CellIndex> lastCell_;  // the cell that mobility management knows of
   bool firstSearch_ = true;

@@ -10,8 +10,8 @@
 namespace probeview::scenario {
 namespace {
 
-constexpr double kNearestMetres = 35;      // 3GPP TR 36.942, 4.5.1: no base station stands nearer
-constexpr double kCorrelationMetres = 50;  // how far one shadow reaches
+constexpr double nearestMetres = 35;      // 3GPP TR 36.942, 4.5.1: no base station stands nearer
+constexpr double correlationMetres = 50;  // how far one shadow reaches
 
 // 3GPP TR 36.942, 4.2.1: 65 degrees wide at 3 dB, 20 dB to the back.
 double antennaLoss(double degreesOff) {
@@ -36,8 +36,8 @@ Propagation::Propagation(const Network& network, std::uint64_t seed) : network_(
 
 // Values on a grid of the correlation distance, made up from the grid point's coordinates, and a smooth blend between.
 double Propagation::shadowing(std::uint64_t map, Point where) const {
-  const double column = where.x / kCorrelationMetres;
-  const double row = where.y / kCorrelationMetres;
+  const double column = where.x / correlationMetres;
+  const double row = where.y / correlationMetres;
   const double left = std::floor(column);
   const double bottom = std::floor(row);
   const auto corner = [&](double x, double y) {
@@ -65,15 +65,15 @@ double Propagation::enclosureLoss(std::uint32_t siteEnclosure, Point where) cons
 
 void Propagation::receive(Technology technology, Point where, std::span<double> dbmByCell) const {
   // Half of the shadow comes from what stands around the phone, half from what stands along the way to each site.
-  constexpr double kHalf = 0.7071067811865476;
-  const double deviation = network_.pathLoss.shadowDeviation * kHalf;
+  constexpr double rootOfHalf = 0.7071067811865476;
+  const double deviation = network_.pathLoss.shadowDeviation * rootOfHalf;
   const double around = shadowing(0, where);
   // The loss of each enclosure depends on whether the site stands in it too; most sites stand in the open.
   const double lossFromTheOpen = enclosureLoss(0, where);
   for (const SiteCells& entry : sites_[static_cast<std::size_t>(technology)]) {
     const Site& site = network_.sites[entry.site];
     const Point way = where - site.place;
-    const double metres = std::max(length(way), kNearestMetres);
+    const double metres = std::max(length(way), nearestMetres);
     const double loss = network_.pathLoss.slope * 0.1 * toDecibels(metres / 1000.0) +
                         deviation * (around + shadowing(entry.site + 1, where)) +
                         (site.enclosure == 0 ? lossFromTheOpen : enclosureLoss(site.enclosure, where));

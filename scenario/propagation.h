@@ -31,8 +31,8 @@ class Propagation {
 
   const Network& network_;
   std::uint64_t seed_;
-  std::vector<double> cellConstant_;             // radiated power less the loss at one kilometre
-  std::vector<SiteCells> sites_[kTechnologies];  // which cells each site has of each technology
+  std::vector<double> cellConstant_;               // radiated power less the loss at one kilometre
+  std::vector<SiteCells> sites_[technologyCount];  // which cells each site has of each technology
 };
 
 }  // namespace probeview::scenario

@@ -8,8 +8,8 @@
 namespace probeview::scenario {
 
 double Random::exponential(double mean) {
-  constexpr double kNaturalOfTwo = 0.6931471805599453;
-  return mean * std::min(-kNaturalOfTwo * logarithmOfTwo(1.0 - unit()), 3.0);
+  constexpr double naturalOfTwo = 0.6931471805599453;
+  return mean * std::min(-naturalOfTwo * logarithmOfTwo(1.0 - unit()), 3.0);
 }
 
 }  // namespace probeview::scenario

@@ -19,9 +19,9 @@ constexpr std::uint64_t scramble(std::uint64_t number) {
 // Normally distributed with mean 0 and deviation 1, never beyond 3.5: the sum of the number's four 16-bit quarters.
 constexpr double normalFrom(std::uint64_t bits) {
   const auto sum = (bits & 0xFFFFU) + ((bits >> 16) & 0xFFFFU) + ((bits >> 32) & 0xFFFFU) + (bits >> 48);
-  constexpr double kMean = 2 * 65535.0;
-  constexpr double kDeviation = 37837.227;  // 65536 / sqrt(12) * sqrt(4)
-  return (static_cast<double>(sum) - kMean) / kDeviation;
+  constexpr double mean = 2 * 65535.0;
+  constexpr double deviation = 37837.227;  // 65536 / sqrt(12) * sqrt(4)
+  return (static_cast<double>(sum) - mean) / deviation;
 }
 
 // A stream of random numbers. Everything that draws has a stream of its own, so that one more draw in one place does

@@ -17,66 +17,66 @@ namespace probeview::scenario {
 
 // The numbers of these enumerations are those of the metric service.
 enum class Service : std::int32_t {
-  kNormal = 0,
-  kRegistrationFailure = 1,
-  kLimited = 2,
-  kNone = 3,
-  kNotRegistered = 4,
-  kRegistrationInProgress = 11,
+  Normal = 0,
+  RegistrationFailure = 1,
+  Limited = 2,
+  None = 3,
+  NotRegistered = 4,
+  RegistrationInProgress = 11,
 };
-enum class LocationUpdate : std::int32_t { kUpdated = 1, kNotUpdated = 2, kRoamingNotAllowed = 3 };
-enum class PacketUpdate : std::int32_t { kUpdated = 0, kNotUpdated = 1, kRoamingNotAllowed = 2 };  // GPRS and EPS
-enum class ProcedureFailure : std::int32_t { kNone = 0, kLowerLayers = 1, kRejected = 11 };
+enum class LocationUpdate : std::int32_t { Updated = 1, NotUpdated = 2, RoamingNotAllowed = 3 };
+enum class PacketUpdate : std::int32_t { Updated = 0, NotUpdated = 1, RoamingNotAllowed = 2 };  // GPRS and EPS
+enum class ProcedureFailure : std::int32_t { None = 0, LowerLayers = 1, Rejected = 11 };
 enum class Reject : std::int32_t {
-  kNone = 0,
-  kNoSuitableCellInLocationArea = 15,  // of a tracking area, for EPS
-  kNetworkFailure = 17,
-  kCongestion = 22,
+  None = 0,
+  NoSuitableCellInLocationArea = 15,  // of a tracking area, for EPS
+  NetworkFailure = 17,
+  Congestion = 22,
 };
-enum class GprsProcedure : std::int32_t { kAttach = 1, kRoutingAreaUpdate = 2, kServiceRequest = 6, kNone = 10 };
+enum class GprsProcedure : std::int32_t { Attach = 1, RoutingAreaUpdate = 2, ServiceRequest = 6, None = 10 };
 enum class EpsProcedure : std::int32_t {
-  kNone = 0,
-  kAttachCombined = 2,
-  kAreaUpdateCombined = 5,
-  kPeriodicAreaUpdate = 6,
-  kServiceRequest = 7,
+  None = 0,
+  AttachCombined = 2,
+  AreaUpdateCombined = 5,
+  PeriodicAreaUpdate = 6,
+  ServiceRequest = 7,
 };
 
 struct MobilityContext {
-  Service service = Service::kNotRegistered;
-  LocationUpdate update = LocationUpdate::kNotUpdated;
+  Service service = Service::NotRegistered;
+  LocationUpdate update = LocationUpdate::NotUpdated;
   std::optional<std::uint32_t> locationArea;
   std::optional<std::uint32_t> temporaryIdentity;
   std::optional<std::uint32_t> periodicSeconds;  // T3212
-  ProcedureFailure failure = ProcedureFailure::kNone;
-  Reject reject = Reject::kNone;
+  ProcedureFailure failure = ProcedureFailure::None;
+  Reject reject = Reject::None;
   bool combined = false;
 };
 
 struct GprsContext {
-  Service service = Service::kNotRegistered;
-  PacketUpdate update = PacketUpdate::kNotUpdated;
+  Service service = Service::NotRegistered;
+  PacketUpdate update = PacketUpdate::NotUpdated;
   std::optional<std::uint32_t> locationArea;  // with the next, the routing area
   std::uint32_t routingArea = 0;
   std::optional<std::uint32_t> temporaryIdentity;
   std::optional<std::uint32_t> periodicSeconds;  // T3312
-  ProcedureFailure failure = ProcedureFailure::kNone;
-  Reject reject = Reject::kNone;
-  GprsProcedure procedure = GprsProcedure::kNone;
+  ProcedureFailure failure = ProcedureFailure::None;
+  Reject reject = Reject::None;
+  GprsProcedure procedure = GprsProcedure::None;
 };
 
 struct EpsContext {
-  Service service = Service::kNotRegistered;
-  PacketUpdate update = PacketUpdate::kNotUpdated;
+  Service service = Service::NotRegistered;
+  PacketUpdate update = PacketUpdate::NotUpdated;
   std::vector<std::uint32_t> trackingAreas;
   std::uint32_t groupIdentity = 0, groupCode = 0;  // of the mobility management entity
   std::optional<std::uint32_t> temporaryIdentity;  // M-TMSI
-  Reject reject = Reject::kNone;
-  EpsProcedure procedure = EpsProcedure::kNone;
+  Reject reject = Reject::None;
+  EpsProcedure procedure = EpsProcedure::None;
   std::optional<std::uint32_t> periodicSeconds;  // T3412
   bool voiceOverIms = false;
 
-  bool registered() const { return temporaryIdentity.has_value() && service == Service::kNormal; }
+  bool registered() const { return temporaryIdentity.has_value() && service == Service::Normal; }
 };
 
 class Registration final : public ForbiddenAreas {
@@ -102,9 +102,9 @@ class Registration final : public ForbiddenAreas {
   void endService(Milliseconds now, Facts& facts);
 
   // A procedure is waiting for a connection, or under way.
-  bool busy() const { return procedure_ != Procedure::kNone; }
+  bool busy() const { return procedure_ != Procedure::None; }
   // ... and it is one of the circuit services, a location update.
-  bool circuitProcedure() const { return procedure_ == Procedure::kLocationUpdate; }
+  bool circuitProcedure() const { return procedure_ == Procedure::LocationUpdate; }
   void addTo(Demand& demand) const;
 
   // connected: the phone has a connection in the technology of its cell.
@@ -115,13 +115,13 @@ class Registration final : public ForbiddenAreas {
 
  private:
   enum class Procedure : std::uint8_t {
-    kNone,
-    kLocationUpdate,
-    kGprsAttach,
-    kRoutingAreaUpdate,
-    kEpsAttach,
-    kTrackingAreaUpdate,
-    kPeriodicAreaUpdate,
+    None,
+    LocationUpdate,
+    GprsAttach,
+    RoutingAreaUpdate,
+    EpsAttach,
+    TrackingAreaUpdate,
+    PeriodicAreaUpdate,
   };
 
   void plan(Milliseconds now, Facts& facts);
@@ -143,7 +143,7 @@ class Registration final : public ForbiddenAreas {
   std::optional<std::uint32_t> equivalentNetwork_;
   std::optional<CellIndex> cell_;
   bool fromElsewhere_ = false;  // the EPS, or the GPRS side, has not been told yet that the phone is back
-  Procedure procedure_ = Procedure::kNone;
+  Procedure procedure_ = Procedure::None;
   Milliseconds ends_ = -1;  // of the procedure under way; -1 while it waits for a connection
   Milliseconds retryAt_ = -1;
   Milliseconds periodicAt_ = -1;

@@ -14,7 +14,7 @@ void ReportSchedule::setPeriod(Entry& entry, std::optional<Milliseconds> period)
   entry.realPeriod = forcedPeriod_ ? forcedPeriod_ : period;
   entry.period.reset();
   if (entry.realPeriod) {
-    entry.period = std::max(static_cast<Milliseconds>(static_cast<double>(*entry.realPeriod) * speed_), kStep);
+    entry.period = std::max(static_cast<Milliseconds>(static_cast<double>(*entry.realPeriod) * speed_), stepTime);
   }
 }
 
@@ -77,8 +77,8 @@ std::optional<Milliseconds> ReportSchedule::due(const Report& report, const Fact
   if (!entry.wanted || fact.learnt < 0) return std::nullopt;
   // A measurement that was made too early to be sent, and has been overtaken by a change of the cell, is news no more.
   const bool news = fact.revision != entry.reported && !fact.outdated &&
-                    (fact.holds || fact.lastWord || report.nature == Nature::kState);
-  if (entry.period || report.nature == Nature::kMeasurement) {
+                    (fact.holds || fact.lastWord || report.nature == Nature::State);
+  if (entry.period || report.nature == Nature::Measurement) {
     // A last word waits for nothing but what was asked for: the next technology is about to be told of.
     const bool waits = !news || !fact.lastWord || entry.periodIsAsked;
     if (waits && now < entry.next) return std::nullopt;
@@ -89,8 +89,8 @@ std::optional<Milliseconds> ReportSchedule::due(const Report& report, const Fact
   } else if (!news) {
     if (entry.pending) {
       // A measurement that is still being made will be news soon enough; what is over is told as it last was.
-      if (report.nature == Nature::kMeasurement && fact.holds) return std::nullopt;
-    } else if (entry.period && report.nature == Nature::kState && fact.holds) {
+      if (report.nature == Nature::Measurement && fact.holds) return std::nullopt;
+    } else if (entry.period && report.nature == Nature::State && fact.holds) {
       measuredAt = now;
     } else {
       return std::nullopt;
@@ -102,8 +102,8 @@ std::optional<Milliseconds> ReportSchedule::due(const Report& report, const Fact
     // On the period's own grid, so that steps do not add up to a slower rate; but nothing is made up for.
     entry.next += *entry.period;
     if (entry.next <= now) entry.next = now + *entry.period;
-  } else if (report.nature == Nature::kMeasurement) {
-    entry.next = now + static_cast<Milliseconds>(static_cast<double>(kMeasurementPeriod) * speed_);
+  } else if (report.nature == Nature::Measurement) {
+    entry.next = now + static_cast<Milliseconds>(static_cast<double>(measurementPeriod) * speed_);
   }
   return tellAs(report, measuredAt);
 }

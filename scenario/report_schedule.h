@@ -52,7 +52,7 @@ class ReportSchedule {
 
   double speed_;
   std::optional<Milliseconds> forcedPeriod_;
-  std::array<Entry, kFacts> entries_;
+  std::array<Entry, factCount> entries_;
 };
 
 }  // namespace probeview::scenario

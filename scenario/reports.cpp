@@ -20,49 +20,48 @@ std::vector<std::uint8_t> encode(const Phone& phone, std::uint64_t timestamp) {
   return writer.takeBytes();
 }
 
-constexpr std::optional<Milliseconds> kOnChange;
-constexpr std::optional<Milliseconds> kEachSecond = 1000;
-constexpr Nature kState = Nature::kState;
-constexpr Nature kMeasurement = Nature::kMeasurement;
+constexpr std::optional<Milliseconds> onChange;
+constexpr std::optional<Milliseconds> eachSecond = 1000;
+constexpr Nature state = Nature::State;
+constexpr Nature measurement = Nature::Measurement;
 
-constexpr std::array<Report, kFacts> kReports{{
-    {Fact::kLteConnection, K_LTE_RRC_STATE, kState, kOnChange, encode<KCellularLteRrcState>},
-    {Fact::kLteServingCell, K_LTE_SCELL_INFO, kState, kOnChange, encode<KCellularLteScellInfo>},
-    {Fact::kLteSelection, K_LTE_SEL_RESEL_INFO, kState, kOnChange, encode<KCellularLteSelReselCellInfo>},
-    {Fact::kLteComponentCarriers, K_LTE_COMPCARR_INFO, kState, kOnChange, encode<KCellularLteComponentCarrierInfo>},
-    {Fact::kLteAggregation, K_LTE_CA_STATUS, kState, kOnChange, encode<KCellularLteCarrierAggregationStatus>},
-    {Fact::kLteDrx, K_LTE_CDRX_CONFIG, kState, kOnChange, encode<KCellularLteCdrxConfig>},
-    {Fact::kUmtsConnection, K_UMTS_RRC_STATE, kState, kOnChange, encode<KCellularWcdmaRrcConnectionState>},
-    {Fact::kUmtsServingCell, K_UMTS_SCELL_INFO, kState, kOnChange, encode<KCellularWcdmaCellInfo>},
-    {Fact::kUmtsSelection, K_UMTS_SEL_RESEL_INFO, kState, kOnChange, encode<KCellularWcdmaSelReselCellInfo>},
-    {Fact::kUmtsConfiguration, K_UMTS_RRC_CONFIG, kState, kOnChange, encode<KCellularWcdmaRrcConfiguration>},
-    {Fact::kGsmServingCell, K_GSM_SCELL_INFO, kState, kOnChange, encode<KCellularGsmScellInfo>},
-    {Fact::kGsmIdleConfiguration, K_GSM_IDLE_CONFIG, kState, kOnChange, encode<KCellularGsmIdleConfig>},
-    {Fact::kGsmPacketConfiguration, K_GSM_GPRS_CONFIG, kState, kOnChange, encode<KCellularGsmGprsConfig>},
-    {Fact::kLteSamples, K_LTE_RSRP_RSRQ_SINR, kMeasurement, kEachSecond, encode<KCellularLteRsrpRsrqSinr>},
-    {Fact::kLteTransmitPower, K_LTE_TX_POWER, kMeasurement, kEachSecond, encode<KCellularLteTxPower>},
-    {Fact::kLteNeighbours, K_LTE_INTRARAT_MEAS, kMeasurement, kEachSecond, encode<KCellularLteNbrEutraCellMeas>},
-    {Fact::kLteInterRatNeighbours, K_LTE_INTERRAT_MEAS, kMeasurement, kEachSecond,
+constexpr std::array<Report, factCount> reportTable{{
+    {Fact::LteConnection, K_LTE_RRC_STATE, state, onChange, encode<KCellularLteRrcState>},
+    {Fact::LteServingCell, K_LTE_SCELL_INFO, state, onChange, encode<KCellularLteScellInfo>},
+    {Fact::LteSelection, K_LTE_SEL_RESEL_INFO, state, onChange, encode<KCellularLteSelReselCellInfo>},
+    {Fact::LteComponentCarriers, K_LTE_COMPCARR_INFO, state, onChange, encode<KCellularLteComponentCarrierInfo>},
+    {Fact::LteAggregation, K_LTE_CA_STATUS, state, onChange, encode<KCellularLteCarrierAggregationStatus>},
+    {Fact::LteDrx, K_LTE_CDRX_CONFIG, state, onChange, encode<KCellularLteCdrxConfig>},
+    {Fact::UmtsConnection, K_UMTS_RRC_STATE, state, onChange, encode<KCellularWcdmaRrcConnectionState>},
+    {Fact::UmtsServingCell, K_UMTS_SCELL_INFO, state, onChange, encode<KCellularWcdmaCellInfo>},
+    {Fact::UmtsSelection, K_UMTS_SEL_RESEL_INFO, state, onChange, encode<KCellularWcdmaSelReselCellInfo>},
+    {Fact::UmtsConfiguration, K_UMTS_RRC_CONFIG, state, onChange, encode<KCellularWcdmaRrcConfiguration>},
+    {Fact::GsmServingCell, K_GSM_SCELL_INFO, state, onChange, encode<KCellularGsmScellInfo>},
+    {Fact::GsmIdleConfiguration, K_GSM_IDLE_CONFIG, state, onChange, encode<KCellularGsmIdleConfig>},
+    {Fact::GsmPacketConfiguration, K_GSM_GPRS_CONFIG, state, onChange, encode<KCellularGsmGprsConfig>},
+    {Fact::LteSamples, K_LTE_RSRP_RSRQ_SINR, measurement, eachSecond, encode<KCellularLteRsrpRsrqSinr>},
+    {Fact::LteTransmitPower, K_LTE_TX_POWER, measurement, eachSecond, encode<KCellularLteTxPower>},
+    {Fact::LteNeighbours, K_LTE_INTRARAT_MEAS, measurement, eachSecond, encode<KCellularLteNbrEutraCellMeas>},
+    {Fact::LteInterRatNeighbours, K_LTE_INTERRAT_MEAS, measurement, eachSecond,
      encode<KCellularLteNbrInterRatCellMeas>},
-    {Fact::kUmtsServingMeasurement, K_UMTS_SCELL_MEAS, kMeasurement, kEachSecond,
-     encode<KCellularWcdmaScellMeasurement>},
-    {Fact::kUmtsTransmitPower, K_UMTS_TX_POWER, kMeasurement, kEachSecond, encode<KCellularWcdmaTxPower>},
-    {Fact::kUmtsNeighbours, K_UMTS_NCELL_MEAS, kMeasurement, kEachSecond, encode<KCellularWcdmaNbrCellMeas>},
-    {Fact::kGsmIdleMeasurement, K_GSM_IDLE_SCELL_MEAS, kMeasurement, kEachSecond,
+    {Fact::UmtsServingMeasurement, K_UMTS_SCELL_MEAS, measurement, eachSecond, encode<KCellularWcdmaScellMeasurement>},
+    {Fact::UmtsTransmitPower, K_UMTS_TX_POWER, measurement, eachSecond, encode<KCellularWcdmaTxPower>},
+    {Fact::UmtsNeighbours, K_UMTS_NCELL_MEAS, measurement, eachSecond, encode<KCellularWcdmaNbrCellMeas>},
+    {Fact::GsmIdleMeasurement, K_GSM_IDLE_SCELL_MEAS, measurement, eachSecond,
      encode<KCellularGsmIdleScellMeasurement>},
-    {Fact::kGsmDedicatedMeasurement, K_GSM_CS_RF_MEAS, kMeasurement, kEachSecond, encode<KCellularGsmCsRfMeasurement>},
-    {Fact::kGsmNeighbours, K_GSM_NCELL_MEAS, kMeasurement, kEachSecond, encode<KCellularGsmGrrEventMeasCr>},
-    {Fact::kEpsContext, K_LTE_EMM_CTXT, kState, kOnChange, encode<KCellularEmmContext>},
-    {Fact::kGprsContext, K_CELLULAR_GMM_CTXT, kState, kOnChange, encode<KCellularGmmContext>},
-    {Fact::kMobilityContext, K_CELLULAR_MM_CTXT, kState, kOnChange, encode<KCellularMmContext>},
-    {Fact::kMobilityCommon, K_CELLULAR_MM_INFO, kState, kOnChange, encode<KCellularMmCommonInfo>},
-    {Fact::kBearers, K_CELLULAR_ACTIVE_BEARER, kState, kOnChange, encode<KCellularActivatedBearerContexts>},
-    {Fact::kSimFiles, K_SIM_FILE_INFO, kState, kOnChange, encode<KCellularSimCardFiles>},
+    {Fact::GsmDedicatedMeasurement, K_GSM_CS_RF_MEAS, measurement, eachSecond, encode<KCellularGsmCsRfMeasurement>},
+    {Fact::GsmNeighbours, K_GSM_NCELL_MEAS, measurement, eachSecond, encode<KCellularGsmGrrEventMeasCr>},
+    {Fact::EpsContext, K_LTE_EMM_CTXT, state, onChange, encode<KCellularEmmContext>},
+    {Fact::GprsContext, K_CELLULAR_GMM_CTXT, state, onChange, encode<KCellularGmmContext>},
+    {Fact::MobilityContext, K_CELLULAR_MM_CTXT, state, onChange, encode<KCellularMmContext>},
+    {Fact::MobilityCommon, K_CELLULAR_MM_INFO, state, onChange, encode<KCellularMmCommonInfo>},
+    {Fact::Bearers, K_CELLULAR_ACTIVE_BEARER, state, onChange, encode<KCellularActivatedBearerContexts>},
+    {Fact::SimFiles, K_SIM_FILE_INFO, state, onChange, encode<KCellularSimCardFiles>},
 }};
 
 consteval bool standInTheFactsOrder() {
-  for (std::size_t i = 0; i < kReports.size(); ++i) {
-    if (kReports[i].fact != static_cast<Fact>(i)) return false;
+  for (std::size_t i = 0; i < reportTable.size(); ++i) {
+    if (reportTable[i].fact != static_cast<Fact>(i)) return false;
   }
   return true;
 }
@@ -70,8 +69,8 @@ static_assert(standInTheFactsOrder());
 
 }  // namespace
 
-std::span<const Report> reports() { return kReports; }
+std::span<const Report> reports() { return reportTable; }
 
-const Report& reportOf(Fact fact) { return kReports[static_cast<std::size_t>(fact)]; }
+const Report& reportOf(Fact fact) { return reportTable[static_cast<std::size_t>(fact)]; }
 
 }  // namespace probeview::scenario

@@ -15,7 +15,7 @@
 namespace probeview::scenario {
 
 // A measurement is news each time that it is made; a state is news when it changes, and stays true in between.
-enum class Nature : std::uint8_t { kState, kMeasurement };
+enum class Nature : std::uint8_t { State, Measurement };
 
 struct Report {
   Fact fact;

@@ -21,13 +21,13 @@ using std::chrono::milliseconds;
 using std::chrono::nanoseconds;
 
 // How long the source sleeps at most and at least; in between, as long as the shortest period that anybody wants.
-constexpr Milliseconds kLongestSleep = 100, kShortestSleep = kStep;
+constexpr Milliseconds longestSleep = 100, shortestSleep = stepTime;
 // A machine that was stopped for longer than this does not drive all the way that it has missed, nor does a source that
 // rested for as much of simulated time.
-constexpr milliseconds kMostToCatchUp{5000};
+constexpr milliseconds mostToCatchUp{5000};
 // The time of day is followed when it jumps by more than this, as when a phone learns what time it is; a clock that is
 // only drawn along slowly comes to no more in hours.
-constexpr milliseconds kLargestDrift{1000};
+constexpr milliseconds largestDrift{1000};
 
 class ScenarioSource final : public MetricSource {
  public:
@@ -84,7 +84,7 @@ class ScenarioSource final : public MetricSource {
     const Facts::Entry& fact = story_->facts()[found->fact];
     if (fact.learnt < 0) return false;
     if (!listening_) anchor();  // while the drive rests, now is the time of day
-    const bool isSoNow = fact.holds && found->nature == Nature::kState;
+    const bool isSoNow = fact.holds && found->nature == Nature::State;
     emit(*found, schedule_.tellAs(*found, isSoNow ? story_->now() : fact.learnt));
     return true;
   }
@@ -109,30 +109,30 @@ class ScenarioSource final : public MetricSource {
     timer_.reset();
     if (!listening_ || !schedule_.wantsAnything()) return;
     const Milliseconds sleep =
-        std::clamp(schedule_.shortestPeriod().value_or(kLongestSleep), kShortestSleep, kLongestSleep);
+        std::clamp(schedule_.shortestPeriod().value_or(longestSleep), shortestSleep, longestSleep);
     timer_ = scheduler_->every(milliseconds(sleep), [this] { turn(); });
   }
 
   // Drives to where it is by now, also after a rest without a timer; the last of a long way is enough for that.
   void driveOn() {
-    const milliseconds most(static_cast<Milliseconds>(static_cast<double>(kMostToCatchUp.count()) / speed_));
+    const milliseconds most(static_cast<Milliseconds>(static_cast<double>(mostToCatchUp.count()) / speed_));
     if (!timer_ && clock_->monotonicTime() - lastTurn_ > most) anchor(most);
     turn();
   }
 
   void turn() {
     const nanoseconds now = clock_->monotonicTime();
-    if (const milliseconds jump = wallOffset() - wallOffset_; jump > kLargestDrift || jump < -kLargestDrift) {
+    if (const milliseconds jump = wallOffset() - wallOffset_; jump > largestDrift || jump < -largestDrift) {
       anchorWall_ += jump;
       wallOffset_ += jump;
     }
-    if (now - std::exchange(lastTurn_, now) > kMostToCatchUp) {
+    if (now - std::exchange(lastTurn_, now) > mostToCatchUp) {
       anchor();
       return;
     }
     const double elapsed = std::chrono::duration<double, std::milli>(now - anchorMonotonic_).count();
     const Milliseconds until = anchorSimulated_ + static_cast<Milliseconds>(elapsed * speed_);
-    while (story_->now() + kStep <= until) {
+    while (story_->now() + stepTime <= until) {
       story_->advance();
       // That a technology has been left is told before what serves instead.
       tell(true);
@@ -188,19 +188,19 @@ std::unique_ptr<Story> drive(std::uint64_t seed) {
   return std::make_unique<PhoneStory>(makeWorld(seed), seed);
 }
 
-constexpr Milliseconds kTwentyTimesASecond = 50;
+constexpr Milliseconds twentyTimesASecond = 50;
 
-const std::array<Scenario, 5> kScenarios{{
+const std::array<Scenario, 5> scenarios{{
     {"city", drive<cityWorld>, std::nullopt},
     {"highway", drive<highwayWorld>, std::nullopt},
     {"indoor", drive<indoorWorld>, std::nullopt},
-    {"soak", drive<cityWorld>, kTwentyTimesASecond},
+    {"soak", drive<cityWorld>, twentyTimesASecond},
     {"edges", [](std::uint64_t) -> std::unique_ptr<Story> { return std::make_unique<EdgesStory>(); }, std::nullopt},
 }};
 
 std::string names() {
   std::string text;
-  for (const Scenario& scenario : kScenarios) {
+  for (const Scenario& scenario : scenarios) {
     if (!text.empty()) text += ", ";
     text += scenario.name;
   }
@@ -256,7 +256,7 @@ SourceResult makeScenarioSource(std::string_view arguments) {
     }
     if (std::string error = readOption(item, options); !error.empty()) return {nullptr, std::move(error)};
   }
-  for (const Scenario& scenario : kScenarios) {
+  for (const Scenario& scenario : scenarios) {
     if (scenario.name != options.name) continue;
     const std::uint64_t seed = options.seed.value_or(1);
     return {std::make_unique<ScenarioSource>(scenario.name, scenario.make(seed), options.speed.value_or(1),

@@ -9,10 +9,10 @@ namespace {
 
 using Bytes = std::vector<std::uint8_t>;
 
-constexpr std::string_view kImsi = "001010123456789";
+constexpr std::string_view imsiDigits = "001010123456789";
 // 89 for telecommunications, country 001, issuer 01, an account number; the check digit follows (ITU-T E.118).
-constexpr std::string_view kCardNumber = "899990100000000001";
-constexpr std::uint8_t kNothing = 0xFF;
+constexpr std::string_view cardNumberDigits = "899990100000000001";
+constexpr std::uint8_t unusedByte = 0xFF;
 
 // Two digits to a byte, the first in the low half; a missing last one is all ones.
 Bytes swappedDigits(std::string_view digits) {
@@ -40,15 +40,15 @@ void append(Bytes& bytes, std::uint64_t number, unsigned count) {
   while (count-- > 0) bytes.push_back(static_cast<std::uint8_t>(number >> (8 * count)));
 }
 
-void appendPlmn(Bytes& bytes, std::uint32_t networkCode = kNetworkCode) {
-  for (const std::uint8_t byte : encodedPlmn(networkCode)) bytes.push_back(byte);
+void appendPlmn(Bytes& bytes, std::uint32_t code = networkCode) {
+  for (const std::uint8_t byte : encodedPlmn(code)) bytes.push_back(byte);
 }
 
 Bytes cardNumber() {
-  std::string number(kCardNumber);
+  std::string number(cardNumberDigits);
   number += luhnDigit(number);
   Bytes bytes = swappedDigits(number);
-  bytes.resize(10, kNothing);
+  bytes.resize(10, unusedByte);
   return bytes;
 }
 
@@ -60,7 +60,7 @@ Bytes imsi() {
 }
 
 // Normal operation, and how many digits the mobile network code has (31.102, 4.2.18).
-Bytes administrativeData() { return {0x00, 0x00, 0x00, kNetworkCodeDigits}; }
+Bytes administrativeData() { return {0x00, 0x00, 0x00, networkCodeDigits}; }
 
 // Services that the card offers, bit 1 of byte 1 being service 1 (31.102, 4.2.8).
 Bytes serviceTable() {
@@ -74,18 +74,18 @@ Bytes serviceTable() {
 }
 
 Bytes serviceProviderName() {
-  constexpr std::string_view kName = "Test PLMN 1-1";
+  constexpr std::string_view providerName = "Test PLMN 1-1";
   Bytes bytes;
   append(bytes, 0x01, 1);  // shown together with the network's name
-  for (const char letter : kName) bytes.push_back(static_cast<std::uint8_t>(letter));
-  bytes.resize(17, kNothing);
+  for (const char letter : providerName) bytes.push_back(static_cast<std::uint8_t>(letter));
+  bytes.resize(17, unusedByte);
   return bytes;
 }
 
 Bytes forbiddenNetworks() {
   Bytes bytes;
   appendPlmn(bytes, 99);
-  bytes.resize(12, kNothing);
+  bytes.resize(12, unusedByte);
   return bytes;
 }
 
@@ -94,8 +94,8 @@ Bytes location(const MobilityContext& context) {
   append(bytes, context.temporaryIdentity.value_or(0xFFFFFFFF), 4);
   appendPlmn(bytes);
   append(bytes, context.locationArea.value_or(0xFFFE), 2);  // the reserved code of no area (3GPP TS 23.003, 4.1)
-  append(bytes, kNothing, 1);
-  append(bytes, context.update == LocationUpdate::kUpdated ? 0 : 1, 1);
+  append(bytes, unusedByte, 1);
+  append(bytes, context.update == LocationUpdate::Updated ? 0 : 1, 1);
   return bytes;
 }
 
@@ -105,8 +105,8 @@ Bytes packetLocation(const GprsContext& context) {
   append(bytes, 0xFFFFFF, 3);  // the network signs no temporary identities
   appendPlmn(bytes);
   append(bytes, context.locationArea.value_or(0xFFFE), 2);
-  append(bytes, context.locationArea ? context.routingArea : kNothing, 1);
-  append(bytes, context.update == PacketUpdate::kUpdated ? 0 : 1, 1);
+  append(bytes, context.locationArea ? context.routingArea : unusedByte, 1);
+  append(bytes, context.update == PacketUpdate::Updated ? 0 : 1, 1);
   return bytes;
 }
 
@@ -119,28 +119,28 @@ Bytes epsLocation(const EpsContext& context) {
     append(bytes, context.groupCode, 1);
     append(bytes, *context.temporaryIdentity, 4);
   } else {
-    bytes.resize(12, kNothing);
+    bytes.resize(12, unusedByte);
   }
   appendPlmn(bytes);
   append(bytes, context.trackingAreas.empty() ? 0xFFFE : context.trackingAreas.front(), 2);
-  append(bytes, context.update == PacketUpdate::kUpdated ? 0 : 1, 1);
+  append(bytes, context.update == PacketUpdate::Updated ? 0 : 1, 1);
   return bytes;
 }
 
 }  // namespace
 
-std::array<std::uint8_t, 3> encodedPlmn(std::uint32_t networkCode) {
-  const auto tens = networkCode / 10 % 10;
-  const auto ones = networkCode % 10;
+std::array<std::uint8_t, 3> encodedPlmn(std::uint32_t code) {
+  const auto tens = code / 10 % 10;
+  const auto ones = code % 10;
   // Country code 001: digits 0, 0, 1; the filler stands for the third digit of the network code.
   return {0x00, 0xF1, static_cast<std::uint8_t>(ones << 4 | tens)};
 }
 
 std::array<std::uint8_t, 8> encodedImsi() {
   std::array<std::uint8_t, 8> bytes{};
-  constexpr unsigned kOddImsi = 0x9;  // an odd number of digits, and that it is an IMSI
-  bytes[0] = static_cast<std::uint8_t>(static_cast<unsigned>(kImsi[0] - '0') << 4 | kOddImsi);
-  const Bytes rest = swappedDigits(kImsi.substr(1));
+  constexpr unsigned oddImsi = 0x9;  // an odd number of digits, and that it is an IMSI
+  bytes[0] = static_cast<std::uint8_t>(static_cast<unsigned>(imsiDigits[0] - '0') << 4 | oddImsi);
+  const Bytes rest = swappedDigits(imsiDigits.substr(1));
   for (std::size_t i = 0; i < rest.size(); ++i) bytes[i + 1] = rest[i];
   return bytes;
 }

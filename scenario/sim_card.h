@@ -12,8 +12,8 @@
 
 namespace probeview::scenario {
 
-// A PLMN in three bytes (3GPP TS 24.008, 10.5.1.13).
-std::array<std::uint8_t, 3> encodedPlmn(std::uint32_t networkCode = kNetworkCode);
+// The PLMN of a mobile network code, in three bytes (3GPP TS 24.008, 10.5.1.13).
+std::array<std::uint8_t, 3> encodedPlmn(std::uint32_t code = networkCode);
 
 // 001010123456789 as a mobile identity (3GPP TS 24.008, 10.5.1.4) without its length.
 std::array<std::uint8_t, 8> encodedImsi();

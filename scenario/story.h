@@ -13,7 +13,7 @@ class Story {
  public:
   virtual ~Story() = default;
 
-  // One step of kStep; the first one is the beginning.
+  // One step of stepTime; the first one is the beginning.
   virtual void advance() = 0;
   // Negative before the beginning.
   virtual Milliseconds now() const = 0;

@@ -16,13 +16,13 @@ namespace probeview::scenario {
 
 // Ranges of what is reported: RSRP and RSRQ of 3GPP TS 36.133, 9.1.4 and 9.1.7; CPICH RSCP and Ec/No and the power of a
 // UTRA carrier of 25.133, 9.1.1 to 9.1.3; RxLev of 45.008, 8.1.4.
-constexpr double kWeakestRsrp = -140, kStrongestRsrp = -44;
-constexpr double kWorstRsrq = -19.5, kBestRsrq = -3;
-constexpr double kWorstSinr = -20, kBestSinr = 30;
-constexpr double kWeakestRscp = -120, kStrongestRscp = -25;
-constexpr double kWorstEcNo = -24, kBestEcNo = 0;
-constexpr double kWeakestUtraCarrier = -100, kStrongestUtraCarrier = -25;
-constexpr double kWeakestRxLev = -110, kStrongestRxLev = -48;
+constexpr double weakestRsrp = -140, strongestRsrp = -44;
+constexpr double worstRsrq = -19.5, bestRsrq = -3;
+constexpr double worstSinr = -20, bestSinr = 30;
+constexpr double weakestRscp = -120, strongestRscp = -25;
+constexpr double worstEcNo = -24, bestEcNo = 0;
+constexpr double weakestUtraCarrier = -100, strongestUtraCarrier = -25;
+constexpr double weakestRxLev = -110, strongestRxLev = -48;
 
 class Surroundings {
  public:
@@ -58,7 +58,7 @@ class Surroundings {
   std::vector<double> total_;  // by carrier: what is received, per resource block or in the carrier's bandwidth, mW
   std::vector<double> interferers_;            // by carrier: the sum that disturbs, the wanted cell's own part included
   std::vector<std::vector<CellIndex>> cells_;  // by technology
-  std::vector<CellIndex> heard_[kTechnologies];
+  std::vector<CellIndex> heard_[technologyCount];
 };
 
 }  // namespace probeview::scenario

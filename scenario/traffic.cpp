@@ -17,22 +17,22 @@ void Traffic::begin(Activity activity, Milliseconds now, double seconds) {
 }
 
 void Traffic::interrupt(Milliseconds now) {
-  activity_ = Activity::kNone;
+  activity_ = Activity::None;
   next_ = now + fromSeconds(random_.exponential(habits_.secondsBetweenActivities));
 }
 
 void Traffic::fetch(Milliseconds now) {
   mobileTerminated_ = false;
   uplinkBlocks_ = 6;
-  begin(Activity::kDownload, now, 6);
+  begin(Activity::Download, now, 6);
 }
 
 void Traffic::advance(Milliseconds now, bool inService) {
   if (!inService) {
-    if (activity_ != Activity::kNone) interrupt(now);
+    if (activity_ != Activity::None) interrupt(now);
     return;
   }
-  if (activity_ != Activity::kNone) {
+  if (activity_ != Activity::None) {
     if (now >= ends_) interrupt(now);
     return;
   }
@@ -43,20 +43,20 @@ void Traffic::advance(Milliseconds now, bool inService) {
   if (kind < habits_.voiceShare) {
     ++calls_;
     uplinkBlocks_ = 2;
-    begin(Activity::kVoice, now, random_.between(15, 70));
+    begin(Activity::Voice, now, random_.between(15, 70));
   } else if (kind < habits_.voiceShare + habits_.downloadShare) {
-    begin(Activity::kDownload, now, random_.between(8, 45));
+    begin(Activity::Download, now, random_.between(8, 45));
   } else {
     if (random_.chance(0.2)) uplinkBlocks_ = 40;  // pictures on their way up
-    begin(Activity::kBurst, now, random_.between(0.4, 5));
+    begin(Activity::Burst, now, random_.between(0.4, 5));
   }
 }
 
 void Traffic::addTo(Demand& demand) const {
-  demand.voice = activity_ == Activity::kVoice;
-  demand.download = activity_ == Activity::kDownload;
-  demand.data = demand.download || activity_ == Activity::kBurst;
-  if (activity_ == Activity::kNone) return;
+  demand.voice = activity_ == Activity::Voice;
+  demand.download = activity_ == Activity::Download;
+  demand.data = demand.download || activity_ == Activity::Burst;
+  if (activity_ == Activity::None) return;
   demand.mobileTerminated = mobileTerminated_;
   demand.uplinkBlocks = uplinkBlocks_;
 }

@@ -9,7 +9,7 @@
 
 namespace probeview::scenario {
 
-enum class Activity : std::uint8_t { kNone, kBurst, kDownload, kVoice };
+enum class Activity : std::uint8_t { None, Burst, Download, Voice };
 
 // What is asked of the radio at this moment.
 struct Demand {
@@ -45,7 +45,7 @@ class Traffic {
 
   TrafficHabits habits_;
   Random random_;
-  Activity activity_ = Activity::kNone;
+  Activity activity_ = Activity::None;
   bool mobileTerminated_ = false;
   unsigned uplinkBlocks_ = 0;
   unsigned calls_ = 0;

@@ -7,36 +7,36 @@ namespace probeview::scenario {
 namespace {
 
 // How long a connection without data stays in each state (3GPP TS 25.331, 8.5; the network's own timers).
-constexpr Milliseconds kDedicatedInactivity = 2000;
-constexpr Milliseconds kSharedInactivity = 3000;
-constexpr Milliseconds kPagingInactivity = 8000;
-constexpr unsigned kIdleDrxCycle = 1280, kPagingDrxCycle = 640;
-constexpr double kLargestPower = 24, kSmallestPower = -50;  // 3GPP TS 25.101, 6.2.1 and 6.4.3
-constexpr double kOutOfSync = -20;                          // CPICH Ec/No
+constexpr Milliseconds dedicatedInactivity = 2000;
+constexpr Milliseconds sharedInactivity = 3000;
+constexpr Milliseconds pagingInactivity = 8000;
+constexpr unsigned idleDrxCycle = 1280, pagingDrxCycle = 640;
+constexpr double largestPower = 24, smallestPower = -50;  // 3GPP TS 25.101, 6.2.1 and 6.4.3
+constexpr double outOfSyncEcNo = -20;                     // CPICH Ec/No
 
 }  // namespace
 
 void UmtsModem::change(UmtsConnection to, const Circumstances& c) {
   state_.connection = to;
   since_ = c.now;
-  c.facts.learn(Fact::kUmtsConnection, c.now);
+  c.facts.learn(Fact::UmtsConnection, c.now);
   configure(c);
   // What was measured at this very moment is told together with the new state.
-  if (c.facts[Fact::kUmtsServingMeasurement].learnt == c.now) state_.measuredConnected = state_.connectedMode();
-  if (!state_.connected()) c.facts.end(Fact::kUmtsTransmitPower);
+  if (c.facts[Fact::UmtsServingMeasurement].learnt == c.now) state_.measuredConnected = state_.connectedMode();
+  if (!state_.connected()) c.facts.end(Fact::UmtsTransmitPower);
 }
 
 void UmtsModem::configure(const Circumstances& c) {
   std::optional<unsigned> cycle;
-  if (state_.connection == UmtsConnection::kIdle) cycle = kIdleDrxCycle;
-  if (state_.connection == UmtsConnection::kUraPch || state_.connection == UmtsConnection::kCellPch) {
-    cycle = kPagingDrxCycle;
+  if (state_.connection == UmtsConnection::Idle) cycle = idleDrxCycle;
+  if (state_.connection == UmtsConnection::UraPch || state_.connection == UmtsConnection::CellPch) {
+    cycle = pagingDrxCycle;
   }
-  const bool dualCarrier = state_.connection == UmtsConnection::kCellDch && c.demand.download;
+  const bool dualCarrier = state_.connection == UmtsConnection::CellDch && c.demand.download;
   if (cycle == state_.drxCycle && dualCarrier == state_.dualCarrier) return;
   state_.drxCycle = cycle;
   state_.dualCarrier = dualCarrier;
-  c.facts.learn(Fact::kUmtsConfiguration, c.now);
+  c.facts.learn(Fact::UmtsConfiguration, c.now);
 }
 
 void UmtsModem::serve(CellIndex cell, const Circumstances& c) {
@@ -47,8 +47,8 @@ void UmtsModem::serve(CellIndex cell, const Circumstances& c) {
   reselection_.clear();
   bestCell_.clear();
   outbound_.clear();
-  c.facts.learn(Fact::kUmtsServingCell, c.now);
-  c.facts.learn(Fact::kUmtsSelection, c.now);
+  c.facts.learn(Fact::UmtsServingCell, c.now);
+  c.facts.learn(Fact::UmtsSelection, c.now);
   measure(c);
 }
 
@@ -58,21 +58,21 @@ void UmtsModem::enter(CellIndex cell, Manner manner, const Circumstances& c) {
   lastActivity_ = c.now;
   backOff_ = 0;
   serve(cell, c);
-  change(manner == Manner::kHandover ? UmtsConnection::kCellDch : UmtsConnection::kIdle, c);
-  if (manner == Manner::kHandover) control(c);
-  c.facts.learn(Fact::kUmtsConfiguration, c.now);
+  change(manner == Manner::Handover ? UmtsConnection::CellDch : UmtsConnection::Idle, c);
+  if (manner == Manner::Handover) control(c);
+  c.facts.learn(Fact::UmtsConfiguration, c.now);
 }
 
 void UmtsModem::leave(const Circumstances& c) {
-  if (state_.connectedMode()) state_.release = UmtsRelease::kCellChanged;
-  change(UmtsConnection::kInactive, c);
-  for (const Fact fact : {Fact::kUmtsServingCell, Fact::kUmtsTransmitPower, Fact::kUmtsSelection, Fact::kUmtsNeighbours,
-                          Fact::kUmtsConnection, Fact::kUmtsConfiguration}) {
+  if (state_.connectedMode()) state_.release = UmtsRelease::CellChanged;
+  change(UmtsConnection::Inactive, c);
+  for (const Fact fact : {Fact::UmtsServingCell, Fact::UmtsTransmitPower, Fact::UmtsSelection, Fact::UmtsNeighbours,
+                          Fact::UmtsConnection, Fact::UmtsConfiguration}) {
     c.facts.leave(fact);
   }
   // The last measurement may have been told as one of connected mode, and must not stand as if that went on.
   state_.measuredConnected = false;
-  c.facts.leaveWithLastWord(Fact::kUmtsServingMeasurement, c.now);
+  c.facts.leaveWithLastWord(Fact::UmtsServingMeasurement, c.now);
 }
 
 void UmtsModem::measure(const Circumstances& c) {
@@ -82,68 +82,68 @@ void UmtsModem::measure(const Circumstances& c) {
   state_.pilotRatio = c.surroundings.interferenceRatio(serving);
   state_.carrierPower = c.surroundings.carrierPower(serving);
   const double secondAntenna = state_.carrierPower - c.random.between(1, 3);
-  state_.antennaPower = {std::clamp(state_.carrierPower, kWeakestUtraCarrier, kStrongestUtraCarrier),
-                         std::clamp(secondAntenna, kWeakestUtraCarrier, kStrongestUtraCarrier)};
+  state_.antennaPower = {std::clamp(state_.carrierPower, weakestUtraCarrier, strongestUtraCarrier),
+                         std::clamp(secondAntenna, weakestUtraCarrier, strongestUtraCarrier)};
   state_.measuredConnected = state_.connectedMode();
   listAllHeard(c, serving, state_.neighbours);
-  c.facts.learn(Fact::kUmtsServingMeasurement, c.now);
-  c.facts.learn(Fact::kUmtsNeighbours, c.now);
+  c.facts.learn(Fact::UmtsServingMeasurement, c.now);
+  c.facts.learn(Fact::UmtsNeighbours, c.now);
 }
 
 // 3GPP TS 25.331, 8.5.3 and 25.214, 5.1.2: what makes up for the path loss, more for a call than for signalling.
 void UmtsModem::control(const Circumstances& c) {
-  constexpr double kPilotBroadcast = 33;  // the primary CPICH's power without the antenna's gain
-  const double pathLoss = kPilotBroadcast - state_.rscp;
+  constexpr double pilotBroadcast = 33;  // the primary CPICH's power without the antenna's gain
+  const double pathLoss = pilotBroadcast - state_.rscp;
   const double target = c.demand.download ? -104 : c.demand.voice ? -110 : -113;
   state_.transmitPowers.clear();
   for (unsigned i = 0; i < 4; ++i) {
     TransmitPower power;
-    power.shared = std::clamp(target + pathLoss + c.random.between(-1.5, 1.5), kSmallestPower, kLargestPower);
+    power.shared = std::clamp(target + pathLoss + c.random.between(-1.5, 1.5), smallestPower, largestPower);
     power.subframe = i;
     state_.transmitPowers.push_back(power);
   }
-  c.facts.learn(Fact::kUmtsTransmitPower, c.now);
+  c.facts.learn(Fact::UmtsTransmitPower, c.now);
 }
 
 void UmtsModem::release(UmtsRelease cause, const Circumstances& c) {
   state_.release = cause;
-  change(UmtsConnection::kReleasing, c);
-  deadline_ = c.now + 2 * kStep;
+  change(UmtsConnection::Releasing, c);
+  deadline_ = c.now + 2 * stepTime;
 }
 
 std::optional<Departure> UmtsModem::advance(const Circumstances& c) {
   if (!state_.camped()) return std::nullopt;
   if (c.measured) measure(c);
   switch (state_.connection) {
-    case UmtsConnection::kInactive:
+    case UmtsConnection::Inactive:
       return std::nullopt;
-    case UmtsConnection::kIdle:
+    case UmtsConnection::Idle:
       return advanceIdle(c);
-    case UmtsConnection::kEstablishing:
+    case UmtsConnection::Establishing:
       if (c.now >= deadline_) {
-        if (state_.ecNo > kOutOfSync) {
+        if (state_.ecNo > outOfSyncEcNo) {
           const bool dedicated = c.demand.voice || c.demand.download || c.demand.registering;
           lastActivity_ = c.now;
-          change(dedicated ? UmtsConnection::kCellDch : UmtsConnection::kCellFach, c);
+          change(dedicated ? UmtsConnection::CellDch : UmtsConnection::CellFach, c);
           control(c);
         } else {
-          state_.release = UmtsRelease::kOther;
-          change(UmtsConnection::kIdle, c);
+          state_.release = UmtsRelease::Other;
+          change(UmtsConnection::Idle, c);
           backOff_ = c.now + 1000;
         }
       }
       return std::nullopt;
-    case UmtsConnection::kUraPch:
-    case UmtsConnection::kCellPch:
-    case UmtsConnection::kCellFach:
-    case UmtsConnection::kCellDch: {
+    case UmtsConnection::UraPch:
+    case UmtsConnection::CellPch:
+    case UmtsConnection::CellFach:
+    case UmtsConnection::CellDch: {
       if (c.demand.any()) lastActivity_ = c.now;
       if (c.measured) {
         if (state_.connected()) control(c);
-        outOfSync_ = state_.ecNo < kOutOfSync || state_.rscp < UmtsSelection::kQRxLevMin - 3 ? outOfSync_ + 1 : 0;
+        outOfSync_ = state_.ecNo < outOfSyncEcNo || state_.rscp < UmtsSelection::qRxLevMin - 3 ? outOfSync_ + 1 : 0;
         if (outOfSync_ >= 5) {
-          state_.release = UmtsRelease::kLowerLayerFailureDownlink;
-          change(UmtsConnection::kRadioLinkFailure, c);
+          state_.release = UmtsRelease::LowerLayerFailureDownlink;
+          change(UmtsConnection::RadioLinkFailure, c);
           deadline_ = c.now + 400;
           return std::nullopt;
         }
@@ -152,12 +152,12 @@ std::optional<Departure> UmtsModem::advance(const Circumstances& c) {
       advanceChannel(c);
       return std::nullopt;
     }
-    case UmtsConnection::kSignallingReleaseIndicated:
-      if (c.now >= deadline_) release(UmtsRelease::kSignallingConnectionRelease, c);
+    case UmtsConnection::SignallingReleaseIndicated:
+      if (c.now >= deadline_) release(UmtsRelease::SignallingConnectionRelease, c);
       return std::nullopt;
-    case UmtsConnection::kReleasing:
-    case UmtsConnection::kRadioLinkFailure:
-      if (c.now >= deadline_) change(UmtsConnection::kIdle, c);
+    case UmtsConnection::Releasing:
+    case UmtsConnection::RadioLinkFailure:
+      if (c.now >= deadline_) change(UmtsConnection::Idle, c);
       return std::nullopt;
   }
   return std::nullopt;
@@ -166,41 +166,41 @@ std::optional<Departure> UmtsModem::advance(const Circumstances& c) {
 std::optional<CellIndex> UmtsModem::reselectionCandidate(const Circumstances& c) const {
   const CellIndex serving = *state_.serving;
   const bool unsuitable = c.forbidden.knownForbidden(serving);
-  if (const auto cell = strongestAllowed(c, Technology::kLte, UmtsSelection::kLteHigh)) return cell;
-  for (const CellIndex cell : c.surroundings.heard(Technology::kUmts)) {
+  if (const auto cell = strongestAllowed(c, Technology::Lte, UmtsSelection::lteHigh)) return cell;
+  for (const CellIndex cell : c.surroundings.heard(Technology::Umts)) {
     if (cell == serving || c.forbidden.knownForbidden(cell)) continue;
-    if (unsuitable || c.surroundings.strength(cell) > state_.rscp + UmtsSelection::kHysteresis) return cell;
+    if (unsuitable || c.surroundings.strength(cell) > state_.rscp + UmtsSelection::hysteresis) return cell;
     break;
   }
-  if (unsuitable || state_.rscp < UmtsSelection::kServingLow) {
-    return strongestAllowed(c, Technology::kGsm, unsuitable ? GsmSelection::kRxLevAccessMin : UmtsSelection::kGsmLow);
+  if (unsuitable || state_.rscp < UmtsSelection::servingLow) {
+    return strongestAllowed(c, Technology::Gsm, unsuitable ? GsmSelection::rxLevAccessMin : UmtsSelection::gsmLow);
   }
   return std::nullopt;
 }
 
 std::optional<Departure> UmtsModem::advanceIdle(const Circumstances& c) {
   if (c.measured) {
-    const bool failing = state_.rscp <= UmtsSelection::kQRxLevMin || state_.ecNo < UmtsSelection::kQQualMin - 3;
+    const bool failing = state_.rscp <= UmtsSelection::qRxLevMin || state_.ecNo < UmtsSelection::qQualMin - 3;
     if (!failing) {
       cellFailingSince_ = -1;
     } else if (cellFailingSince_ < 0) {
       cellFailingSince_ = c.now;
     }
     std::optional<CellIndex> target;
-    Milliseconds patience = c.firstSearch ? 0 : UmtsSelection::kReselectionTime;
+    Milliseconds patience = c.firstSearch ? 0 : UmtsSelection::reselectionTime;
     if (cellFailingSince_ >= 0 && c.now - cellFailingSince_ >= 1200) {
       patience = 0;
-      target = strongestAllowed(c, Technology::kLte, LteSelection::kQRxLevMin);
-      if (!target) target = strongestAllowed(c, Technology::kUmts, UmtsSelection::kQRxLevMin);
+      target = strongestAllowed(c, Technology::Lte, LteSelection::qRxLevMin);
+      if (!target) target = strongestAllowed(c, Technology::Umts, UmtsSelection::qRxLevMin);
       if (!target || target == state_.serving) {
-        target = strongestAllowed(c, Technology::kGsm, GsmSelection::kRxLevAccessMin);
+        target = strongestAllowed(c, Technology::Gsm, GsmSelection::rxLevAccessMin);
       }
       lost_ = !target && c.now - cellFailingSince_ >= 3000;
     } else if (c.mayLeave) {
       target = reselectionCandidate(c);
     }
     if (reselection_.holds(target, c.now, patience)) {
-      if (network_.technologyOf(*target) != Technology::kUmts) return Departure{*target, Manner::kReselection};
+      if (network_.technologyOf(*target) != Technology::Umts) return Departure{*target, Manner::Reselection};
       serve(*target, c);
       return std::nullopt;
     }
@@ -209,17 +209,17 @@ std::optional<Departure> UmtsModem::advanceIdle(const Circumstances& c) {
   state_.release.reset();
   if (c.demand.voice) {
     state_.establishment =
-        c.demand.mobileTerminated ? UmtsEstablishment::kTerminatingCall : UmtsEstablishment::kOriginatingCall;
+        c.demand.mobileTerminated ? UmtsEstablishment::TerminatingCall : UmtsEstablishment::OriginatingCall;
   } else if (c.demand.registering) {
-    state_.establishment = UmtsEstablishment::kRegistration;
+    state_.establishment = UmtsEstablishment::Registration;
   } else if (c.demand.mobileTerminated) {
-    state_.establishment = UmtsEstablishment::kTerminatingInteractive;
+    state_.establishment = UmtsEstablishment::TerminatingInteractive;
   } else {
     state_.establishment =
-        c.demand.download ? UmtsEstablishment::kOriginatingInteractive : UmtsEstablishment::kOriginatingBackground;
+        c.demand.download ? UmtsEstablishment::OriginatingInteractive : UmtsEstablishment::OriginatingBackground;
   }
-  change(UmtsConnection::kEstablishing, c);
-  deadline_ = c.now + kStep * c.random.integerBetween(2, 4);
+  change(UmtsConnection::Establishing, c);
+  deadline_ = c.now + stepTime * c.random.integerBetween(2, 4);
   return std::nullopt;
 }
 
@@ -229,70 +229,70 @@ void UmtsModem::advanceChannel(const Circumstances& c) {
   const Milliseconds quiet = c.now - lastActivity_;
   const Milliseconds here = c.now - since_;
   switch (state_.connection) {
-    case UmtsConnection::kCellDch:
+    case UmtsConnection::CellDch:
       configure(c);
       // What was only for signalling is released as soon as all has been said.
-      if (state_.establishment == UmtsEstablishment::kRegistration && !c.demand.any()) {
-        release(UmtsRelease::kNormal, c);
+      if (state_.establishment == UmtsEstablishment::Registration && !c.demand.any()) {
+        release(UmtsRelease::Normal, c);
         return;
       }
-      if (quiet >= kDedicatedInactivity) change(UmtsConnection::kCellFach, c);
+      if (quiet >= dedicatedInactivity) change(UmtsConnection::CellFach, c);
       return;
-    case UmtsConnection::kCellFach:
+    case UmtsConnection::CellFach:
       if (wide) {
-        change(UmtsConnection::kCellDch, c);
-      } else if (quiet >= kDedicatedInactivity + kSharedInactivity) {
-        change(c.random.chance(0.5) ? UmtsConnection::kUraPch : UmtsConnection::kCellPch, c);
+        change(UmtsConnection::CellDch, c);
+      } else if (quiet >= dedicatedInactivity + sharedInactivity) {
+        change(c.random.chance(0.5) ? UmtsConnection::UraPch : UmtsConnection::CellPch, c);
       }
       return;
-    case UmtsConnection::kUraPch:
-    case UmtsConnection::kCellPch:
+    case UmtsConnection::UraPch:
+    case UmtsConnection::CellPch:
       if (c.demand.any()) {
-        change(UmtsConnection::kCellFach, c);
+        change(UmtsConnection::CellFach, c);
         control(c);
-      } else if (here >= kPagingInactivity) {
+      } else if (here >= pagingInactivity) {
         // Either the network has had enough, or the phone says that it has nothing more to send (25.331, 8.1.14).
         if (c.random.chance(0.5)) {
-          release(UmtsRelease::kNormal, c);
+          release(UmtsRelease::Normal, c);
         } else {
-          change(UmtsConnection::kSignallingReleaseIndicated, c);
-          deadline_ = c.now + 3 * kStep;
+          change(UmtsConnection::SignallingReleaseIndicated, c);
+          deadline_ = c.now + 3 * stepTime;
         }
       }
       return;
-    case UmtsConnection::kInactive:
-    case UmtsConnection::kIdle:
-    case UmtsConnection::kEstablishing:
-    case UmtsConnection::kReleasing:
-    case UmtsConnection::kRadioLinkFailure:
-    case UmtsConnection::kSignallingReleaseIndicated:
+    case UmtsConnection::Inactive:
+    case UmtsConnection::Idle:
+    case UmtsConnection::Establishing:
+    case UmtsConnection::Releasing:
+    case UmtsConnection::RadioLinkFailure:
+    case UmtsConnection::SignallingReleaseIndicated:
       return;
   }
 }
 
 std::optional<Departure> UmtsModem::changeCell(const Circumstances& c) {
   std::optional<CellIndex> better;
-  for (const CellIndex cell : c.surroundings.heard(Technology::kUmts)) {
+  for (const CellIndex cell : c.surroundings.heard(Technology::Umts)) {
     if (cell == state_.serving || network_.cells[cell].areaCode == network_.forbiddenAreaCode) continue;
-    if (c.surroundings.strength(cell) > state_.rscp + UmtsSelection::kHysteresis) better = cell;
+    if (c.surroundings.strength(cell) > state_.rscp + UmtsSelection::hysteresis) better = cell;
     break;
   }
-  if (bestCell_.holds(better, c.now, UmtsSelection::kTimeToTrigger)) {
+  if (bestCell_.holds(better, c.now, UmtsSelection::timeToTrigger)) {
     serve(*better, c);
     return std::nullopt;
   }
   if (!c.mayLeave) return std::nullopt;
   // A call goes down to GSM when UMTS gets thin; data goes up to LTE as soon as there is some again.
   std::optional<CellIndex> target;
-  Milliseconds patience = UmtsSelection::kTimeToTrigger;
-  Manner manner = Manner::kHandover;
-  if (state_.rscp < UmtsSelection::kServingLow) {
-    target = strongestAllowed(c, Technology::kGsm, UmtsSelection::kGsmLow);
-    if (!c.demand.voice) manner = Manner::kRedirection;
+  Milliseconds patience = UmtsSelection::timeToTrigger;
+  Manner manner = Manner::Handover;
+  if (state_.rscp < UmtsSelection::servingLow) {
+    target = strongestAllowed(c, Technology::Gsm, UmtsSelection::gsmLow);
+    if (!c.demand.voice) manner = Manner::Redirection;
   } else if (!c.demand.voice) {
-    target = strongestAllowed(c, Technology::kLte, UmtsSelection::kLteHigh);
-    patience = UmtsSelection::kToLteTime;
-    if (!state_.connected()) manner = Manner::kReselection;
+    target = strongestAllowed(c, Technology::Lte, UmtsSelection::lteHigh);
+    patience = UmtsSelection::toLteTime;
+    if (!state_.connected()) manner = Manner::Reselection;
   }
   if (!outbound_.holds(target, c.now, patience)) return std::nullopt;
   return Departure{*target, manner};

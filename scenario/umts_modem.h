@@ -13,38 +13,38 @@ namespace probeview::scenario {
 
 // The numbers are those of the metric service.
 enum class UmtsConnection : std::int32_t {
-  kInactive = 1,
-  kIdle = 2,
-  kEstablishing = 3,
-  kUraPch = 4,
-  kCellPch = 5,
-  kCellFach = 6,
-  kCellDch = 7,
-  kReleasing = 8,
-  kRadioLinkFailure = 9,
-  kSignallingReleaseIndicated = 10,
+  Inactive = 1,
+  Idle = 2,
+  Establishing = 3,
+  UraPch = 4,
+  CellPch = 5,
+  CellFach = 6,
+  CellDch = 7,
+  Releasing = 8,
+  RadioLinkFailure = 9,
+  SignallingReleaseIndicated = 10,
 };
 
 enum class UmtsEstablishment : std::int32_t {
-  kOriginatingCall = 0,
-  kOriginatingInteractive = 2,
-  kOriginatingBackground = 3,
-  kTerminatingCall = 5,
-  kTerminatingInteractive = 7,
-  kInterRatReselection = 10,
-  kRegistration = 12,
+  OriginatingCall = 0,
+  OriginatingInteractive = 2,
+  OriginatingBackground = 3,
+  TerminatingCall = 5,
+  TerminatingInteractive = 7,
+  InterRatReselection = 10,
+  Registration = 12,
 };
 
 enum class UmtsRelease : std::int32_t {
-  kOther = 0,
-  kNormal = 4,
-  kCellChanged = 6,
-  kSignallingConnectionRelease = 10,
-  kLowerLayerFailureDownlink = 13,
+  Other = 0,
+  Normal = 4,
+  CellChanged = 6,
+  SignallingConnectionRelease = 10,
+  LowerLayerFailureDownlink = 13,
 };
 
 struct UmtsState {
-  UmtsConnection connection = UmtsConnection::kInactive;
+  UmtsConnection connection = UmtsConnection::Inactive;
   std::optional<UmtsEstablishment> establishment;  // of the present or last connection
   std::optional<UmtsRelease> release;              // of the last connection, until the next one
   std::optional<CellIndex> serving;                // the cell that serves, or the last one that did
@@ -56,13 +56,13 @@ struct UmtsState {
   std::optional<unsigned> drxCycle;  // ms; none while the phone listens all the time
   bool dualCarrier = false;
 
-  bool camped() const { return connection != UmtsConnection::kInactive; }
+  bool camped() const { return connection != UmtsConnection::Inactive; }
   // With a dedicated or shared channel of its own.
-  bool connected() const { return connection == UmtsConnection::kCellFach || connection == UmtsConnection::kCellDch; }
+  bool connected() const { return connection == UmtsConnection::CellFach || connection == UmtsConnection::CellDch; }
   // UTRA RRC connected mode (3GPP TS 25.331, 7): from the establishment of a connection until it has been released,
   // also while the phone only listens for pages.
   bool connectedMode() const {
-    return camped() && connection != UmtsConnection::kIdle && connection != UmtsConnection::kEstablishing;
+    return camped() && connection != UmtsConnection::Idle && connection != UmtsConnection::Establishing;
   }
 };
 

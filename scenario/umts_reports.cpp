@@ -9,11 +9,11 @@ namespace probeview::scenario {
 std::int32_t bandCode(const Carrier& carrier) {
   using Band = KCellularWcdmaCellInfo::WcdmaBand;
   switch (carrier.technology) {
-    case Technology::kGsm:
+    case Technology::Gsm:
       return carrier.band == 1800 ? Band::SYS_BAND_GSM_DCS_1800 : Band::SYS_BAND_GSM_PGSM_900;
-    case Technology::kUmts:
+    case Technology::Umts:
       return Band::SYS_BAND_WCDMA_I_IMT_2000 + static_cast<std::int32_t>(carrier.band) - 1;
-    case Technology::kLte:
+    case Technology::Lte:
       return Band::SYS_BAND_LTE_EUTRAN_BAND1 + static_cast<std::int32_t>(carrier.band) - 1;
   }
   return 0;
@@ -37,14 +37,14 @@ void report(const Phone& phone, KCellularWcdmaCellInfo& message) {
   const CellIndex serving = *phone.umts().serving;
   const Cell& cell = phone.network().cells[serving];
   const Carrier& carrier = phone.network().carrierOf(serving);
-  message.setMcc(kCountryCode);
-  message.setMnc(kNetworkCode);
+  message.setMcc(countryCode);
+  message.setMnc(networkCode);
   message.setLac(cell.areaCode);
   message.setCellId(cell.identity);
   message.setWcdmaBand(bandCode(carrier));
   message.setDlUarfcn(carrier.channel);
   message.setPsc(cell.physicalIdentity);
-  message.setNumMncDigits(kNetworkCodeDigits);
+  message.setNumMncDigits(networkCodeDigits);
   // The older carrier was never fitted for fast uplink.
   message.setHspa(carrier.band == 8 ? KCellularWcdmaCellInfo::Hspa::SYS_HS_IND_HSDPA_SUPP_CELL
                                     : KCellularWcdmaCellInfo::Hspa::SYS_HS_IND_HSDPA_HSUPA_SUPP_CELL);
@@ -79,29 +79,29 @@ void report(const Phone& phone, KCellularWcdmaSelReselCellInfo& message) {
   message.setDuplexMode(KCellularWcdmaSelReselCellInfo::DuplexMode::FDD);
   message.setCellBarred(0);
   message.setFachMeasOccInfoPresent(1);
-  message.setSRxlev(wholeDecibels(umts.rscp - UmtsSelection::kQRxLevMin));
-  message.setSQual(wholeDecibels(umts.ecNo - UmtsSelection::kQQualMin));
-  message.setSIntrasearch(UmtsSelection::kIntraSearch);
-  message.setSIntersearch(UmtsSelection::kInterSearch);
-  message.setSSearchRat(UmtsSelection::kSearchRat);
+  message.setSRxlev(wholeDecibels(umts.rscp - UmtsSelection::qRxLevMin));
+  message.setSQual(wholeDecibels(umts.ecNo - UmtsSelection::qQualMin));
+  message.setSIntrasearch(UmtsSelection::intraSearch);
+  message.setSIntersearch(UmtsSelection::interSearch);
+  message.setSSearchRat(UmtsSelection::searchRat);
   message.setSCellPrio(serving.priority);
   std::set<std::pair<Technology, std::uint32_t>> listed;
   for (const Carrier& carrier : network.carriers) {
     if (!listed.insert({carrier.technology, carrier.channel}).second) continue;
     switch (carrier.technology) {
-      case Technology::kLte: {
+      case Technology::Lte: {
         EutraFreqInfo& info = message.addEutraPrioInfo();
         info.setEarfcn(carrier.channel);
         info.setPrio(carrier.priority);
         break;
       }
-      case Technology::kUmts: {
+      case Technology::Umts: {
         UtraFreqInfo& info = message.addUtraPrioInfo();
         info.setUarfcn(carrier.channel);
         info.setPrio(carrier.priority);
         break;
       }
-      case Technology::kGsm: {
+      case Technology::Gsm: {
         GsmFreqInfo& info = message.addGsmPrioInfo();
         info.setArfcn(carrier.channel);
         info.setPrio(carrier.priority);

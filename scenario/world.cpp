@@ -9,24 +9,24 @@ namespace {
 
 // Radiated power towards the main lobe, in dBm: per resource element from 43 or 46 dBm over the carrier's resource
 // elements, a tenth of 43 dBm for a pilot, all of it for a BCCH; and 15 dB of antenna gain.
-constexpr double kLteWideDbm = 30;    // 20 MHz
-constexpr double kLteNarrowDbm = 30;  // 10 MHz
-constexpr double kPilotDbm = 48;
-constexpr double kBroadcastDbm = 56;
-constexpr double kSmallCell = -25;  // of a small cell, relative to that
+constexpr double lteWideDbm = 30;    // 20 MHz
+constexpr double lteNarrowDbm = 30;  // 10 MHz
+constexpr double pilotDbm = 48;
+constexpr double broadcastDbm = 56;
+constexpr double smallCell = -25;  // of a small cell, relative to that
 
 // 3GPP TS 36.101, table 5.7.3-1; 25.101, 5.4.3; 45.005, 2.
-Carrier lteBand3() { return {Technology::kLte, 1650, 3, 1850.0, kLteWideDbm, 100, 6}; }
-Carrier lteBand7() { return {Technology::kLte, 3150, 7, 2660.0, kLteWideDbm, 100, 7}; }
-Carrier ltePrivate() { return {Technology::kLte, 3425, 7, 2687.5, kLteNarrowDbm, 25, 7}; }
-Carrier lteBand20() { return {Technology::kLte, 6350, 20, 811.0, kLteNarrowDbm, 50, 5}; }
-Carrier umtsBand1() { return {Technology::kUmts, 10662, 1, 2132.4, kPilotDbm, 0, 3}; }
-Carrier umtsBand8() { return {Technology::kUmts, 3011, 8, 942.2, kPilotDbm, 0, 2}; }
+Carrier lteBand3() { return {Technology::Lte, 1650, 3, 1850.0, lteWideDbm, 100, 6}; }
+Carrier lteBand7() { return {Technology::Lte, 3150, 7, 2660.0, lteWideDbm, 100, 7}; }
+Carrier ltePrivate() { return {Technology::Lte, 3425, 7, 2687.5, lteNarrowDbm, 25, 7}; }
+Carrier lteBand20() { return {Technology::Lte, 6350, 20, 811.0, lteNarrowDbm, 50, 5}; }
+Carrier umtsBand1() { return {Technology::Umts, 10662, 1, 2132.4, pilotDbm, 0, 3}; }
+Carrier umtsBand8() { return {Technology::Umts, 3011, 8, 942.2, pilotDbm, 0, 2}; }
 Carrier gsm900(std::uint32_t channel) {
-  return {Technology::kGsm, channel, 900, 935.0 + 0.2 * channel, kBroadcastDbm, 0, 1};
+  return {Technology::Gsm, channel, 900, 935.0 + 0.2 * channel, broadcastDbm, 0, 1};
 }
 Carrier gsm1800(std::uint32_t channel) {
-  return {Technology::kGsm, channel, 1800, 1805.2 + 0.2 * (channel - 512), kBroadcastDbm, 0, 1};
+  return {Technology::Gsm, channel, 1800, 1805.2 + 0.2 * (channel - 512), broadcastDbm, 0, 1};
 }
 
 // Broadcast channels of GSM, three to a site, re-used by every fourth site.
@@ -78,10 +78,10 @@ World cityWorld(std::uint64_t seed) {
       builder.add(plan);
     }
   }
-  builder.add(SitePlan{{2430, 600}, {umts8, gsmUnderpass}, 1, 0, underpass, kSmallCell, 4});
-  builder.add(SitePlan{{720, 1230}, {gsmRavine}, 1, 0, ravine, kSmallCell, 2});
+  builder.add(SitePlan{{2430, 600}, {umts8, gsmUnderpass}, 1, 0, underpass, smallCell, 4});
+  builder.add(SitePlan{{720, 1230}, {gsmRavine}, 1, 0, ravine, smallCell, 2});
   // A private network's small cells beside the road: strong for some seconds, and closed to this phone.
-  builder.add(SitePlan{{2360, 960}, {privateCarrier, umts8}, 1, 0, 0, kSmallCell, 5});
+  builder.add(SitePlan{{2360, 960}, {privateCarrier, umts8}, 1, 0, 0, smallCell, 5});
   network.forbiddenAreaCode = areaCodeOf(5);
   network.voiceAreaCodes = {areaCodeOf(0), areaCodeOf(1)};
 
@@ -112,13 +112,13 @@ World highwayWorld(std::uint64_t seed) {
   const auto umts8 = builder.add(umtsBand8());
   const GsmPlan gsm(builder);
 
-  constexpr double kLength = 60000;
+  constexpr double roadLength = 60000;
   builder.add(Enclosure{{23000, 0}, 500, 60, 90});  // a tunnel into which nothing reaches
   const auto upperValley = builder.add(Enclosure{{42300, 0}, 1600, 300, 45});
   const auto lowerValley = builder.add(Enclosure{{45700, 0}, 1600, 300, 45});
 
   std::size_t number = 0;
-  for (double x = 500; x < kLength; x += 2900) {
+  for (double x = 500; x < roadLength; x += 2900) {
     SitePlan plan;
     plan.place = {x, number % 2 == 0 ? 350.0 : -420.0};
     plan.turnDegrees = 90;
@@ -174,7 +174,7 @@ World indoorWorld(std::uint64_t seed) {
     plan.area = number < 3 ? 0 : 1;
     builder.add(plan);
   }
-  const auto shaft = builder.add(Carrier{Technology::kGsm, 100, 900, 955.0, -6, 0, 1});
+  const auto shaft = builder.add(Carrier{Technology::Gsm, 100, 900, 955.0, -6, 0, 1});
   builder.add(SitePlan{{112, 34}, {shaft}, 1, 0, basement, 0, 0});
   network.voiceAreaCodes = {areaCodeOf(0)};
 

@@ -5,87 +5,87 @@ namespace probeview {
 
 std::string_view nameOf(Rule rule) {
   switch (rule) {
-    case Rule::kTimestampIsTheRecords:
+    case Rule::TimestampIsTheRecords:
       return "a payload's timestamp is its record's time";
-    case Rule::kTimeOfAMetricNeverGoesBack:
+    case Rule::TimeOfAMetricNeverGoesBack:
       return "the time of a metric never goes back";
-    case Rule::kLeavingIsToldBeforeTheNextTechnology:
+    case Rule::LeavingIsToldBeforeTheNextTechnology:
       return "that a technology was left is told before the next one's first state";
-    case Rule::kLeavingIsToldAtTheMomentOfArrival:
+    case Rule::LeavingIsToldAtTheMomentOfArrival:
       return "a technology is left at the moment at which the next one serves";
-    case Rule::kWhatIsLeftIsSilent:
+    case Rule::WhatIsLeftIsSilent:
       return "nothing of a technology that was left is newer than that";
-    case Rule::kLtePreviousStateIsTheOneBefore:
+    case Rule::LtePreviousStateIsTheOneBefore:
       return "an LTE state's previous state is the one before";
-    case Rule::kLteDurationIsExact:
+    case Rule::LteDurationIsExact:
       return "an LTE state's previous duration is exact";
-    case Rule::kLteComesBackFromNull:
+    case Rule::LteComesBackFromNull:
       return "the first LTE state after coming back has NULL and the time away";
-    case Rule::kDrxNamesTheStateThatIs:
+    case Rule::DrxNamesTheStateThatIs:
       return "C-DRX names the RRC state that is";
-    case Rule::kDrxIsConfiguredInConnectedAlone:
+    case Rule::DrxIsConfiguredInConnectedAlone:
       return "C-DRX is configured while connected, and at no other time";
-    case Rule::kLteCellChangesAtOneMoment:
+    case Rule::LteCellChangesAtOneMoment:
       return "cell, selection parameters and carriers of LTE change with one timestamp";
-    case Rule::kLteRanges:
+    case Rule::LteRanges:
       return "LTE values lie within their ranges";
-    case Rule::kLteChannelInBand:
+    case Rule::LteChannelInBand:
       return "an EARFCN lies in its band";
-    case Rule::kLteNeighbourIsNotTheServingCell:
+    case Rule::LteNeighbourIsNotTheServingCell:
       return "the serving LTE cell is no neighbour of its own";
-    case Rule::kLtePowerWhileSending:
+    case Rule::LtePowerWhileSending:
       return "LTE sends while connected alone";
-    case Rule::kCarriersAreThoseOfTheServingCell:
+    case Rule::CarriersAreThoseOfTheServingCell:
       return "the primary carrier is the serving cell's";
-    case Rule::kCarriersAreDistinct:
+    case Rule::CarriersAreDistinct:
       return "component carriers are distinct";
-    case Rule::kSecondaryKeepsItsIndex:
+    case Rule::SecondaryKeepsItsIndex:
       return "a secondary carrier keeps the index with which it was configured";
-    case Rule::kSecondaryNeverNamesThePrimary:
+    case Rule::SecondaryNeverNamesThePrimary:
       return "a secondary carrier never names the primary's EARFCN";
-    case Rule::kSecondaryOnlyWhileConnected:
+    case Rule::SecondaryOnlyWhileConnected:
       return "secondary carriers are configured while connected alone";
-    case Rule::kDeconfiguredHasNoMeasurements:
+    case Rule::DeconfiguredHasNoMeasurements:
       return "a deconfigured secondary carrier has no measurements";
-    case Rule::kDeconfiguredWasConfiguredInThisConnection:
+    case Rule::DeconfiguredWasConfiguredInThisConnection:
       return "a deconfigured secondary carrier does not come back in the next connection";
-    case Rule::kUmtsCellChangesAtOneMoment:
+    case Rule::UmtsCellChangesAtOneMoment:
       return "cell and selection parameters of UMTS change with one timestamp";
-    case Rule::kUmtsRanges:
+    case Rule::UmtsRanges:
       return "UMTS values lie within their ranges";
-    case Rule::kUmtsChannelInBand:
+    case Rule::UmtsChannelInBand:
       return "a UARFCN lies in its band";
-    case Rule::kUmtsNeighbourIsNotTheServingCell:
+    case Rule::UmtsNeighbourIsNotTheServingCell:
       return "the serving UMTS cell is no neighbour of its own";
-    case Rule::kUmtsConnectedModeIsThatOfTheState:
+    case Rule::UmtsConnectedModeIsThatOfTheState:
       return "connected_mode is that of the RRC state (3GPP TS 25.331, 7)";
-    case Rule::kUmtsPowerWhileSending:
+    case Rule::UmtsPowerWhileSending:
       return "UMTS sends in CELL_FACH and CELL_DCH alone";
-    case Rule::kUmtsConfigurationIsOverWhenLeft:
+    case Rule::UmtsConfigurationIsOverWhenLeft:
       return "no UMTS configuration outlives the technology";
-    case Rule::kUmtsMeasurementsEndUnconnected:
+    case Rule::UmtsMeasurementsEndUnconnected:
       return "the last measurement of UMTS says that it is no longer connected";
-    case Rule::kGsmCellChangesAtOneMoment:
+    case Rule::GsmCellChangesAtOneMoment:
       return "cell, idle and packet configuration of GSM change with one timestamp";
-    case Rule::kGsmRanges:
+    case Rule::GsmRanges:
       return "GSM values lie within their ranges";
-    case Rule::kGsmChannelInBand:
+    case Rule::GsmChannelInBand:
       return "an ARFCN lies in its band";
-    case Rule::kGsmNeighbourIsNotTheServingCell:
+    case Rule::GsmNeighbourIsNotTheServingCell:
       return "the serving GSM cell is no neighbour of its own";
-    case Rule::kGsmMeasurementIsThatOfTheMode:
+    case Rule::GsmMeasurementIsThatOfTheMode:
       return "GSM measures as its mode does";
-    case Rule::kGsmWithoutACellIsNotDedicated:
+    case Rule::GsmWithoutACellIsNotDedicated:
       return "GSM that no cell serves has no dedicated channel";
-    case Rule::kMobilityRanges:
+    case Rule::MobilityRanges:
       return "values of mobility management lie within their ranges";
-    case Rule::kTmsiIsTheVisitorRegisters:
+    case Rule::TmsiIsTheVisitorRegisters:
       return "a TMSI never has its two top bits both set (3GPP TS 23.003, 2.4)";
-    case Rule::kPacketTmsiIsTheServingNodes:
+    case Rule::PacketTmsiIsTheServingNodes:
       return "a P-TMSI always has its two top bits set (3GPP TS 23.003, 2.4)";
-    case Rule::kBearersAreDistinct:
+    case Rule::BearersAreDistinct:
       return "bearers are distinct";
-    case Rule::kCount:
+    case Rule::Count:
       break;
   }
   return "?";

@@ -32,7 +32,7 @@ void GsmWatch::see(const MetricRecord& record) {
       const auto before = states_.now();
       servesCell_ = message.hasCellId();
       if (!servesCell_) {
-        findings_.expect(Rule::kGsmWithoutACellIsNotDedicated,
+        findings_.expect(Rule::GsmWithoutACellIsNotDedicated,
                          message.state() == GsmState::NON_DEDICATED_STATE && !message.hasArfcn() && !message.hasLac());
         if (!how_.soak && before == GsmState::DEDICATED_STATE) findings_.reach("GSM > NON_DEDICATED");
         states_.becomes(message.state(), record.time);
@@ -53,10 +53,10 @@ void GsmWatch::see(const MetricRecord& record) {
       stateTime_ = record.time;
       serving_ = cell;
       together_.told(0, record.time);
-      findings_.expect(Rule::kGsmChannelInBand, isArfcnInBand(message.arfcn(), message.gsmBand()));
-      findings_.expectBetween(Rule::kGsmRanges, message.bsic(), 0, 63);
-      findings_.expectBetween(Rule::kGsmRanges, message.lac(), 1, 0xFFFD);
-      findings_.expectBetween(Rule::kGsmRanges, message.cellId(), 0, 0xFFFF);
+      findings_.expect(Rule::GsmChannelInBand, isArfcnInBand(message.arfcn(), message.gsmBand()));
+      findings_.expectBetween(Rule::GsmRanges, message.bsic(), 0, 63);
+      findings_.expectBetween(Rule::GsmRanges, message.lac(), 1, 0xFFFD);
+      findings_.expectBetween(Rule::GsmRanges, message.cellId(), 0, 0xFFFF);
       return;
     }
     case K_GSM_IDLE_CONFIG:
@@ -64,32 +64,32 @@ void GsmWatch::see(const MetricRecord& record) {
     case K_GSM_GPRS_CONFIG: {
       const auto message = decoded<KCellularGsmGprsConfig>(record);
       together_.told(2, record.time);
-      findings_.expectBetween(Rule::kGsmRanges, message.rac(), 0, 255);
-      findings_.expectBetween(Rule::kGsmRanges, message.nco(), 0, 2);
-      findings_.expectBetween(Rule::kGsmRanges, message.nom(), 1, 3);
-      findings_.expectBetween(Rule::kGsmRanges, message.crHyst(), 0, 7);
+      findings_.expectBetween(Rule::GsmRanges, message.rac(), 0, 255);
+      findings_.expectBetween(Rule::GsmRanges, message.nco(), 0, 2);
+      findings_.expectBetween(Rule::GsmRanges, message.nom(), 1, 3);
+      findings_.expectBetween(Rule::GsmRanges, message.crHyst(), 0, 7);
       return;
     }
     case K_GSM_IDLE_SCELL_MEAS: {
       const auto message = decoded<KCellularGsmIdleScellMeasurement>(record);
       if (!how_.soak) {
-        findings_.expect(Rule::kGsmMeasurementIsThatOfTheMode,
+        findings_.expect(Rule::GsmMeasurementIsThatOfTheMode,
                          states_.at(record.time) == GsmState::NON_DEDICATED_STATE && serving_ &&
                              message.scellArfcn() == serving_->first);
       }
-      findings_.expectBetween(Rule::kGsmRanges, message.idleRxlevDBm(), -110, -47);
+      findings_.expectBetween(Rule::GsmRanges, message.idleRxlevDBm(), -110, -47);
       return;
     }
     case K_GSM_CS_RF_MEAS: {
       const auto message = decoded<KCellularGsmCsRfMeasurement>(record);
       if (!how_.soak) {
-        findings_.expect(Rule::kGsmMeasurementIsThatOfTheMode, states_.at(record.time) == GsmState::DEDICATED_STATE &&
-                                                                   serving_ && message.scellArfcn() == serving_->first);
+        findings_.expect(Rule::GsmMeasurementIsThatOfTheMode, states_.at(record.time) == GsmState::DEDICATED_STATE &&
+                                                                  serving_ && message.scellArfcn() == serving_->first);
       }
-      findings_.expectBetween(Rule::kGsmRanges, message.csRxlevSub(), 0, 63);
-      findings_.expectBetween(Rule::kGsmRanges, message.csRxqualSub(), 0, 7);
+      findings_.expectBetween(Rule::GsmRanges, message.csRxlevSub(), 0, 63);
+      findings_.expectBetween(Rule::GsmRanges, message.csRxqualSub(), 0, 7);
       for (std::size_t i = 0; i < message.csTxPwrsCount(); ++i) {
-        findings_.expectBetween(Rule::kGsmRanges, message.csTxPwrAtIndex(i), 5, 33);
+        findings_.expectBetween(Rule::GsmRanges, message.csTxPwrAtIndex(i), 5, 33);
       }
       return;
     }
@@ -101,20 +101,20 @@ void GsmWatch::see(const MetricRecord& record) {
 }
 
 void GsmWatch::settle(Moment time) {
-  if (cellChangedAt_ == time) findings_.expect(Rule::kGsmCellChangesAtOneMoment, together_.allAt(time));
+  if (cellChangedAt_ == time) findings_.expect(Rule::GsmCellChangesAtOneMoment, together_.allAt(time));
 }
 
 void GsmWatch::seeIdleConfiguration(const MetricRecord& record) {
   const auto message = decoded<KCellularGsmIdleConfig>(record);
   together_.told(1, record.time);
-  findings_.expect(Rule::kGsmChannelInBand,
+  findings_.expect(Rule::GsmChannelInBand,
                    isArfcnInBand(message.arfcnBcch(), static_cast<std::int32_t>(message.gsmBand())));
-  findings_.expectBetween(Rule::kGsmRanges, message.radioLinkTimeout(), 0, 15);
-  findings_.expectBetween(Rule::kGsmRanges, message.msTxpwr(), 0, 31);
-  findings_.expectBetween(Rule::kGsmRanges, message.rxAccMin(), 0, 63);
-  findings_.expectBetween(Rule::kGsmRanges, message.bsPaMfrms(), 2, 9);
-  findings_.expectBetween(Rule::kGsmRanges, message.maxRetransCs(), 0, 3);
-  findings_.expectBetween(Rule::kGsmRanges, message.penaltyT(), 0, 31);
+  findings_.expectBetween(Rule::GsmRanges, message.radioLinkTimeout(), 0, 15);
+  findings_.expectBetween(Rule::GsmRanges, message.msTxpwr(), 0, 31);
+  findings_.expectBetween(Rule::GsmRanges, message.rxAccMin(), 0, 63);
+  findings_.expectBetween(Rule::GsmRanges, message.bsPaMfrms(), 2, 9);
+  findings_.expectBetween(Rule::GsmRanges, message.maxRetransCs(), 0, 3);
+  findings_.expectBetween(Rule::GsmRanges, message.penaltyT(), 0, 31);
 }
 
 void GsmWatch::seeNeighbours(const MetricRecord& record) {
@@ -122,19 +122,19 @@ void GsmWatch::seeNeighbours(const MetricRecord& record) {
   std::set<CellName> listed;
   for (const GsmNcellMeas& neighbour : message.gsmNcellMeas()) {
     const CellName cell{neighbour.arfcn(), neighbour.bsic()};
-    findings_.expect(Rule::kGsmNeighbourIsNotTheServingCell, cell != serving_ && listed.insert(cell).second);
-    findings_.expectBetween(Rule::kGsmRanges, neighbour.rxlev(), 0, 63);
+    findings_.expect(Rule::GsmNeighbourIsNotTheServingCell, cell != serving_ && listed.insert(cell).second);
+    findings_.expectBetween(Rule::GsmRanges, neighbour.rxlev(), 0, 63);
   }
   for (const UmtsNcellMeas& neighbour : message.umtsNcellMeas()) {
-    findings_.expectBetween(Rule::kUmtsRanges, neighbour.cpichSc(), 0, 511);
-    findings_.expectBetween(Rule::kUmtsRanges, neighbour.cpichRscp(), 0, 91);
-    findings_.expectBetween(Rule::kUmtsRanges, neighbour.cpichEcn0(), 0, 49);
+    findings_.expectBetween(Rule::UmtsRanges, neighbour.cpichSc(), 0, 511);
+    findings_.expectBetween(Rule::UmtsRanges, neighbour.cpichRscp(), 0, 91);
+    findings_.expectBetween(Rule::UmtsRanges, neighbour.cpichEcn0(), 0, 49);
   }
   for (const LteNcellMeas& neighbour : message.lteNcellMeas()) {
-    findings_.expectBetween(Rule::kLteRanges, neighbour.physicalCellId(), 0, 503);
-    findings_.expectBetween(Rule::kLteRanges, neighbour.rsrp(), 0, 97);
-    findings_.expectBetween(Rule::kLteRanges, neighbour.rsrq(), 0, 34);
-    findings_.expectBetween(Rule::kLteRanges, neighbour.bandwidth(), 0, 5);
+    findings_.expectBetween(Rule::LteRanges, neighbour.physicalCellId(), 0, 503);
+    findings_.expectBetween(Rule::LteRanges, neighbour.rsrp(), 0, 97);
+    findings_.expectBetween(Rule::LteRanges, neighbour.rsrq(), 0, 34);
+    findings_.expectBetween(Rule::LteRanges, neighbour.bandwidth(), 0, 5);
   }
 }
 

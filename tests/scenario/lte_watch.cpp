@@ -12,11 +12,11 @@ namespace {
 using LteState = KCellularLteRrcState::State;
 using SecondaryState = SecondaryComponentCarrier::State;
 
-constexpr std::uint32_t kUplinkOffset = 18000;
+constexpr std::uint32_t uplinkOffset = 18000;
 
 std::string lteStateName(std::int32_t state) {
-  constexpr std::array kNames{"NULL", "IDLE", "ATTEMPTING", "CONNECTED", "ENDING", "GOING_OUTBOUND", "COMING_INBOUND"};
-  return kNames.at(static_cast<std::size_t>(state));
+  constexpr std::array names{"NULL", "IDLE", "ATTEMPTING", "CONNECTED", "ENDING", "GOING_OUTBOUND", "COMING_INBOUND"};
+  return names.at(static_cast<std::size_t>(state));
 }
 
 // 3GPP TS 36.101, table 5.7.3-1: the bands that the made-up networks use.
@@ -67,20 +67,20 @@ void LteWatch::see(const MetricRecord& record) {
 
 void LteWatch::settle(Moment time) {
   const bool connected = states_.now() == LteState::KLTE_RRC_STATE_CONNECTED;
-  if (drxState_) findings_.expect(Rule::kDrxNamesTheStateThatIs, drxState_ == states_.now());
-  if (cellChangedAt_ == time) findings_.expect(Rule::kLteCellChangesAtOneMoment, together_.allAt(time));
+  if (drxState_) findings_.expect(Rule::DrxNamesTheStateThatIs, drxState_ == states_.now());
+  if (cellChangedAt_ == time) findings_.expect(Rule::LteCellChangesAtOneMoment, together_.allAt(time));
   if (!serving_ || carriers_.empty()) return;
-  findings_.expect(Rule::kCarriersAreThoseOfTheServingCell, carriers_.front() == serving_->first);
-  findings_.expect(Rule::kSecondaryOnlyWhileConnected, connected || carriers_.size() == 1);
+  findings_.expect(Rule::CarriersAreThoseOfTheServingCell, carriers_.front() == serving_->first);
+  findings_.expect(Rule::SecondaryOnlyWhileConnected, connected || carriers_.size() == 1);
   if (!how_.everyChange) return;
   std::vector<std::uint32_t> expected{serving_->first};
   for (const Secondary& secondary : secondaries_) {
-    findings_.expect(Rule::kSecondaryNeverNamesThePrimary, secondary.cell.first != serving_->first);
+    findings_.expect(Rule::SecondaryNeverNamesThePrimary, secondary.cell.first != serving_->first);
     if (secondary.state == SecondaryState::SCC_STATE_DECONFIGURED) continue;
-    findings_.expect(Rule::kSecondaryOnlyWhileConnected, connected);
+    findings_.expect(Rule::SecondaryOnlyWhileConnected, connected);
     expected.push_back(secondary.cell.first);
   }
-  findings_.expect(Rule::kCarriersAreDistinct, carriers_ == expected);
+  findings_.expect(Rule::CarriersAreDistinct, carriers_ == expected);
 }
 
 void LteWatch::seeState(const MetricRecord& record) {
@@ -88,10 +88,10 @@ void LteWatch::seeState(const MetricRecord& record) {
   const auto state = message.state();
   const auto before = states_.now();
   if (!how_.soak && before && state != before) {
-    findings_.expect(Rule::kLtePreviousStateIsTheOneBefore, message.prevState() == before);
+    findings_.expect(Rule::LtePreviousStateIsTheOneBefore, message.prevState() == before);
     const bool exact = Moment(message.prevStateDurMs()) == record.time - states_.since();
-    findings_.expect(Rule::kLteDurationIsExact, exact);
-    if (before == LteState::KLTE_RRC_STATE_NULL) findings_.expect(Rule::kLteComesBackFromNull, exact);
+    findings_.expect(Rule::LteDurationIsExact, exact);
+    if (before == LteState::KLTE_RRC_STATE_NULL) findings_.expect(Rule::LteComesBackFromNull, exact);
     findings_.reach("LTE " + lteStateName(*before) + " > " + lteStateName(state));
   }
   if (message.cause() == KCellularLteRrcState::Cause::KLTE_RRC_CAUSE_NO_SERVICE) findings_.reach("LTE without service");
@@ -103,20 +103,20 @@ void LteWatch::seeDrx(const MetricRecord& record) {
   const auto message = decoded<KCellularLteCdrxConfig>(record);
   const bool configured = message.cdrxConfigStatus() != 0;
   drxState_ = message.rrcState();
-  findings_.expectBetween(Rule::kLteRanges, message.cdrxConfigStatus(), 0, 1);
-  findings_.expect(Rule::kDrxIsConfiguredInConnectedAlone,
+  findings_.expectBetween(Rule::LteRanges, message.cdrxConfigStatus(), 0, 1);
+  findings_.expect(Rule::DrxIsConfiguredInConnectedAlone,
                    configured == (message.rrcState() == LteState::KLTE_RRC_STATE_CONNECTED));
   if (!configured) {
-    findings_.expect(Rule::kLteRanges, !message.hasLongDrxCycleMs() && !message.hasShortDrxCycleMs());
+    findings_.expect(Rule::LteRanges, !message.hasLongDrxCycleMs() && !message.hasShortDrxCycleMs());
     return;
   }
   // 3GPP TS 36.331, 6.3.2, DRX-Config: the long cycle is a multiple of the short one.
-  findings_.expectBetween(Rule::kLteRanges, message.onDurationMs(), 1, 200);
-  findings_.expectBetween(Rule::kLteRanges, message.longDrxCycleMs(), 10, 2560);
-  findings_.expectBetween(Rule::kLteRanges, message.shortDrxCycleMs(), 2, 640);
-  findings_.expectBetween(Rule::kLteRanges, message.drxShortCycleNum(), 1, 16);
-  findings_.expectBetween(Rule::kLteRanges, message.transmissionMode(), 1, 10);
-  findings_.expect(Rule::kLteRanges, message.longDrxCycleMs() % message.shortDrxCycleMs() == 0);
+  findings_.expectBetween(Rule::LteRanges, message.onDurationMs(), 1, 200);
+  findings_.expectBetween(Rule::LteRanges, message.longDrxCycleMs(), 10, 2560);
+  findings_.expectBetween(Rule::LteRanges, message.shortDrxCycleMs(), 2, 640);
+  findings_.expectBetween(Rule::LteRanges, message.drxShortCycleNum(), 1, 16);
+  findings_.expectBetween(Rule::LteRanges, message.transmissionMode(), 1, 10);
+  findings_.expect(Rule::LteRanges, message.longDrxCycleMs() % message.shortDrxCycleMs() == 0);
 }
 
 void LteWatch::seeCell(const MetricRecord& record) {
@@ -128,25 +128,25 @@ void LteWatch::seeCell(const MetricRecord& record) {
   serving_ = cell;
   cellChangedAt_ = record.time;
   together_.told(0, record.time);
-  findings_.expect(Rule::kLteChannelInBand, isEarfcnInBand(message.dlFreq(), message.freqBandInd()));
-  findings_.expect(Rule::kLteChannelInBand, message.ulFreq() == message.dlFreq() + kUplinkOffset);
-  findings_.expectBetween(Rule::kLteRanges, message.phyCellId(), 0, 503);
-  findings_.expectBetween(Rule::kLteRanges, message.cellId(), 0, 0x0FFFFFFF);
-  findings_.expectBetween(Rule::kLteRanges, message.trackingAreaCode(), 1, 0xFFFD);
-  findings_.expectBetween(Rule::kLteRanges, message.dlBw(), 4, 80);  // quarter MHz
+  findings_.expect(Rule::LteChannelInBand, isEarfcnInBand(message.dlFreq(), message.freqBandInd()));
+  findings_.expect(Rule::LteChannelInBand, message.ulFreq() == message.dlFreq() + uplinkOffset);
+  findings_.expectBetween(Rule::LteRanges, message.phyCellId(), 0, 503);
+  findings_.expectBetween(Rule::LteRanges, message.cellId(), 0, 0x0FFFFFFF);
+  findings_.expectBetween(Rule::LteRanges, message.trackingAreaCode(), 1, 0xFFFD);
+  findings_.expectBetween(Rule::LteRanges, message.dlBw(), 4, 80);  // quarter MHz
 }
 
 void LteWatch::seeSelection(const MetricRecord& record) {
   const auto message = decoded<KCellularLteSelReselCellInfo>(record);
   together_.told(1, record.time);
-  findings_.expectBetween(Rule::kLteRanges, message.qRxLevMin(), -70, -22);
-  findings_.expectBetween(Rule::kLteRanges, message.qQualMin(), -34, -3);
-  findings_.expectBetween(Rule::kLteRanges, message.priorityOperatingFreq(), 0, 7);
+  findings_.expectBetween(Rule::LteRanges, message.qRxLevMin(), -70, -22);
+  findings_.expectBetween(Rule::LteRanges, message.qQualMin(), -34, -3);
+  findings_.expectBetween(Rule::LteRanges, message.priorityOperatingFreq(), 0, 7);
   for (const NbrEutra& frequency : message.nbrEutras()) {
-    findings_.expect(Rule::kLteChannelInBand, isEarfcnInBand(frequency.earfcn(), frequency.band()));
-    findings_.expect(Rule::kLteNeighbourIsNotTheServingCell, serving_ && frequency.earfcn() != serving_->first);
-    findings_.expectBetween(Rule::kLteRanges, frequency.dlBw(), 0, 5);
-    findings_.expectBetween(Rule::kLteRanges, frequency.priority(), 0, 7);
+    findings_.expect(Rule::LteChannelInBand, isEarfcnInBand(frequency.earfcn(), frequency.band()));
+    findings_.expect(Rule::LteNeighbourIsNotTheServingCell, serving_ && frequency.earfcn() != serving_->first);
+    findings_.expectBetween(Rule::LteRanges, frequency.dlBw(), 0, 5);
+    findings_.expectBetween(Rule::LteRanges, frequency.priority(), 0, 7);
   }
 }
 
@@ -156,9 +156,9 @@ void LteWatch::seeCarriers(const MetricRecord& record) {
   carriers_ = {message.pccEarfcn()};
   if (message.hasScc0Earfcn()) carriers_.push_back(message.scc0Earfcn());
   if (message.hasScc1Earfcn()) carriers_.push_back(message.scc1Earfcn());
-  findings_.expect(Rule::kCarriersAreDistinct,
+  findings_.expect(Rule::CarriersAreDistinct,
                    std::set<std::uint32_t>(carriers_.begin(), carriers_.end()).size() == carriers_.size());
-  findings_.expectBetween(Rule::kLteRanges, message.pccBandwidth(), 0, 5);
+  findings_.expectBetween(Rule::LteRanges, message.pccBandwidth(), 0, 5);
 }
 
 void LteWatch::seeAggregation(const MetricRecord& record) {
@@ -172,70 +172,70 @@ void LteWatch::seeAggregation(const MetricRecord& record) {
       // What has been deconfigured may be configured anew as another one.
       const bool isNew = earlier.state == SecondaryState::SCC_STATE_DECONFIGURED && carrier.state() != earlier.state;
       if (!how_.everyChange || earlier.cell != cell || isNew) continue;
-      findings_.expect(Rule::kSecondaryKeepsItsIndex, carrier.index() == earlier.index);
+      findings_.expect(Rule::SecondaryKeepsItsIndex, carrier.index() == earlier.index);
     }
-    findings_.expect(Rule::kCarriersAreDistinct,
+    findings_.expect(Rule::CarriersAreDistinct,
                      channels.insert(cell.first).second && indices.insert(carrier.index()).second);
     if (!how_.soak) {
-      findings_.expect(Rule::kSecondaryNeverNamesThePrimary, serving_ && cell.first != serving_->first);
+      findings_.expect(Rule::SecondaryNeverNamesThePrimary, serving_ && cell.first != serving_->first);
     }
-    findings_.expect(Rule::kLteChannelInBand, isEarfcnInBand(carrier.dlEarfcn(), carrier.dlRfBand()));
-    findings_.expectBetween(Rule::kLteRanges, carrier.pci(), 0, 503);
-    constexpr std::array kStates{"deconfigured", "deactivated", "activated"};
+    findings_.expect(Rule::LteChannelInBand, isEarfcnInBand(carrier.dlEarfcn(), carrier.dlRfBand()));
+    findings_.expectBetween(Rule::LteRanges, carrier.pci(), 0, 503);
+    constexpr std::array states{"deconfigured", "deactivated", "activated"};
     if (!how_.soak)
-      findings_.reach(std::string("secondary ") + kStates.at(static_cast<std::size_t>(carrier.state())) + " in " +
+      findings_.reach(std::string("secondary ") + states.at(static_cast<std::size_t>(carrier.state())) + " in " +
                       lteStateName(*states_.now()));
     if (carrier.state() == SecondaryState::SCC_STATE_DECONFIGURED) {
-      findings_.expect(Rule::kDeconfiguredHasNoMeasurements,
+      findings_.expect(Rule::DeconfiguredHasNoMeasurements,
                        !carrier.hasRsrp() && !carrier.hasRsrq() && !carrier.hasSnr() && !carrier.hasRssi());
       if (how_.everyChange) {
-        findings_.expect(Rule::kDeconfiguredWasConfiguredInThisConnection, configured_.contains(cell));
+        findings_.expect(Rule::DeconfiguredWasConfiguredInThisConnection, configured_.contains(cell));
       }
       continue;
     }
     configured_.insert(cell);
     if (!how_.soak) {
-      findings_.expect(Rule::kSecondaryOnlyWhileConnected, states_.now() == LteState::KLTE_RRC_STATE_CONNECTED);
+      findings_.expect(Rule::SecondaryOnlyWhileConnected, states_.now() == LteState::KLTE_RRC_STATE_CONNECTED);
     }
-    findings_.expectBetween(Rule::kLteRanges, carrier.rsrp(), -14000, -4400);  // hundredths
-    findings_.expectBetween(Rule::kLteRanges, carrier.rsrq(), -1950, -300);
-    findings_.expectBetween(Rule::kLteRanges, carrier.snr(), -20, 30);
-    findings_.expectBetween(Rule::kLteRanges, carrier.rssi(), carrier.rsrp(), 0);
+    findings_.expectBetween(Rule::LteRanges, carrier.rsrp(), -14000, -4400);  // hundredths
+    findings_.expectBetween(Rule::LteRanges, carrier.rsrq(), -1950, -300);
+    findings_.expectBetween(Rule::LteRanges, carrier.snr(), -20, 30);
+    findings_.expectBetween(Rule::LteRanges, carrier.rssi(), carrier.rsrp(), 0);
   }
 }
 
 void LteWatch::seeSamples(const MetricRecord& record) {
   const auto message = decoded<KCellularLteRsrpRsrqSinr>(record);
   const auto look = [&](const RsrpRsrqSinr& sample) {
-    findings_.expectBetween(Rule::kLteRanges, sample.phyCellId(), 0, 503);
+    findings_.expectBetween(Rule::LteRanges, sample.phyCellId(), 0, 503);
     for (const std::int32_t rsrp : {sample.rsrp0(), sample.rsrp1()}) {
-      findings_.expectBetween(Rule::kLteRanges, rsrp, -140, -44);
+      findings_.expectBetween(Rule::LteRanges, rsrp, -140, -44);
     }
     for (const std::int32_t rsrq : {sample.rsrq0(), sample.rsrq1()}) {
-      findings_.expectBetween(Rule::kLteRanges, rsrq, -20, -3);
+      findings_.expectBetween(Rule::LteRanges, rsrq, -20, -3);
     }
     for (const std::int32_t sinr : {sample.sinr0(), sample.sinr1()}) {
-      findings_.expectBetween(Rule::kLteRanges, sinr, -40, 60);  // half dB
+      findings_.expectBetween(Rule::LteRanges, sinr, -40, 60);  // half dB
     }
-    if (!how_.soak) findings_.expect(Rule::kCarriersAreThoseOfTheServingCell, sample.phyCellId() == serving_->second);
+    if (!how_.soak) findings_.expect(Rule::CarriersAreThoseOfTheServingCell, sample.phyCellId() == serving_->second);
   };
   for (const RsrpRsrqSinr& sample : message.instValues()) look(sample);
   if (message.hasAvgValues()) look(*message.avgValues());
-  findings_.expect(Rule::kLteDurationIsExact, message.durationMs() == message.numSamples() * message.samplePeriodMs() &&
-                                                  message.numSamples() == message.instValuesCount());
+  findings_.expect(Rule::LteDurationIsExact, message.durationMs() == message.numSamples() * message.samplePeriodMs() &&
+                                                 message.numSamples() == message.instValuesCount());
 }
 
 void LteWatch::seePower(const MetricRecord& record) {
   const auto message = decoded<KCellularLteTxPower>(record);
   if (!how_.soak) {
     const auto state = states_.at(record.time);
-    findings_.expect(Rule::kLtePowerWhileSending, state == LteState::KLTE_RRC_STATE_CONNECTED ||
-                                                      state == LteState::KLTE_RRC_STATE_ATMPT_OUTBND_MOBILITY);
+    findings_.expect(Rule::LtePowerWhileSending, state == LteState::KLTE_RRC_STATE_CONNECTED ||
+                                                     state == LteState::KLTE_RRC_STATE_ATMPT_OUTBND_MOBILITY);
   }
   for (const TxPowerInfo& power : message.txPowerInfos()) {
-    if (power.hasPucchTxPower()) findings_.expectBetween(Rule::kLteRanges, power.pucchTxPower(), -40, 23);
-    if (power.hasPuschTxPower()) findings_.expectBetween(Rule::kLteRanges, power.puschTxPower(), -40, 23);
-    findings_.expectBetween(Rule::kLteRanges, power.subframeIndex(), 0, 9);
+    if (power.hasPucchTxPower()) findings_.expectBetween(Rule::LteRanges, power.pucchTxPower(), -40, 23);
+    if (power.hasPuschTxPower()) findings_.expectBetween(Rule::LteRanges, power.puschTxPower(), -40, 23);
+    findings_.expectBetween(Rule::LteRanges, power.subframeIndex(), 0, 9);
   }
 }
 
@@ -244,24 +244,24 @@ void LteWatch::seeNeighbours(const MetricRecord& record) {
   std::set<CellName> listed;
   for (const EgwErrcNbrEutraMeas& neighbour : message.measNbrEutras()) {
     const CellName cell{neighbour.nbrEarfcn(), neighbour.nbrPhysCellId()};
-    findings_.expect(Rule::kLteNeighbourIsNotTheServingCell, cell != serving_ && listed.insert(cell).second);
-    findings_.expect(Rule::kLteChannelInBand, isEarfcnInBand(neighbour.nbrEarfcn(), neighbour.freqBandInd()));
-    findings_.expectBetween(Rule::kLteRanges, neighbour.nbrPhysCellId(), 0, 503);
-    findings_.expectBetween(Rule::kLteRanges, neighbour.nbrRsrp(), 0, 97);
-    findings_.expectBetween(Rule::kLteRanges, neighbour.nbrRsrq(), 0, 34);
+    findings_.expect(Rule::LteNeighbourIsNotTheServingCell, cell != serving_ && listed.insert(cell).second);
+    findings_.expect(Rule::LteChannelInBand, isEarfcnInBand(neighbour.nbrEarfcn(), neighbour.freqBandInd()));
+    findings_.expectBetween(Rule::LteRanges, neighbour.nbrPhysCellId(), 0, 503);
+    findings_.expectBetween(Rule::LteRanges, neighbour.nbrRsrp(), 0, 97);
+    findings_.expectBetween(Rule::LteRanges, neighbour.nbrRsrq(), 0, 34);
   }
 }
 
 void LteWatch::seeOtherNeighbours(const MetricRecord& record) {
   const auto message = decoded<KCellularLteNbrInterRatCellMeas>(record);
   for (const EgwErrcNbrUtraMeas& neighbour : message.measNbrUtras()) {
-    findings_.expectBetween(Rule::kUmtsRanges, neighbour.psc(), 0, 511);
-    findings_.expectBetween(Rule::kUmtsRanges, neighbour.rscp(), -5, 91);
-    findings_.expectBetween(Rule::kUmtsRanges, neighbour.ecno(), 0, 49);
+    findings_.expectBetween(Rule::UmtsRanges, neighbour.psc(), 0, 511);
+    findings_.expectBetween(Rule::UmtsRanges, neighbour.rscp(), -5, 91);
+    findings_.expectBetween(Rule::UmtsRanges, neighbour.ecno(), 0, 49);
   }
   for (const EgwErrcNbrGeranMeas& neighbour : message.measNbrGerans()) {
-    findings_.expectBetween(Rule::kGsmRanges, neighbour.bsic(), 0, 63);
-    findings_.expectBetween(Rule::kGsmRanges, neighbour.rxlev(), 0, 63);
+    findings_.expectBetween(Rule::GsmRanges, neighbour.bsic(), 0, 63);
+    findings_.expectBetween(Rule::GsmRanges, neighbour.rxlev(), 0, 63);
   }
 }
 

@@ -31,8 +31,8 @@ TEST(Random, TheFirstNumberOfAStreamStaysWhatItIs) { EXPECT_EQ(scramble(0), 0xE2
 TEST(Random, DistributionsHaveTheMomentsThatTheyShould) {
   Random random(42, 1);
   double sum = 0, squares = 0, waiting = 0;
-  constexpr int kDraws = 100000;
-  for (int i = 0; i < kDraws; ++i) {
+  constexpr int draws = 100000;
+  for (int i = 0; i < draws; ++i) {
     const double normal = random.normal();
     sum += normal;
     squares += normal * normal;
@@ -43,10 +43,10 @@ TEST(Random, DistributionsHaveTheMomentsThatTheyShould) {
     const double unit = random.unit();
     EXPECT_TRUE(unit >= 0 && unit < 1);
   }
-  EXPECT_NEAR(sum / kDraws, 0, 0.02);
-  EXPECT_NEAR(squares / kDraws, 1, 0.02);
+  EXPECT_NEAR(sum / draws, 0, 0.02);
+  EXPECT_NEAR(squares / draws, 1, 0.02);
   // The mean is 10 less what the limit of three means cuts off: 10 (1 - e^-3).
-  EXPECT_NEAR(waiting / kDraws, 9.5, 0.1);
+  EXPECT_NEAR(waiting / draws, 9.5, 0.1);
 }
 
 TEST(Decibel, AgreesWithTheMathematicsLibrary) {
@@ -98,19 +98,19 @@ TEST(Network, NumbersAreWithinTheirRangesAndCellsTellApart) {
       EXPECT_LE(cell.areaCode, 0xFFFDU);
       EXPECT_GE(cell.areaCode, 1U);
       switch (carrier.technology) {
-        case Technology::kLte:
+        case Technology::Lte:
           EXPECT_LE(cell.physicalIdentity, 503U);
           EXPECT_LT(cell.identity, 1U << 28);
           EXPECT_LE(carrier.channel, 35999U);
           EXPECT_LE(carrier.priority, 7U);
           break;
-        case Technology::kUmts:
+        case Technology::Umts:
           EXPECT_LE(cell.physicalIdentity, 511U);
           EXPECT_LT(cell.identity, 1U << 28);
           // 3GPP TS 25.101, 5.4.2: band VIII counts from 340 MHz on.
           EXPECT_NEAR(carrier.megahertz, carrier.channel / 5.0 + (carrier.band == 8 ? 340 : 0), 1e-6);
           break;
-        case Technology::kGsm:
+        case Technology::Gsm:
           EXPECT_LE(cell.physicalIdentity, 63U);
           EXPECT_LE(cell.identity, 0xFFFFU);
           EXPECT_LE(carrier.channel, 1023U);
@@ -126,7 +126,7 @@ TEST(Network, LteChannelsLieInTheirBands) {
       {3, {1200, 1805, 1949}}, {7, {2750, 2620, 3449}}, {20, {6150, 791, 6449}}};
   for (const auto& make : {cityWorld, highwayWorld, indoorWorld}) {
     for (const Carrier& carrier : make(1).network.carriers) {
-      if (carrier.technology != Technology::kLte) continue;
+      if (carrier.technology != Technology::Lte) continue;
       const auto& [first, megahertz, last] = bands.at(carrier.band);
       EXPECT_TRUE(carrier.channel >= first && carrier.channel <= last);
       EXPECT_NEAR(carrier.megahertz, megahertz + 0.1 * (carrier.channel - first), 1e-6);
@@ -152,13 +152,13 @@ TEST(Network, CellsOfOneCarrierThatShareAPhysicalIdentityAreFarApart) {
 
 TEST(Propagation, IsWeakerFartherAwayAndBehindTheAntenna) {
   NetworkBuilder builder(1);
-  const auto carrier = builder.add({Technology::kLte, 1650, 3, 1850, 30, 100, 6});
+  const auto carrier = builder.add({Technology::Lte, 1650, 3, 1850, 30, 100, 6});
   builder.add(SitePlan{.place = {0, 0}, .carriers = {carrier}, .sectors = 3});
   builder.network().pathLoss.shadowDeviation = 0;
   const Propagation propagation(builder.network(), 1);
   std::vector<double> near(3), far(3);
-  propagation.receive(Technology::kLte, {0, 200}, near);
-  propagation.receive(Technology::kLte, {0, 2000}, far);
+  propagation.receive(Technology::Lte, {0, 200}, near);
+  propagation.receive(Technology::Lte, {0, 2000}, far);
   EXPECT_NEAR(near[0] - far[0], 37.6, 0.01);  // ten times the distance
   EXPECT_NEAR(near[0] - near[1], 20, 0.01);   // 120 degrees off
   // 3GPP TR 36.942, 4.5.2 with the station 15 m above the roofs: 128.1 + 37.6 log10(R) at 2 GHz.
@@ -169,24 +169,24 @@ TEST(Propagation, IsTheSameEachTimeThatOneComesBy) {
   const Network network = cityWorld(1).network;
   const Propagation propagation(network, 1);
   std::vector<double> first(network.cells.size()), second(network.cells.size()), moved(network.cells.size());
-  propagation.receive(Technology::kUmts, {100, 100}, first);
-  propagation.receive(Technology::kUmts, {500, 900}, moved);
-  propagation.receive(Technology::kUmts, {100, 100}, second);
+  propagation.receive(Technology::Umts, {100, 100}, first);
+  propagation.receive(Technology::Umts, {500, 900}, moved);
+  propagation.receive(Technology::Umts, {100, 100}, second);
   EXPECT_EQ(first, second);
   EXPECT_NE(first, moved);
 }
 
 TEST(Propagation, AnEnclosureKeepsOutWhatStandsOutside) {
   NetworkBuilder builder(1);
-  const auto carrier = builder.add({Technology::kGsm, 20, 900, 939, 56, 0, 1});
+  const auto carrier = builder.add({Technology::Gsm, 20, 900, 939, 56, 0, 1});
   const auto inside = builder.add(Enclosure{{1000, 0}, 100, 10, 40});
   builder.add(SitePlan{.place = {800, 0}, .carriers = {carrier}, .sectors = 1});
   builder.add(SitePlan{.place = {1010, 0}, .carriers = {carrier}, .sectors = 1, .enclosure = inside});
   builder.network().pathLoss.shadowDeviation = 0;
   const Propagation propagation(builder.network(), 1);
   std::vector<double> out(2), in(2);
-  propagation.receive(Technology::kGsm, {890, 0}, out);
-  propagation.receive(Technology::kGsm, {920, 0}, in);
+  propagation.receive(Technology::Gsm, {890, 0}, out);
+  propagation.receive(Technology::Gsm, {920, 0}, in);
   EXPECT_GT(out[0] - in[0], 40);
   EXPECT_GT(in[1] - out[1], 40);
 }
@@ -197,7 +197,7 @@ TEST(Surroundings, StayWithinTheRangesThatCanBeReported) {
     Surroundings surroundings(world.network, 3);
     for (int i = 0; i < 500; ++i) {
       world.route.advance(5);
-      for (const Technology technology : {Technology::kGsm, Technology::kUmts, Technology::kLte}) {
+      for (const Technology technology : {Technology::Gsm, Technology::Umts, Technology::Lte}) {
         surroundings.measure(technology, world.route.position(), 0.5);
         double last = 0;
         for (const CellIndex cell : surroundings.heard(technology)) {
@@ -205,17 +205,17 @@ TEST(Surroundings, StayWithinTheRangesThatCanBeReported) {
           EXPECT_LE(strength, last);
           last = strength;
           switch (technology) {
-            case Technology::kLte:
+            case Technology::Lte:
               EXPECT_TRUE(strength >= -140 && strength <= -44) << strength;
               EXPECT_TRUE(surroundings.quality(cell) >= -19.5 && surroundings.quality(cell) <= -3);
               EXPECT_TRUE(surroundings.interferenceRatio(cell) >= -20 && surroundings.interferenceRatio(cell) <= 30);
               EXPECT_LT(strength, surroundings.carrierPower(cell));
               break;
-            case Technology::kUmts:
+            case Technology::Umts:
               EXPECT_TRUE(strength >= -120 && strength <= -25) << strength;
               EXPECT_TRUE(surroundings.quality(cell) >= -24 && surroundings.quality(cell) <= 0);
               break;
-            case Technology::kGsm:
+            case Technology::Gsm:
               EXPECT_TRUE(strength >= -110 && strength <= -48) << strength;
               break;
           }

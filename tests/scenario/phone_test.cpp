@@ -10,7 +10,7 @@
 namespace probeview::scenario {
 namespace {
 
-constexpr Milliseconds kHour = 3600 * 1000;
+constexpr Milliseconds hour = 3600 * 1000;
 
 TEST(Phone, IsSwitchedOnAndLooksThroughAllTechnologiesBeforeItStaysInLte) {
   for (std::uint64_t seed = 1; seed <= 100; ++seed) {
@@ -23,9 +23,9 @@ TEST(Phone, IsSwitchedOnAndLooksThroughAllTechnologiesBeforeItStaysInLte) {
           visited.push_back(*phone.technology());
         }
       }
-      EXPECT_EQ(visited, (std::vector{Technology::kGsm, Technology::kUmts, Technology::kLte})) << "seed " << seed;
+      EXPECT_EQ(visited, (std::vector{Technology::Gsm, Technology::Umts, Technology::Lte})) << "seed " << seed;
       EXPECT_TRUE(phone.registration().eps().registered());
-      for (std::size_t fact = 0; fact < kFacts; ++fact) {
+      for (std::size_t fact = 0; fact < factCount; ++fact) {
         EXPECT_GE(phone.facts()[static_cast<Fact>(fact)].learnt, 0) << "seed " << seed << ", fact " << fact;
       }
     }
@@ -40,31 +40,31 @@ TEST(Phone, HandsOverOnlyWhatHasBeenBetterForTheTimeToTrigger) {
     std::map<CellIndex, Milliseconds> better;
     std::optional<CellIndex> serving;
     bool wasConnected = false;
-    while (phone.now() < kHour / 2) {
+    while (phone.now() < hour / 2) {
       phone.advance();
-      const bool connected = phone.technology() == Technology::kLte && phone.lte().connected();
+      const bool connected = phone.technology() == Technology::Lte && phone.lte().connected();
       std::optional<CellIndex> now;
-      if (phone.technology() == Technology::kLte) now = phone.lte().serving;
+      if (phone.technology() == Technology::Lte) now = phone.lte().serving;
       if (connected && wasConnected && serving && now != serving) {
         ++handovers;
         const auto since = better.find(now.value_or(0));
         ASSERT_NE(since, better.end()) << "at " << phone.now();
-        EXPECT_GE(phone.now() - since->second, LteMobility::kTimeToTrigger) << "at " << phone.now();
+        EXPECT_GE(phone.now() - since->second, LteMobility::timeToTrigger) << "at " << phone.now();
       }
       if (now != serving) better.clear();
       serving = now;
       wasConnected = connected;
-      if (!connected || phone.now() % kMeasurementPeriod != 0) continue;
+      if (!connected || phone.now() % measurementPeriod != 0) continue;
       const Network& network = phone.network();
       const Surroundings& surroundings = phone.surroundings();
       const double own = surroundings.strength(*serving);
       for (CellIndex cell = 0; cell < network.cells.size(); ++cell) {
-        if (network.technologyOf(cell) != Technology::kLte) continue;
+        if (network.technologyOf(cell) != Technology::Lte) continue;
         const double other = surroundings.strength(cell);
         const bool sameCarrier = network.cells[cell].carrier == network.cells[*serving].carrier;
-        const bool holds = sameCarrier ? other > own + LteMobility::kA3Offset + LteMobility::kHysteresis
-                                       : own < LteMobility::kA5Serving - LteMobility::kHysteresis &&
-                                             other > LteMobility::kA5Candidate + LteMobility::kHysteresis;
+        const bool holds = sameCarrier ? other > own + LteMobility::a3Offset + LteMobility::hysteresis
+                                       : own < LteMobility::a5Serving - LteMobility::hysteresis &&
+                                             other > LteMobility::a5Candidate + LteMobility::hysteresis;
         if (!holds) {
           better.erase(cell);
         } else {
@@ -80,9 +80,9 @@ TEST(Phone, SendsStrongerWhereLessArrivesAndNeverMoreThanItCan) {
   Phone phone(cityWorld(1), 1);
   double strongSum = 0, weakSum = 0;
   int strong = 0, weak = 0;
-  while (phone.now() < kHour / 2) {
+  while (phone.now() < hour / 2) {
     phone.advance();
-    if (phone.technology() != Technology::kLte || !phone.lte().connected()) continue;
+    if (phone.technology() != Technology::Lte || !phone.lte().connected()) continue;
     for (const TransmitPower& power : phone.lte().transmitPowers) {
       ASSERT_TRUE(power.control.has_value());
       EXPECT_GE(*power.control, -40);
@@ -104,14 +104,14 @@ TEST(Phone, NeverStaysWhereItIsForbidden) {
   Phone phone(cityWorld(2), 2);
   Milliseconds forbiddenFor = 0, longest = 0;
   bool refused = false;
-  while (phone.now() < kHour) {
+  while (phone.now() < hour) {
     phone.advance();
     std::optional<CellIndex> serving;
-    if (phone.technology() == Technology::kLte) serving = phone.lte().serving;
-    if (phone.technology() == Technology::kUmts) serving = phone.umts().serving;
+    if (phone.technology() == Technology::Lte) serving = phone.lte().serving;
+    if (phone.technology() == Technology::Umts) serving = phone.umts().serving;
     const bool forbidden = serving && phone.registration().knownForbidden(*serving);
     refused |= forbidden;
-    forbiddenFor = forbidden ? forbiddenFor + kStep : 0;
+    forbiddenFor = forbidden ? forbiddenFor + stepTime : 0;
     longest = std::max(longest, forbiddenFor);
   }
   EXPECT_TRUE(refused);
@@ -121,17 +121,17 @@ TEST(Phone, NeverStaysWhereItIsForbidden) {
 TEST(Phone, AddsCarriersForDownloadsAndTakesThemAwayWithTheConnection) {
   Phone phone(cityWorld(1), 1);
   bool activated = false, deactivated = false;
-  while (phone.now() < kHour / 2) {
+  while (phone.now() < hour / 2) {
     phone.advance();
     const LteState& lte = phone.lte();
     for (const SecondaryCarrier& carrier : lte.secondaries) {
-      if (carrier.state == SecondaryState::kDeconfigured) continue;
-      ASSERT_TRUE(phone.technology() == Technology::kLte && lte.connected());
+      if (carrier.state == SecondaryState::Deconfigured) continue;
+      ASSERT_TRUE(phone.technology() == Technology::Lte && lte.connected());
       const Network& network = phone.network();
       EXPECT_EQ(network.cells[carrier.cell].site, network.cells[*lte.serving].site);
       EXPECT_NE(network.cells[carrier.cell].carrier, network.cells[*lte.serving].carrier);
-      activated |= carrier.state == SecondaryState::kActivated;
-      deactivated |= carrier.state == SecondaryState::kDeactivated;
+      activated |= carrier.state == SecondaryState::Activated;
+      deactivated |= carrier.state == SecondaryState::Deactivated;
     }
     EXPECT_LE(lte.secondaries.size(), 2U);
   }
@@ -143,10 +143,10 @@ TEST(Phone, LosesItsLinkNowAndThenAndReestablishesIt) {
   bool failed = false, reestablished = false;
   for (std::uint64_t seed = 1; seed <= 8; ++seed) {
     Phone phone(cityWorld(seed), seed);
-    while (phone.now() < kHour) {
+    while (phone.now() < hour) {
       phone.advance();
-      if (phone.lte().cause != LteCause::kReestablishT310Expired) continue;
-      failed |= phone.lte().connection == LteConnection::kAttemptingConnection;
+      if (phone.lte().cause != LteCause::ReestablishT310Expired) continue;
+      failed |= phone.lte().connection == LteConnection::AttemptingConnection;
       reestablished |= phone.lte().connected();
     }
   }
@@ -157,14 +157,14 @@ TEST(Phone, LosesItsLinkNowAndThenAndReestablishesIt) {
 TEST(Phone, LosesServiceInAHighwayTunnelAndFindsItAgain) {
   Phone phone(highwayWorld(1), 1);
   Milliseconds without = 0;
-  while (phone.now() < kHour) {
+  while (phone.now() < hour) {
     phone.advance();
     if (phone.technology()) continue;
-    without += kStep;
-    EXPECT_EQ(phone.lte().connection, LteConnection::kNull);
+    without += stepTime;
+    EXPECT_EQ(phone.lte().connection, LteConnection::Null);
     EXPECT_FALSE(phone.umts().camped());
     EXPECT_FALSE(phone.gsm().camped());
-    EXPECT_EQ(phone.registration().eps().service, Service::kNone);
+    EXPECT_EQ(phone.registration().eps().service, Service::None);
   }
   EXPECT_GT(without, 5000);
   EXPECT_LT(without, 120000);
@@ -175,10 +175,10 @@ TEST(Phone, IsWeaklyServedByUmtsAndGsmIndoors) {
   Phone phone(indoorWorld(1), 1);
   double umts = 0, gsm = 0;
   int umtsSteps = 0, gsmSteps = 0;
-  while (phone.now() < kHour) {
+  while (phone.now() < hour) {
     phone.advance();
-    if (phone.technology() == Technology::kUmts) umts += phone.umts().rscp, ++umtsSteps;
-    if (phone.technology() == Technology::kGsm) gsm += phone.gsm().rxLev, ++gsmSteps;
+    if (phone.technology() == Technology::Umts) umts += phone.umts().rscp, ++umtsSteps;
+    if (phone.technology() == Technology::Gsm) gsm += phone.gsm().rxLev, ++gsmSteps;
   }
   ASSERT_GT(umtsSteps, 1000);
   ASSERT_GT(gsmSteps, 1000);

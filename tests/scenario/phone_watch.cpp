@@ -80,10 +80,9 @@ void PhoneWatch::see(const MetricRecord& record) {
     now_ = record.time;
   }
   findings_.at(record.time - *start_);
-  findings_.expect(Rule::kTimestampIsTheRecords,
-                   timestampOf(record) == static_cast<std::uint64_t>(record.time.count()));
+  findings_.expect(Rule::TimestampIsTheRecords, timestampOf(record) == static_cast<std::uint64_t>(record.time.count()));
   Moment& last = last_[record.metricId];
-  findings_.expect(Rule::kTimeOfAMetricNeverGoesBack, record.time >= last);
+  findings_.expect(Rule::TimeOfAMetricNeverGoesBack, record.time >= last);
   last = record.time;
   const char technology = technologyOf(record.metricId);
   switch (technology) {
@@ -108,7 +107,7 @@ void PhoneWatch::watchTechnology(const MetricRecord& record, char technology) {
                        (record.metricId == K_UMTS_RRC_STATE && umts_.serves()) || record.metricId == K_GSM_SCELL_INFO;
   if (arrives && technology != technology_) arrive(technology, record.time);
   if (technology == technology_) return;
-  findings_.expect(Rule::kWhatIsLeftIsSilent, record.time <= leftAt_[technology]);
+  findings_.expect(Rule::WhatIsLeftIsSilent, record.time <= leftAt_[technology]);
 }
 
 void PhoneWatch::arrive(char technology, Moment time) {
@@ -131,9 +130,9 @@ void PhoneWatch::arrive(char technology, Moment time) {
       break;
   }
   if (technology_ != ' ') {
-    findings_.expect(Rule::kLeavingIsToldBeforeTheNextTechnology, over);
+    findings_.expect(Rule::LeavingIsToldBeforeTheNextTechnology, over);
     // Between two technologies there is nothing, but when service was lost.
-    if (!mobility_.lostService()) findings_.expect(Rule::kLeavingIsToldAtTheMomentOfArrival, since == time);
+    if (!mobility_.lostService()) findings_.expect(Rule::LeavingIsToldAtTheMomentOfArrival, since == time);
     findings_.reach(std::string{technology_, '>', technology} + (mobility_.lostService() ? " after no service" : ""));
     leftAt_[technology_] = since;
   }

@@ -13,7 +13,7 @@ namespace {
 
 using namespace std::chrono_literals;
 
-const std::vector<std::string> kNames{"city", "highway", "indoor", "soak", "edges"};
+const std::vector<std::string> scenarioNames{"city", "highway", "indoor", "soak", "edges"};
 
 std::vector<MetricRecord> driven(std::string_view arguments, double seconds) {
   Drive drive(arguments);
@@ -23,7 +23,7 @@ std::vector<MetricRecord> driven(std::string_view arguments, double seconds) {
 }
 
 TEST(ScenarioSource, SameSeedGivesTheSameBytes) {
-  for (const std::string& name : kNames) {
+  for (const std::string& name : scenarioNames) {
     const auto first = driven(name + ",seed=7", 300);
     const auto second = driven(name + ",seed=7", 300);
     ASSERT_FALSE(first.empty());
@@ -52,7 +52,7 @@ TEST(ScenarioSource, BytesDoNotDependOnWhenTheLoopTurns) {
 }
 
 TEST(ScenarioSource, EachMetricComesOnceWithinTwoSeconds) {
-  for (const std::string& name : kNames) {
+  for (const std::string& name : scenarioNames) {
     for (int seed = 1; seed <= 12; ++seed) {
       Drive drive(name + ",seed=" + std::to_string(seed));
       drive.listen();
@@ -118,7 +118,7 @@ TEST(ScenarioSource, EachMetricComesOnceWithinTwoSecondsWhateverThePlansPeriods)
 
 TEST(ScenarioSource, NamesTheMetricsThatItFillsInAscendingOrder) {
   const auto ids = handledMetrics();
-  for (const std::string& name : kNames) {
+  for (const std::string& name : scenarioNames) {
     EXPECT_EQ(Drive(name).source->metrics(), std::vector<std::int64_t>(ids.begin(), ids.end()));
   }
 }

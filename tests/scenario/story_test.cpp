@@ -33,7 +33,7 @@ const std::vector<MetricRecord>& hourOf(const std::string& name) {
   return records;
 }
 
-const std::vector<std::string> kDrives{"city", "highway", "indoor"};
+const std::vector<std::string> drives{"city", "highway", "indoor"};
 
 // Calls visit(message, record) for each record of the metric.
 template <typename Message>
@@ -45,7 +45,7 @@ void each(const std::vector<MetricRecord>& records, std::int64_t metricId,
 }
 
 TEST(Story, TellsEveryMetricInAnHourOfEachDrive) {
-  for (const std::string& name : kDrives) {
+  for (const std::string& name : drives) {
     std::set<std::int64_t> seen;
     for (const MetricRecord& record : hourOf(name)) seen.insert(record.metricId);
     EXPECT_EQ(seen, handledMetrics()) << name;
@@ -53,7 +53,7 @@ TEST(Story, TellsEveryMetricInAnHourOfEachDrive) {
 }
 
 TEST(Story, EveryPayloadIsWellFormedAndOnlyNamesWhatHasAName) {
-  for (const std::string& name : kDrives) {
+  for (const std::string& name : drives) {
     for (const MetricRecord& record : hourOf(name)) {
       const auto message = decodedAny(record);
       PBDataWriter writer;
@@ -67,7 +67,7 @@ TEST(Story, EveryPayloadIsWellFormedAndOnlyNamesWhatHasAName) {
 }
 
 TEST(Story, TimeNeverGoesBackWithinAMetric) {
-  for (const std::string& name : kDrives) {
+  for (const std::string& name : drives) {
     std::map<std::int64_t, std::chrono::milliseconds> last;
     for (const MetricRecord& record : hourOf(name)) {
       EXPECT_GE(record.time, last[record.metricId]) << nameOf(record.metricId);
@@ -77,7 +77,7 @@ TEST(Story, TimeNeverGoesBackWithinAMetric) {
 }
 
 TEST(Story, ThePhysicalCellThatIsMeasuredIsTheOneThatServes) {
-  for (const std::string& name : kDrives) {
+  for (const std::string& name : drives) {
     std::optional<std::uint32_t> serving, channel;
     std::size_t samples = 0;
     // Records of one step come in the order of the facts: the serving cell before what is measured of it.
@@ -137,7 +137,7 @@ TEST(Story, AHandoverChangesTheServingCellItsCarrierItsSelectionParametersAndIts
 }
 
 TEST(Story, LteLevelsLieWithinTheirReportingRanges) {
-  for (const std::string& name : kDrives) {
+  for (const std::string& name : drives) {
     const auto& records = hourOf(name);
     const auto inRange = [](const RsrpRsrqSinr& values) {
       for (const std::int32_t rsrp : {values.rsrp0(), values.rsrp1()}) EXPECT_TRUE(rsrp >= -140 && rsrp <= -44) << rsrp;
@@ -234,7 +234,7 @@ TEST(Story, LteSelectionParametersAreWhatTheCellBroadcasts) {
 }
 
 TEST(Story, EachRrcStateTellsTheOneBeforeItAndHowLongThatLasted) {
-  for (const std::string& name : kDrives) {
+  for (const std::string& name : drives) {
     // On change, so that none is missed; the city's own hour has them all.
     std::optional<std::int32_t> previous;
     std::optional<std::chrono::milliseconds> since;
@@ -304,7 +304,7 @@ std::vector<char> technologies(const std::vector<MetricRecord>& records) {
 }
 
 TEST(Story, ThePhoneGoesToUmtsAndToGsmAndComesBack) {
-  for (const std::string& name : kDrives) {
+  for (const std::string& name : drives) {
     std::set<std::pair<char, char>> changes;
     const auto visited = technologies(hourOf(name));
     for (std::size_t i = 4; i < visited.size(); ++i) changes.insert({visited[i - 1], visited[i]});
@@ -317,7 +317,7 @@ TEST(Story, ThePhoneGoesToUmtsAndToGsmAndComesBack) {
 }
 
 TEST(Story, WhileOneTechnologyServesTheOthersAreSilent) {
-  for (const std::string& name : kDrives) {
+  for (const std::string& name : drives) {
     char serving = ' ';
     std::chrono::milliseconds since{};
     for (const MetricRecord& record : hourOf(name)) {
@@ -347,7 +347,7 @@ TEST(Story, WhileOneTechnologyServesTheOthersAreSilent) {
 TEST(Story, UmtsLevelsAndStatesAreLegal) {
   std::set<std::int32_t> states;
   std::set<bool> connectedModes;
-  for (const std::string& name : kDrives) {
+  for (const std::string& name : drives) {
     const auto& records = hourOf(name);
     each<KCellularWcdmaRrcConnectionState>(records, K_UMTS_RRC_STATE, [&](const auto& message, const MetricRecord&) {
       states.insert(message.state());
@@ -415,7 +415,7 @@ TEST(Story, UmtsSelectionParametersListEachCarrierOnceWithItsPriority) {
 }
 
 TEST(Story, GsmTellsBothModesAndWhatIsMeasuredInEach) {
-  for (const std::string& name : kDrives) {
+  for (const std::string& name : drives) {
     std::set<std::int32_t> states;
     std::optional<std::uint32_t> channel;
     for (const MetricRecord& record : hourOf(name)) {
