@@ -4,6 +4,7 @@
 #include <algorithm>
 #include <array>
 #include <limits>
+#include <span>
 #include <string_view>
 
 #include "messages/metric_identifiers.h"
@@ -75,7 +76,7 @@ struct Variant {
   }
   // The walk goes through all names and ends with a number that has none.
   std::int32_t enumerationNumber(const EnumerationTable& table) const {
-    const auto entries = table.entries();
+    const std::span<const EnumerationEntry> entries = table.entries();
     switch (shape) {
       case Shape::Smallest:
         return entries.front().value;

@@ -11,7 +11,7 @@ namespace probeview::scenario {
 void LteModem::aggregate(const Circumstances& c) {
   constexpr std::size_t mostSecondaries = 2;
   const Cell& primary = network_.cells[*state_.serving];
-  auto& secondaries = state_.secondaries;
+  std::vector<SecondaryCarrier>& secondaries = state_.secondaries;
   bool changed = false;
   if (c.demand.download) {
     if (downloadSince_ < 0) downloadSince_ = c.now;

@@ -314,7 +314,7 @@ std::optional<Departure> LteModem::advanceConnected(const Circumstances& c) {
     }
     // 3GPP TS 23.272: without voice over IMS a call is made on UMTS or GSM.
     if (c.demand.voice && !c.voiceOverIms) {
-      auto target = strongestAllowed(c, Technology::Umts, UmtsSelection::qRxLevMin + 6);
+      std::optional<CellIndex> target = strongestAllowed(c, Technology::Umts, UmtsSelection::qRxLevMin + 6);
       if (!target) target = strongestAllowed(c, Technology::Gsm, GsmSelection::rxLevAccessMin + 6);
       if (target) {
         leaving_ = Departure{*target, Manner::FallbackForVoice};
@@ -371,7 +371,7 @@ void LteModem::beginReestablishment(LteCause cause, const Circumstances& c) {
 // 3GPP TS 36.331, 5.3.7: the phone looks for any suitable cell and asks it to go on.
 void LteModem::advanceReestablishment(const Circumstances& c) {
   if (c.measured && c.now - state_.since >= 160) {
-    const auto found = strongestAllowed(c, Technology::Lte, LteSelection::qRxLevMin);
+    const std::optional<CellIndex> found = strongestAllowed(c, Technology::Lte, LteSelection::qRxLevMin);
     if (found && c.surroundings.interferenceRatio(*found) > LteSupervision::inSync) {
       if (*found != state_.serving) serve(*found, c);
       if (c.random.chance(0.9)) {

@@ -117,7 +117,7 @@ void report(const Phone& phone, KCellularLteTxPower& message) {
 }
 
 void report(const Phone& phone, KCellularLteRsrpRsrqSinr& message) {
-  const auto& samples = phone.lte().samples;
+  const std::vector<LteSample>& samples = phone.lte().samples;
   const auto count = static_cast<std::uint32_t>(samples.size());
   const auto period = static_cast<std::uint32_t>(stepTime);
   if (phone.traffic().activity() == Activity::Voice) {

@@ -71,7 +71,7 @@ class Pending {
       candidate_ = candidate;
       since_ = now;
     }
-    return candidate_.has_value() && now - since_ >= time;
+    return candidate_ && now - since_ >= time;
   }
   void clear() { candidate_.reset(); }
 

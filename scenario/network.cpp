@@ -96,7 +96,7 @@ void NetworkBuilder::add(const SitePlan& plan) {
   // A GSM sector looks where its number among the site's GSM carriers says.
   if (plan.sectors > 1) {
     std::uint32_t sector = 0;
-    for (auto& cell : network_.cells) {
+    for (Cell& cell : network_.cells) {
       if (cell.site != site || network_.carriers[cell.carrier].technology != Technology::Gsm) continue;
       cell.facing = direction(plan.turnDegrees + 360.0 / plan.sectors * (sector % plan.sectors));
       cell.identity = 10001 + site * 10 + sector;

@@ -26,7 +26,7 @@ Propagation::Propagation(const Network& network, std::uint64_t seed) : network_(
     const Carrier& carrier = network.carrierOf(index);
     cellConstant_.push_back(network.referenceDbm(index) - network.pathLoss.constant - network.pathLoss.bodyLoss -
                             2.1 * toDecibels(carrier.megahertz));
-    auto& sites = sites_[static_cast<std::size_t>(carrier.technology)];
+    std::vector<SiteCells>& sites = sites_[static_cast<std::size_t>(carrier.technology)];
     if (sites.empty() || sites.back().site != network.cells[index].site || sites.back().end != index) {
       sites.push_back({network.cells[index].site, index, index});
     }

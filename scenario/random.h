@@ -18,7 +18,7 @@ constexpr std::uint64_t scramble(std::uint64_t number) {
 
 // Normally distributed with mean 0 and deviation 1, never beyond 3.5: the sum of the number's four 16-bit quarters.
 constexpr double normalFrom(std::uint64_t bits) {
-  const auto sum = (bits & 0xFFFFU) + ((bits >> 16) & 0xFFFFU) + ((bits >> 32) & 0xFFFFU) + (bits >> 48);
+  const std::uint64_t sum = (bits & 0xFFFFU) + ((bits >> 16) & 0xFFFFU) + ((bits >> 32) & 0xFFFFU) + (bits >> 48);
   constexpr double mean = 2 * 65535.0;
   constexpr double deviation = 37837.227;  // 65536 / sqrt(12) * sqrt(4)
   return (static_cast<double>(sum) - mean) / deviation;

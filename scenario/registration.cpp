@@ -204,7 +204,7 @@ void Registration::advance(Milliseconds now, bool connected, Facts& facts) {
 void Registration::finish(Milliseconds now, Facts& facts) {
   const Cell& cell = network_.cells[*cell_];
   const bool first =
-      procedure_ == Procedure::EpsAttach || procedure_ == Procedure::GprsAttach || !mobility_.locationArea.has_value();
+      procedure_ == Procedure::EpsAttach || procedure_ == Procedure::GprsAttach || !mobility_.locationArea;
   if (cell.areaCode == network_.forbiddenAreaCode) {
     refuse(Reject::NoSuitableCellInLocationArea, now, facts);
   } else if (!first && random_.chance(refusalChance)) {
@@ -315,7 +315,7 @@ void Registration::refuse(Reject cause, Milliseconds now, Facts& facts) {
   if (!final) return;
   // "Forbidden for roaming", until the phone is switched off (24.301, 5.5.3.2.5; 24.008, 4.4.4.7).
   const bool tracking = network_.technologyOf(*cell_) == Technology::Lte;
-  auto& list = tracking ? forbiddenTrackingAreas_ : forbiddenLocationAreas_;
+  std::vector<std::uint32_t>& list = tracking ? forbiddenTrackingAreas_ : forbiddenLocationAreas_;
   if (!contains(list, area)) list.push_back(area);
   facts.learn(Fact::MobilityCommon, now);
 }

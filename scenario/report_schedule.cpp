@@ -38,7 +38,7 @@ void ReportSchedule::setPlan(const std::optional<MetricPlan>& plan) {
         // On change is more than any period: without one sorts before all that have one.
         period = plan->observed ? std::min(period, wished) : wished;
       }
-      entry.periodIsAsked = forcedPeriod_.has_value() || (period && isListed && wish->second);
+      entry.periodIsAsked = forcedPeriod_ || (period && isListed && wish->second);
       setPeriod(entry, period);
     }
     if (entry.wanted && !wasWanted) entry.pending = true;

@@ -4,6 +4,8 @@
 #include <algorithm>
 #include <array>
 #include <memory>
+#include <optional>
+#include <span>
 #include <string>
 #include <utility>
 
@@ -74,7 +76,7 @@ class ScenarioSource final : public MetricSource {
   }
 
   bool query(std::int64_t metricId) override {
-    const auto all = reports();
+    const std::span<const Report> all = reports();
     const auto found =
         std::find_if(all.begin(), all.end(), [&](const Report& report) { return report.metricId == metricId; });
     if (found == all.end()) return false;
@@ -144,7 +146,7 @@ class ScenarioSource final : public MetricSource {
   void tell(bool ofTheLeft) {
     for (const Report& report : reports()) {
       if (story_->facts()[report.fact].left != ofTheLeft) continue;
-      const auto time = schedule_.due(report, story_->facts(), story_->now());
+      const std::optional<Milliseconds> time = schedule_.due(report, story_->facts(), story_->now());
       if (time) emit(report, *time);
     }
   }

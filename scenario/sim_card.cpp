@@ -130,8 +130,8 @@ Bytes epsLocation(const EpsContext& context) {
 }  // namespace
 
 std::array<std::uint8_t, 3> encodedPlmn(std::uint32_t code) {
-  const auto tens = code / 10 % 10;
-  const auto ones = code % 10;
+  const std::uint32_t tens = code / 10 % 10;
+  const std::uint32_t ones = code % 10;
   // Country code 001: digits 0, 0, 1; the filler stands for the third digit of the network code.
   return {0x00, 0xF1, static_cast<std::uint8_t>(ones << 4 | tens)};
 }

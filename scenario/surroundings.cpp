@@ -104,7 +104,7 @@ void Surroundings::rank(Technology technology) {
       weakest = -109, worst = -2;
       break;
   }
-  auto& heard = heard_[static_cast<std::size_t>(technology)];
+  std::vector<CellIndex>& heard = heard_[static_cast<std::size_t>(technology)];
   heard.clear();
   for (const CellIndex cell : cells_[static_cast<std::size_t>(technology)]) {
     if (filtered_[cell] < weakest) continue;

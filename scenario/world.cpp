@@ -48,18 +48,18 @@ World cityWorld(std::uint64_t seed) {
   NetworkBuilder builder(seed);
   Network& network = builder.network();
   network.pathLoss = {58.83, 37.6, 12, 6};
-  const auto band3 = builder.add(lteBand3());
-  const auto band7 = builder.add(lteBand7());
-  const auto band20 = builder.add(lteBand20());
-  const auto umts1 = builder.add(umtsBand1());
-  const auto umts8 = builder.add(umtsBand8());
+  const CarrierIndex band3 = builder.add(lteBand3());
+  const CarrierIndex band7 = builder.add(lteBand7());
+  const CarrierIndex band20 = builder.add(lteBand20());
+  const CarrierIndex umts1 = builder.add(umtsBand1());
+  const CarrierIndex umts8 = builder.add(umtsBand8());
   const GsmPlan gsm(builder);
-  const auto gsmUnderpass = builder.add(gsm900(80));
-  const auto gsmRavine = builder.add(gsm1800(640));
-  const auto privateCarrier = builder.add(ltePrivate());
+  const CarrierIndex gsmUnderpass = builder.add(gsm900(80));
+  const CarrierIndex gsmRavine = builder.add(gsm1800(640));
+  const CarrierIndex privateCarrier = builder.add(ltePrivate());
 
-  const auto underpass = builder.add(Enclosure{{2400, 620}, 260, 70, 48});
-  const auto ravine = builder.add(Enclosure{{700, 1200}, 240, 70, 52});
+  const std::uint32_t underpass = builder.add(Enclosure{{2400, 620}, 260, 70, 48});
+  const std::uint32_t ravine = builder.add(Enclosure{{700, 1200}, 240, 70, 52});
 
   // A railway bridge low above the road: a few seconds without signal.
   builder.add(Enclosure{{1240, 0}, 24, 8, 50});
@@ -107,15 +107,15 @@ World highwayWorld(std::uint64_t seed) {
   NetworkBuilder builder(seed);
   Network& network = builder.network();
   network.pathLoss = {33.5, 34.1, 10, 5};
-  const auto band3 = builder.add(lteBand3());
-  const auto band20 = builder.add(lteBand20());
-  const auto umts8 = builder.add(umtsBand8());
+  const CarrierIndex band3 = builder.add(lteBand3());
+  const CarrierIndex band20 = builder.add(lteBand20());
+  const CarrierIndex umts8 = builder.add(umtsBand8());
   const GsmPlan gsm(builder);
 
   constexpr double roadLength = 60000;
   builder.add(Enclosure{{23000, 0}, 500, 60, 90});  // a tunnel into which nothing reaches
-  const auto upperValley = builder.add(Enclosure{{42300, 0}, 1600, 300, 45});
-  const auto lowerValley = builder.add(Enclosure{{45700, 0}, 1600, 300, 45});
+  const std::uint32_t upperValley = builder.add(Enclosure{{42300, 0}, 1600, 300, 45});
+  const std::uint32_t lowerValley = builder.add(Enclosure{{45700, 0}, 1600, 300, 45});
 
   std::size_t number = 0;
   for (double x = 500; x < roadLength; x += 2900) {
@@ -152,15 +152,15 @@ World indoorWorld(std::uint64_t seed) {
   NetworkBuilder builder(seed);
   Network& network = builder.network();
   network.pathLoss = {58.83, 37.6, 24, 4};
-  const auto band3 = builder.add(lteBand3());
-  const auto band20 = builder.add(lteBand20());
-  const auto umts1 = builder.add(umtsBand1());
-  const auto umts8 = builder.add(umtsBand8());
+  const CarrierIndex band3 = builder.add(lteBand3());
+  const CarrierIndex band20 = builder.add(lteBand20());
+  const CarrierIndex umts1 = builder.add(umtsBand1());
+  const CarrierIndex umts8 = builder.add(umtsBand8());
   const GsmPlan gsm(builder);
 
   // The deeper inside, the less comes through; the basement below the core lets lower frequencies in by a shaft.
   builder.add(Enclosure{{60, 30}, 26, 8, 22});
-  const auto basement = builder.add(Enclosure{{110, 30}, 18, 5, 40});
+  const std::uint32_t basement = builder.add(Enclosure{{110, 30}, 18, 5, 40});
 
   const std::array<Point, 6> places{{{-240, 150}, {380, 420}, {640, -180}, {-150, -460}, {-700, -300}, {250, -720}}};
   for (std::size_t number = 0; number < places.size(); ++number) {
@@ -174,7 +174,7 @@ World indoorWorld(std::uint64_t seed) {
     plan.area = number < 3 ? 0 : 1;
     builder.add(plan);
   }
-  const auto shaft = builder.add(Carrier{Technology::Gsm, 100, 900, 955.0, -6, 0, 1});
+  const CarrierIndex shaft = builder.add(Carrier{Technology::Gsm, 100, 900, 955.0, -6, 0, 1});
   builder.add(SitePlan{{112, 34}, {shaft}, 1, 0, basement, 0, 0});
   network.voiceAreaCodes = {areaCodeOf(0)};
 
