@@ -3,47 +3,54 @@
 // NAS contexts, bearers and SIM card files. IMSI, TMSI, GUTI, addresses and SIM files are personal data.
 #pragma once
 
+#include "messages/quantities.h"
 #include "messages/runtime/field_table.h"
+#include "messages/viewer_notes.h"
 
 namespace probeview {
 
 // Tables read best in columns.
 // clang-format off
 
-// A PLMN in three bytes, 3GPP TS 24.008, 10.5.1.3.
 class Plmn final : public PBCodable {
-  PB_MESSAGE(Plmn)
-  PB_OBJECT(1, "encoded_plmn", encodedPlmn, EncodedPlmn, bytes);
+  PB_MESSAGE(Plmn, "A PLMN in three bytes, 3GPP TS 24.008, 10.5.1.3.")
+  PB_OBJECT(1, "encoded_plmn", encodedPlmn, EncodedPlmn, bytes, "PLMN in three bytes of BCD digits (3GPP TS 24.008, 10.5.1.3)");
 };
 
-// A location area: PLMN in three bytes and LAC, 3GPP TS 24.008, 10.5.1.3.
 class KCellularLocationAreaId final : public PBCodable {
-  PB_MESSAGE(KCellularLocationAreaId)
-  PB_OBJECT(1, "encoded_plmn", encodedPlmn, EncodedPlmn, bytes);
-  PB_FIELD (2, "lac",          lac,         Lac,         uint32);
+  PB_MESSAGE(KCellularLocationAreaId, "A location area: PLMN in three bytes and LAC, 3GPP TS 24.008, 10.5.1.3.")
+  PB_OBJECT(1, "encoded_plmn", encodedPlmn, EncodedPlmn, bytes,  "PLMN in three bytes of BCD digits (3GPP TS 24.008, 10.5.1.3)");
+  PB_FIELD (2, "lac",          lac,         Lac,         uint32, locationAreaCode, "Location area code");
 };
 
-// A tracking area: PLMN in three bytes and TAC, 3GPP TS 24.301, 9.9.3.32.
 class KCellularTrackingAreaId final : public PBCodable {
-  PB_MESSAGE(KCellularTrackingAreaId)
-  PB_OBJECT(1, "encoded_plmn", encodedPlmn, EncodedPlmn, bytes);
-  PB_FIELD (2, "tac",          tac,         Tac,         uint32);
+  PB_MESSAGE(KCellularTrackingAreaId, "A tracking area: PLMN in three bytes and TAC, 3GPP TS 24.301, 9.9.3.32.")
+  PB_OBJECT(1, "encoded_plmn", encodedPlmn, EncodedPlmn, bytes,  "PLMN in three bytes of BCD digits (3GPP TS 24.008, 10.5.1.3)");
+  PB_FIELD (2, "tac",          tac,         Tac,         uint32, trackingAreaCode, "Tracking area code");
 };
 
-// What all mobility management shares: the IMSI, equivalent PLMNs, forbidden location and tracking areas.
 class KCellularMmCommonInfo final : public PBCodable {
-  PB_MESSAGE(KCellularMmCommonInfo)
-  PB_FIELD (1, "timestamp",          timestamp,        Timestamp,        uint64);
-  PB_OBJECT(2, "imsi",               imsi,             Imsi,             bytes);
-  PB_LIST  (3, "eplmn_list",         eplmnLists,       EplmnLists, eplmnList, EplmnList, repeated<message<Plmn>>);
-  PB_LIST  (4, "roaming_flai_list",  roamingFlaiLists, RoamingFlaiLists, roamingFlaiList, RoamingFlaiList, repeated<message<KCellularLocationAreaId>>);
-  PB_LIST  (5, "reg_prov_flai_list", regProvFlaiLists, RegProvFlaiLists, regProvFlaiList, RegProvFlaiList, repeated<message<KCellularLocationAreaId>>);
-  PB_LIST  (6, "roaming_ftai_list",  roamingFtaiLists, RoamingFtaiLists, roamingFtaiList, RoamingFtaiList, repeated<message<KCellularTrackingAreaId>>);
-  PB_LIST  (7, "reg_prov_ftai_list", regProvFtaiLists, RegProvFtaiLists, regProvFtaiList, RegProvFtaiList, repeated<message<KCellularTrackingAreaId>>);
+  PB_MESSAGE(KCellularMmCommonInfo,
+             "What all mobility management shares: the IMSI, equivalent PLMNs, forbidden location and tracking areas.",
+             "none")
+  PB_FIELD (1, "timestamp",          timestamp,        Timestamp, uint64, timestamp, "Time of the values", viewer::localTime);
+  PB_OBJECT(2, "imsi",               imsi,             Imsi,      bytes,  "IMSI as on the SIM", personal);
+  PB_LIST  (3, "eplmn_list",         eplmnLists,       EplmnLists, eplmnList, EplmnList, repeated<message<Plmn>>, "Equivalent PLMNs");
+  PB_LIST  (4, "roaming_flai_list",  roamingFlaiLists, RoamingFlaiLists, roamingFlaiList, RoamingFlaiList, repeated<message<KCellularLocationAreaId>>,
+               "Location areas forbidden for roaming");
+  PB_LIST  (5, "reg_prov_flai_list", regProvFlaiLists, RegProvFlaiLists, regProvFlaiList, RegProvFlaiList, repeated<message<KCellularLocationAreaId>>,
+               "Location areas forbidden for regional provision of service");
+  PB_LIST  (6, "roaming_ftai_list",  roamingFtaiLists, RoamingFtaiLists, roamingFtaiList, RoamingFtaiList, repeated<message<KCellularTrackingAreaId>>,
+               "Tracking areas forbidden for roaming");
+  PB_LIST  (7, "reg_prov_ftai_list", regProvFtaiLists, RegProvFtaiLists, regProvFtaiList, RegProvFtaiList, repeated<message<KCellularTrackingAreaId>>,
+               "Tracking areas forbidden for regional provision of service");
 };
 
-// Mobility management of the circuit-switched domain, 3GPP TS 24.008, 4.
 class KCellularMmContext final : public PBCodable {
+  PB_MESSAGE(KCellularMmContext,
+             "Mobility management of the circuit-switched domain, 3GPP TS 24.008, 4.",
+             "\"UMTS NAS MM\" and \"GSM NAS MM\"")
+
  public:
   PB_ENUMERATION(RegStatus,
     KREG_STATUS_NORMAL_SERVICE = 0,
@@ -122,28 +129,29 @@ class KCellularMmContext final : public PBCodable {
     KNAS_MM_REJ_CAUSE_MSG_NOT_COMPATIBLE = 101,
     KNAS_MM_REJ_CAUSE_PROTOCOL_ERROR_UNSPECIFIED = 111);
 
-  PB_MESSAGE(KCellularMmContext)
-  PB_FIELD (1, "timestamp",          timestamp,        Timestamp,        uint64);
-  PB_FIELD (2, "reg_status",         regStatus,        RegStatus,        enumeration<RegStatus>);
-  PB_FIELD (3, "update_status",      updateStatus,     UpdateStatus,     enumeration<UpdateStatus>);
-  PB_OBJECT(4, "lai",                lai,              Lai,              message<KCellularLocationAreaId>);
-  PB_FIELD (5, "tmsi",               tmsi,             Tmsi,             uint32);
-  PB_FIELD (6, "t3212_dur_s",        t3212DurS,        T3212DurS,        uint32);
-  PB_FIELD (7, "proc_failure_cause", procFailureCause, ProcFailureCause, enumeration<ProcFailureCause>);
-  PB_FIELD (8, "reject_cause",       rejectCause,      RejectCause,      enumeration<RejectCause>);
-  PB_FIELD (9, "is_combined_proc",   isCombinedProc,   IsCombinedProc,   boolean);
+  PB_FIELD (1, "timestamp",          timestamp,        Timestamp,        uint64,                           timestamp,         "Time of the values", viewer::localTime);
+  PB_FIELD (2, "reg_status",         regStatus,        RegStatus,        enumeration<RegStatus>,           none,              "Registration status");
+  PB_FIELD (3, "update_status",      updateStatus,     UpdateStatus,     enumeration<UpdateStatus>,        none,              "Update status");
+  PB_OBJECT(4, "lai",                lai,              Lai,              message<KCellularLocationAreaId>, "Location area");
+  PB_FIELD (5, "tmsi",               tmsi,             Tmsi,             uint32,                           temporaryIdentity, "TMSI", personal);
+  PB_FIELD (6, "t3212_dur_s",        t3212DurS,        T3212DurS,        uint32,                           seconds,           "T3212 (3GPP TS 24.008, 11.2)");
+  PB_FIELD (7, "proc_failure_cause", procFailureCause, ProcFailureCause, enumeration<ProcFailureCause>,    none,              "Why the last procedure failed");
+  PB_FIELD (8, "reject_cause",       rejectCause,      RejectCause,      enumeration<RejectCause>,         none,              "Cause with which the network rejected");
+  PB_FIELD (9, "is_combined_proc",   isCombinedProc,   IsCombinedProc,   boolean,                          none,              "Whether the procedure was a combined one");
 };
 
-// A routing area: PLMN in three bytes, LAC and RAC, 3GPP TS 24.008, 10.5.5.15.
 class RoutingAreaId final : public PBCodable {
-  PB_MESSAGE(RoutingAreaId)
-  PB_OBJECT(1, "encoded_plmn", encodedPlmn, EncodedPlmn, bytes);
-  PB_FIELD (3, "lac",          lac,         Lac,         uint32);
-  PB_FIELD (4, "rac",          rac,         Rac,         uint32);
+  PB_MESSAGE(RoutingAreaId, "A routing area: PLMN in three bytes, LAC and RAC, 3GPP TS 24.008, 10.5.5.15.")
+  PB_OBJECT(1, "encoded_plmn", encodedPlmn, EncodedPlmn, bytes,  "PLMN in three bytes of BCD digits (3GPP TS 24.008, 10.5.1.3)");
+  PB_FIELD (3, "lac",          lac,         Lac,         uint32, locationAreaCode, "Location area code");
+  PB_FIELD (4, "rac",          rac,         Rac,         uint32, routingAreaCode,  "Routing area code");
 };
 
-// Mobility management of the packet-switched domain, 3GPP TS 24.008, 4.7.
 class KCellularGmmContext final : public PBCodable {
+  PB_MESSAGE(KCellularGmmContext,
+             "Mobility management of the packet-switched domain, 3GPP TS 24.008, 4.7.",
+             "\"UMTS NAS GMM\" and \"GSM NAS GMM\"")
+
  public:
   PB_ENUMERATION(RegProc,
     KNAS_MM_REG_PROC_LOCATION_AREA_UPDATE = 0,
@@ -163,28 +171,27 @@ class KCellularGmmContext final : public PBCodable {
     GPRS_STATUS_NOT_UPDATED = 1,
     GPRS_STATUS_ROAMING_NOT_ALLOWED = 2);
 
-  PB_MESSAGE(KCellularGmmContext)
-  PB_FIELD (1, "timestamp",          timestamp,        Timestamp,        uint64);
-  PB_FIELD (2, "reg_status",         regStatus,        RegStatus,        enumeration<KCellularMmContext::RegStatus>);
-  PB_FIELD (3, "update_status",      updateStatus,     UpdateStatus,     enumeration<UpdateStatus>);
-  PB_OBJECT(4, "rai",                rai,              Rai,              message<RoutingAreaId>);
-  PB_FIELD (5, "p_tmsi",             pTmsi,            PTmsi,            uint32);
-  PB_FIELD (6, "t3312_dur_s",        t3312DurS,        T3312DurS,        uint32);
-  PB_FIELD (7, "proc_failure_cause", procFailureCause, ProcFailureCause, enumeration<KCellularMmContext::ProcFailureCause>);
-  PB_FIELD (8, "reject_cause",       rejectCause,      RejectCause,      enumeration<KCellularMmContext::RejectCause>);
-  PB_FIELD (9, "reg_proc",           regProc,          RegProc,          enumeration<RegProc>);
+  PB_FIELD (1, "timestamp",          timestamp,        Timestamp,        uint64,                                            timestamp,         "Time of the values", viewer::localTime);
+  PB_FIELD (2, "reg_status",         regStatus,        RegStatus,        enumeration<KCellularMmContext::RegStatus>,        none,              "Registration status");
+  PB_FIELD (3, "update_status",      updateStatus,     UpdateStatus,     enumeration<UpdateStatus>,                         none,              "Update status");
+  PB_OBJECT(4, "rai",                rai,              Rai,              message<RoutingAreaId>,                            "Routing area");
+  PB_FIELD (5, "p_tmsi",             pTmsi,            PTmsi,            uint32,                                            temporaryIdentity, "P-TMSI", personal);
+  PB_FIELD (6, "t3312_dur_s",        t3312DurS,        T3312DurS,        uint32,                                            seconds,           "T3312 (3GPP TS 24.008, 11.2)");
+  PB_FIELD (7, "proc_failure_cause", procFailureCause, ProcFailureCause, enumeration<KCellularMmContext::ProcFailureCause>, none,              "Why the last procedure failed");
+  PB_FIELD (8, "reject_cause",       rejectCause,      RejectCause,      enumeration<KCellularMmContext::RejectCause>,      none,              "Cause with which the network rejected");
+  PB_FIELD (9, "reg_proc",           regProc,          RegProc,          enumeration<RegProc>,                              none,              "Registration procedure under way");
 };
 
-// The part of the GUTI that the MME assigns, 3GPP TS 23.003, 2.8.
 class Guti final : public PBCodable {
-  PB_MESSAGE(Guti)
-  PB_FIELD(1, "mmegi",  mmegi, Mmegi, uint32);
-  PB_FIELD(2, "mmec",   mmec,  Mmec,  uint32);
-  PB_FIELD(3, "m_tmsi", mTmsi, MTmsi, uint32);
+  PB_MESSAGE(Guti, "The part of the GUTI that the MME assigns, 3GPP TS 23.003, 2.8.")
+  PB_FIELD(1, "mmegi",  mmegi, Mmegi, uint32, mmeGroup,             "MME group identity");
+  PB_FIELD(2, "mmec",   mmec,  Mmec,  uint32, mmeCode,              "MME code");
+  PB_FIELD(3, "m_tmsi", mTmsi, MTmsi, uint32, mmeTemporaryIdentity, "M-TMSI", personal);
 };
 
-// EPS mobility management, 3GPP TS 24.301, 5.
 class KCellularEmmContext final : public PBCodable {
+  PB_MESSAGE(KCellularEmmContext, "EPS mobility management, 3GPP TS 24.301, 5.", "\"LTE NAS\"")
+
  public:
   PB_ENUMERATION(UpdateStatus,
     EPS_STATUS_UPDATED = 0,
@@ -245,22 +252,33 @@ class KCellularEmmContext final : public PBCodable {
     EMM_PROC_PERIODIC_TAU = 6,
     EMM_PROC_SERV_REQ = 7);
 
-  PB_MESSAGE(KCellularEmmContext)
-  PB_FIELD ( 1, "timestamp",                 timestamp,              Timestamp,              uint64);
-  PB_FIELD ( 2, "reg_status",                regStatus,              RegStatus,              enumeration<KCellularMmContext::RegStatus>);
-  PB_FIELD ( 3, "update_status",             updateStatus,           UpdateStatus,           enumeration<UpdateStatus>);
-  PB_FIELD ( 4, "ue_op_mode",                ueOpMode,               UeOpMode,               enumeration<UeOpMode>);
-  PB_LIST  ( 5, "tai_list",                  taiLists,               TaiLists, taiList, TaiList, repeated<message<KCellularTrackingAreaId>>);
-  PB_OBJECT( 6, "guti",                      guti,                   Guti,                   message<Guti>);
-  PB_FIELD ( 7, "reject_cause",              rejectCause,            RejectCause,            enumeration<RejectCause>);
-  PB_FIELD ( 8, "reg_proc",                  regProc,                RegProc,                enumeration<RegProc>);
-  PB_FIELD ( 9, "t3412_dur_s",               t3412DurS,              T3412DurS,              uint32);
-  PB_FIELD (10, "is_ims_voice_supported",    isImsVoiceSupported,    IsImsVoiceSupported,    boolean);
-  PB_FIELD (11, "is_emerg_bearer_supported", isEmergBearerSupported, IsEmergBearerSupported, boolean);
+  PB_FIELD ( 1, "timestamp",                 timestamp,              Timestamp,              uint64,
+                timestamp, "Time of the values", viewer::localTime);
+  PB_FIELD ( 2, "reg_status",                regStatus,              RegStatus,              enumeration<KCellularMmContext::RegStatus>,
+                none, "Registration status");
+  PB_FIELD ( 3, "update_status",             updateStatus,           UpdateStatus,           enumeration<UpdateStatus>,
+                none, "Update status");
+  PB_FIELD ( 4, "ue_op_mode",                ueOpMode,               UeOpMode,               enumeration<UeOpMode>,
+                none, "UE mode of operation (3GPP TS 24.301, 4.3)");
+  PB_LIST  ( 5, "tai_list",                  taiLists,               TaiLists, taiList, TaiList, repeated<message<KCellularTrackingAreaId>>,
+                "Tracking areas of the registration", viewer::listText);
+  PB_OBJECT( 6, "guti",                      guti,                   Guti,                   message<Guti>,
+                "GUTI", personal, viewer::dictionaryText);
+  PB_FIELD ( 7, "reject_cause",              rejectCause,            RejectCause,            enumeration<RejectCause>,
+                none, "Cause with which the network rejected");
+  PB_FIELD ( 8, "reg_proc",                  regProc,                RegProc,                enumeration<RegProc>,
+                none, "Registration procedure under way");
+  PB_FIELD ( 9, "t3412_dur_s",               t3412DurS,              T3412DurS,              uint32,
+                seconds, "T3412 (3GPP TS 24.301, 10.2)");
+  PB_FIELD (10, "is_ims_voice_supported",    isImsVoiceSupported,    IsImsVoiceSupported,    boolean,
+                none, "Whether IMS voice over PS is supported");
+  PB_FIELD (11, "is_emerg_bearer_supported", isEmergBearerSupported, IsEmergBearerSupported, boolean,
+                none, "Whether emergency bearers are supported");
 };
 
-// One active PDP or EPS bearer context; addresses as raw bytes.
 class BearerContext final : public PBCodable {
+  PB_MESSAGE(BearerContext, "One active PDP or EPS bearer context; addresses as raw bytes.")
+
  public:
   PB_ENUMERATION(PdpType,
     PDP_TYPE_IPv4 = 0,
@@ -272,39 +290,38 @@ class BearerContext final : public PBCodable {
     PDP_TYPE_PPP = 6,
     PDP_TYPE_NONE = 7);
 
-  PB_MESSAGE(BearerContext)
-  PB_FIELD ( 1, "cid",                 cid,              Cid,              uint32);
-  PB_FIELD ( 2, "nsapi",               nsapi,            Nsapi,            uint32);
-  PB_OBJECT( 3, "apn",                 apn,              Apn,              string);
-  PB_FIELD ( 4, "pdp_type",            pdpType,          PdpType,          enumeration<PdpType>);
-  PB_OBJECT( 5, "pdp_addr",            pdpAddr,          PdpAddr,          bytes);
-  PB_FIELD ( 6, "primary_dns_type",    primaryDnsType,   PrimaryDnsType,   enumeration<PdpType>);
-  PB_OBJECT( 7, "primary_dns_addr",    primaryDnsAddr,   PrimaryDnsAddr,   bytes);
-  PB_FIELD ( 8, "secondary_dns_type",  secondaryDnsType, SecondaryDnsType, enumeration<PdpType>);
-  PB_OBJECT( 9, "secondary_dns_addr",  secondaryDnsAddr, SecondaryDnsAddr, bytes);
-  PB_FIELD (10, "is_addr_irat_mobile", isAddrIratMobile, IsAddrIratMobile, boolean);
+  PB_FIELD ( 1, "cid",                 cid,              Cid,              uint32,               none, "Context identifier");
+  PB_FIELD ( 2, "nsapi",               nsapi,            Nsapi,            uint32,               none, "NSAPI, 5 to 15 (3GPP TS 24.008, 10.5.6.2)");
+  PB_OBJECT( 3, "apn",                 apn,              Apn,              string,               "Access point name");
+  PB_FIELD ( 4, "pdp_type",            pdpType,          PdpType,          enumeration<PdpType>, none, "Type of the address");
+  PB_OBJECT( 5, "pdp_addr",            pdpAddr,          PdpAddr,          bytes,                "Address: 4 bytes IPv4, 16 bytes IPv6, 20 bytes both", personal);
+  PB_FIELD ( 6, "primary_dns_type",    primaryDnsType,   PrimaryDnsType,   enumeration<PdpType>, none, "Type of the primary DNS address");
+  PB_OBJECT( 7, "primary_dns_addr",    primaryDnsAddr,   PrimaryDnsAddr,   bytes,                "Primary DNS address, 4 or 16 bytes", personal);
+  PB_FIELD ( 8, "secondary_dns_type",  secondaryDnsType, SecondaryDnsType, enumeration<PdpType>, none, "Type of the secondary DNS address");
+  PB_OBJECT( 9, "secondary_dns_addr",  secondaryDnsAddr, SecondaryDnsAddr, bytes,                "Secondary DNS address, 4 or 16 bytes", personal);
+  PB_FIELD (10, "is_addr_irat_mobile", isAddrIratMobile, IsAddrIratMobile, boolean,              none, "Whether the address stays when the technology changes");
 };
 
-// The active bearers. The count is a field of its own and need not be the number of elements.
 class KCellularActivatedBearerContexts final : public PBCodable {
-  PB_MESSAGE(KCellularActivatedBearerContexts)
-  PB_FIELD(1, "timestamp",            timestamp,          Timestamp,          uint64);
-  PB_FIELD(2, "bearer_context_count", bearerContextCount, BearerContextCount, uint32);
-  PB_LIST (3, "bearer_contexts",      bearerContexts,     BearerContexts, bearerContexts, BearerContexts, repeated<message<BearerContext>>);
+  PB_MESSAGE(KCellularActivatedBearerContexts,
+             "The active bearers. The count is a field of its own and need not be the number of elements.",
+             "\"LTE Active Bearers\", \"UMTS Active Bearers\" and \"GSM Active Bearers\"")
+  PB_FIELD(1, "timestamp",            timestamp,          Timestamp,          uint64, timestamp, "Time of the values", viewer::localTime);
+  PB_FIELD(2, "bearer_context_count", bearerContextCount, BearerContextCount, uint32, none,      "Number of bearers; need not be that of the entries");
+  PB_LIST (3, "bearer_contexts",      bearerContexts,     BearerContexts, bearerContexts, BearerContexts, repeated<message<BearerContext>>,
+              "One entry per bearer", viewer::pageEntriesGetTimestamp);
 };
 
-// One elementary file as it was read, 3GPP TS 31.102, 4.
 class ElementaryFile final : public PBCodable {
-  PB_MESSAGE(ElementaryFile)
-  PB_FIELD (1, "ef_id",   efId,    EfId,    uint32);
-  PB_OBJECT(2, "content", content, Content, bytes);
+  PB_MESSAGE(ElementaryFile, "One elementary file as it was read, 3GPP TS 31.102, 4.")
+  PB_FIELD (1, "ef_id",   efId,    EfId,    uint32, simFileIdentifier, "File identifier, such as 0x6F07");
+  PB_OBJECT(2, "content", content, Content, bytes,  "Content of the file as it was read", personal);
 };
 
-// Elementary files of the SIM card.
 class KCellularSimCardFiles final : public PBCodable {
-  PB_MESSAGE(KCellularSimCardFiles)
-  PB_FIELD(1, "timestamp", timestamp, Timestamp, uint64);
-  PB_LIST (2, "ef_list",   efLists,   EfLists, efList, EfList, repeated<message<ElementaryFile>>);
+  PB_MESSAGE(KCellularSimCardFiles, "Elementary files of the SIM card.", "\"Device Info SIM Files\"")
+  PB_FIELD(1, "timestamp", timestamp, Timestamp, uint64, timestamp, "Time of the values", viewer::localTime);
+  PB_LIST (2, "ef_list",   efLists,   EfLists, efList, EfList, repeated<message<ElementaryFile>>, "One entry per elementary file");
 };
 
 // All of them, in the order of the registry.

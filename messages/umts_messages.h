@@ -4,15 +4,20 @@
 #pragma once
 
 #include "messages/lte_messages.h"
+#include "messages/quantities.h"
 #include "messages/runtime/field_table.h"
+#include "messages/viewer_notes.h"
 
 namespace probeview {
 
 // Tables read best in columns.
 // clang-format off
 
-// State of the RRC connection, 3GPP TS 25.331, 7, with establishment and release causes.
 class KCellularWcdmaRrcConnectionState final : public PBCodable {
+  PB_MESSAGE(KCellularWcdmaRrcConnectionState,
+             "State of the RRC connection, 3GPP TS 25.331, 7, with establishment and release causes.",
+             "\"UMTS RRC State\"")
+
  public:
   PB_ENUMERATION(State,
     KWCDMA_RRC_CONN_STATE_INVALID = 0,
@@ -72,24 +77,28 @@ class KCellularWcdmaRrcConnectionState final : public PBCodable {
     KRRC_REL_CONN_REJECT_CONGESTION = 16,
     KRRC_REL_CONN_REJECT_UNSPECIFIED = 17);
 
-  PB_MESSAGE(KCellularWcdmaRrcConnectionState)
-  PB_FIELD(1, "timestamp",           timestamp,          Timestamp,          uint64);
-  PB_FIELD(2, "state",               state,              State,              enumeration<State>);
-  PB_FIELD(3, "establishment_cause", establishmentCause, EstablishmentCause, enumeration<EstablishmentCause>);
-  PB_FIELD(4, "release_cause",       releaseCause,       ReleaseCause,       enumeration<ReleaseCause>);
+  PB_FIELD(1, "timestamp",           timestamp,          Timestamp,          uint64,                          timestamp, "Time of the values", viewer::localTime);
+  PB_FIELD(2, "state",               state,              State,              enumeration<State>,              none,      "RRC state (3GPP TS 25.331, 7)");
+  PB_FIELD(3, "establishment_cause", establishmentCause, EstablishmentCause, enumeration<EstablishmentCause>,
+              none, "Why the connection was established (3GPP TS 25.331, 10.3.3.11)");
+  PB_FIELD(4, "release_cause",       releaseCause,       ReleaseCause,       enumeration<ReleaseCause>,       none,      "Why the connection was released");
 };
 
-// RRC configuration: DRX cycle in ms, MIMO, dual cell.
 class KCellularWcdmaRrcConfiguration final : public PBCodable {
-  PB_MESSAGE(KCellularWcdmaRrcConfiguration)
-  PB_FIELD(1, "timestamp",           timestamp,        Timestamp,        uint64);
-  PB_FIELD(2, "drx_cycle_length_ms", drxCycleLengthMs, DrxCycleLengthMs, uint32);
-  PB_FIELD(3, "is_mimo_configured",  isMimoConfigured, IsMimoConfigured, boolean);
-  PB_FIELD(4, "is_dc_configured",    isDcConfigured,   IsDcConfigured,   boolean);
+  PB_MESSAGE(KCellularWcdmaRrcConfiguration,
+             "RRC configuration: DRX cycle in ms, MIMO, dual cell.",
+             "\"UMTS RRC Configuration\"")
+  PB_FIELD(1, "timestamp",           timestamp,        Timestamp,        uint64,  timestamp,    "Time of the values", viewer::localTime);
+  PB_FIELD(2, "drx_cycle_length_ms", drxCycleLengthMs, DrxCycleLengthMs, uint32,  utraDrxCycle, "DRX cycle");
+  PB_FIELD(3, "is_mimo_configured",  isMimoConfigured, IsMimoConfigured, boolean, none,         "Whether MIMO is configured");
+  PB_FIELD(4, "is_dc_configured",    isDcConfigured,   IsDcConfigured,   boolean, none,         "Whether dual cell is configured");
 };
 
-// The serving cell: PLMN, LAC, cell identity, band, UARFCN (3GPP TS 25.101, 5.4), PSC and HSPA support.
 class KCellularWcdmaCellInfo final : public PBCodable {
+  PB_MESSAGE(KCellularWcdmaCellInfo,
+             "The serving cell: PLMN, LAC, cell identity, band, UARFCN (3GPP TS 25.101, 5.4), PSC and HSPA support.",
+             "\"UMTS Serving Cell Info\"")
+
  public:
   PB_ENUMERATION(WcdmaBand,
     SYS_BAND_BC0 = 0,
@@ -177,118 +186,126 @@ class KCellularWcdmaCellInfo final : public PBCodable {
     SYS_HS_IND_HSUPA_SUPP_CELL = 2,
     SYS_HS_IND_HSDPA_HSUPA_SUPP_CELL = 3);
 
-  PB_MESSAGE(KCellularWcdmaCellInfo)
-  PB_FIELD( 1, "timestamp",      timestamp,    Timestamp,    uint64);
-  PB_FIELD( 4, "mcc",            mcc,          Mcc,          uint32);
-  PB_FIELD( 5, "mnc",            mnc,          Mnc,          uint32);
-  PB_FIELD( 6, "lac",            lac,          Lac,          uint32);
-  PB_FIELD( 7, "cell_id",        cellId,       CellId,       uint32);
-  PB_FIELD( 8, "wcdma_band",     wcdmaBand,    WcdmaBand,    enumeration<WcdmaBand>);
-  PB_FIELD( 9, "dl_uarfcn",      dlUarfcn,     DlUarfcn,     uint32);
-  PB_FIELD(10, "psc",            psc,          Psc,          uint32);
-  PB_FIELD(13, "num_mnc_digits", numMncDigits, NumMncDigits, uint32);
-  PB_FIELD(14, "hspa",           hspa,         Hspa,         enumeration<Hspa>);
+  PB_FIELD( 1, "timestamp",      timestamp,    Timestamp,    uint64,                 timestamp,         "Time of the values", viewer::localTime);
+  PB_FIELD( 4, "mcc",            mcc,          Mcc,          uint32,                 countryCode,       "Mobile country code");
+  PB_FIELD( 5, "mnc",            mnc,          Mnc,          uint32,                 networkCode,       "Mobile network code");
+  PB_FIELD( 6, "lac",            lac,          Lac,          uint32,                 locationAreaCode,  "Location area code");
+  PB_FIELD( 7, "cell_id",        cellId,       CellId,       uint32,                 utraCellIdentity,  "UTRAN cell identity");
+  PB_FIELD( 8, "wcdma_band",     wcdmaBand,    WcdmaBand,    enumeration<WcdmaBand>, none,              "Band");
+  PB_FIELD( 9, "dl_uarfcn",      dlUarfcn,     DlUarfcn,     uint32,                 uarfcn,            "Downlink UARFCN");
+  PB_FIELD(10, "psc",            psc,          Psc,          uint32,                 utraPsc,           "Primary scrambling code");
+  PB_FIELD(13, "num_mnc_digits", numMncDigits, NumMncDigits, uint32,                 networkCodeDigits, "Digits of the mobile network code");
+  PB_FIELD(14, "hspa",           hspa,         Hspa,         enumeration<Hspa>,      none,              "HSPA support of the cell");
 };
 
-// Measurement of the serving cell, per antenna.
 class KCellularWcdmaScellMeasurement final : public PBCodable {
-  PB_MESSAGE(KCellularWcdmaScellMeasurement)
-  PB_FIELD(1, "timestamp",      timestamp,     Timestamp,     uint64);
-  PB_FIELD(2, "connected_mode", connectedMode, ConnectedMode, boolean);
-  PB_LIST (3, "rx_info",        rxInfos,       RxInfos, rxInfo, RxInfo, repeated<message<RxInfo>>);
+  PB_MESSAGE(KCellularWcdmaScellMeasurement,
+             "Measurement of the serving cell, per antenna.",
+             "\"UMTS Serving Cell Meas\" (as many sections and rows, but all read \"Come back later\")")
+  PB_FIELD(1, "timestamp",      timestamp,     Timestamp,     uint64,  timestamp, "Time of the values", viewer::localTime);
+  PB_FIELD(2, "connected_mode", connectedMode, ConnectedMode, boolean, none,      "Whether the measurement was made in connected mode");
+  PB_LIST (3, "rx_info",        rxInfos,       RxInfos, rxInfo, RxInfo, repeated<message<RxInfo>>,
+              "One entry per receive antenna", ViewerNote{"on the page each entry has the timestamp and connected_mode of its message, but every row reads \"Come back later\""});
 };
 
-// Uplink transmit power.
 class KCellularWcdmaTxPower final : public PBCodable {
-  PB_MESSAGE(KCellularWcdmaTxPower)
-  PB_FIELD(1, "timestamp",     timestamp,    Timestamp,    uint64);
-  PB_LIST (2, "tx_power_info", txPowerInfos, TxPowerInfos, txPowerInfo, TxPowerInfo, repeated<message<TxPowerInfo>>);
+  PB_MESSAGE(KCellularWcdmaTxPower, "Uplink transmit power.", "\"UMTS Tx Power\"")
+  PB_FIELD(1, "timestamp",     timestamp,    Timestamp, uint64, timestamp, "Time of the values", viewer::localTime);
+  PB_LIST (2, "tx_power_info", txPowerInfos, TxPowerInfos, txPowerInfo, TxPowerInfo, repeated<message<TxPowerInfo>>, "One entry per subframe", viewer::pageEntriesGetTimestamp);
 };
 
-// Reselection priority (0 to 7) of an LTE frequency.
 class EutraFreqInfo final : public PBCodable {
-  PB_MESSAGE(EutraFreqInfo)
-  PB_FIELD(1, "earfcn", earfcn, Earfcn, uint32);
-  PB_FIELD(2, "prio",   prio,   Prio,   uint32);
+  PB_MESSAGE(EutraFreqInfo, "Reselection priority (0 to 7) of an LTE frequency.")
+  PB_FIELD(1, "earfcn", earfcn, Earfcn, uint32, earfcn,              "EARFCN");
+  PB_FIELD(2, "prio",   prio,   Prio,   uint32, reselectionPriority, "Reselection priority (0: lowest)");
 };
 
-// Reselection priority (0 to 7) of a UMTS frequency.
 class UtraFreqInfo final : public PBCodable {
-  PB_MESSAGE(UtraFreqInfo)
-  PB_FIELD(1, "uarfcn", uarfcn, Uarfcn, uint32);
-  PB_FIELD(2, "prio",   prio,   Prio,   uint32);
+  PB_MESSAGE(UtraFreqInfo, "Reselection priority (0 to 7) of a UMTS frequency.")
+  PB_FIELD(1, "uarfcn", uarfcn, Uarfcn, uint32, uarfcn,              "UARFCN");
+  PB_FIELD(2, "prio",   prio,   Prio,   uint32, reselectionPriority, "Reselection priority (0: lowest)");
 };
 
-// Reselection priority (0 to 7) of a GSM frequency.
 class GsmFreqInfo final : public PBCodable {
-  PB_MESSAGE(GsmFreqInfo)
-  PB_FIELD(1, "arfcn", arfcn, Arfcn, uint32);
-  PB_FIELD(2, "prio",  prio,  Prio,  uint32);
+  PB_MESSAGE(GsmFreqInfo, "Reselection priority (0 to 7) of a GSM frequency.")
+  PB_FIELD(1, "arfcn", arfcn, Arfcn, uint32, arfcn,               "ARFCN");
+  PB_FIELD(2, "prio",  prio,  Prio,  uint32, reselectionPriority, "Reselection priority (0: lowest)");
 };
 
-// What the serving cell broadcasts for cell selection and reselection, 3GPP TS 25.304, 5.2, with the priorities of
-// LTE, UMTS and GSM frequencies.
 class KCellularWcdmaSelReselCellInfo final : public PBCodable {
+  PB_MESSAGE(KCellularWcdmaSelReselCellInfo,
+             "What the serving cell broadcasts for cell selection and reselection, 3GPP TS 25.304, 5.2, with the "
+             "priorities of LTE, UMTS and GSM frequencies.",
+             "\"UMTS Sel Resel Parameters\" (fourteen of its fields, blank when absent), \"UMTS EUTRA Neighbor "
+             "Info\", \"UMTS UTRA Neighbor Info\" and \"UMTS GSM Neighbor Info\"")
+
  public:
   PB_ENUMERATION(DuplexMode,
     FDD = 0,
     TDD = 1);
 
-  PB_MESSAGE(KCellularWcdmaSelReselCellInfo)
-  PB_FIELD ( 1, "timestamp",                  timestamp,              Timestamp,              uint64);
-  PB_FIELD ( 2, "hsdpa_capable",              hsdpaCapable,           HsdpaCapable,           uint32);
-  PB_FIELD ( 3, "edch_capable",               edchCapable,            EdchCapable,            uint32);
-  PB_FIELD ( 4, "duplex_mode",                duplexMode,             DuplexMode,             enumeration<DuplexMode>);
-  PB_VALUES( 5, "multi_band_info",            multiBandInfos,         MultiBandInfos, multiBandInfo, MultiBandInfo, repeated<uint32>);
-  PB_FIELD ( 6, "ims_emergency_support",      imsEmergencySupport,    ImsEmergencySupport,    uint32);
-  PB_FIELD ( 7, "cell_barred",                cellBarred,             CellBarred,             uint32);
-  PB_FIELD ( 8, "fach_meas_occ_info_present", fachMeasOccInfoPresent, FachMeasOccInfoPresent, uint32);
-  PB_FIELD ( 9, "s_rxlev",                    sRxlev,                 SRxlev,                 sint32);
-  PB_FIELD (10, "s_qual",                     sQual,                  SQual,                  sint32);
-  PB_FIELD (11, "s_intrasearch",              sIntrasearch,           SIntrasearch,           sint32);
-  PB_FIELD (12, "s_intersearch",              sIntersearch,           SIntersearch,           sint32);
-  PB_FIELD (13, "s_search_rat",               sSearchRat,             SSearchRat,             sint32);
-  PB_FIELD (21, "s_cell_prio",                sCellPrio,              SCellPrio,              uint32);
-  PB_LIST  (22, "eutra_prio_info",            eutraPrioInfos,         EutraPrioInfos, eutraPrioInfo, EutraPrioInfo, repeated<message<EutraFreqInfo>>);
-  PB_LIST  (23, "utra_prio_info",             utraPrioInfos,          UtraPrioInfos, utraPrioInfo, UtraPrioInfo, repeated<message<UtraFreqInfo>>);
-  PB_LIST  (24, "gsm_prio_info",              gsmPrioInfos,           GsmPrioInfos, gsmPrioInfo, GsmPrioInfo, repeated<message<GsmFreqInfo>>);
+  PB_FIELD ( 1, "timestamp",                  timestamp,              Timestamp,              uint64,                  timestamp,           "Time of the values", viewer::localTime);
+  PB_FIELD ( 2, "hsdpa_capable",              hsdpaCapable,           HsdpaCapable,           uint32,                  none,                "Whether the cell supports HSDPA, 0 or 1");
+  PB_FIELD ( 3, "edch_capable",               edchCapable,            EdchCapable,            uint32,                  none,                "Whether the cell supports E-DCH, 0 or 1");
+  PB_FIELD ( 4, "duplex_mode",                duplexMode,             DuplexMode,             enumeration<DuplexMode>, none,                "Duplex mode");
+  PB_VALUES( 5, "multi_band_info",            multiBandInfos,         MultiBandInfos, multiBandInfo, MultiBandInfo, repeated<uint32>,
+                utraBand, "Further bands to which the cell belongs, numbers of bands", viewer::listTextLogged);
+  PB_FIELD ( 6, "ims_emergency_support",      imsEmergencySupport,    ImsEmergencySupport,    uint32,
+                none, "Whether emergency calls over IMS are supported, 0 or 1");
+  PB_FIELD ( 7, "cell_barred",                cellBarred,             CellBarred,             uint32,                  none,                "Whether the cell is barred, 0 or 1");
+  PB_FIELD ( 8, "fach_meas_occ_info_present", fachMeasOccInfoPresent, FachMeasOccInfoPresent, uint32,
+                none, "Whether FACH measurement occasions are configured, 0 or 1");
+  PB_FIELD ( 9, "s_rxlev",                    sRxlev,                 SRxlev,                 sint32,                  utraSrxlev,          "Srxlev");
+  PB_FIELD (10, "s_qual",                     sQual,                  SQual,                  sint32,                  utraSqual,           "Squal");
+  PB_FIELD (11, "s_intrasearch",              sIntrasearch,           SIntrasearch,           sint32,                  utraSearchThreshold, "Sintrasearch");
+  PB_FIELD (12, "s_intersearch",              sIntersearch,           SIntersearch,           sint32,                  utraSearchThreshold, "Sintersearch");
+  PB_FIELD (13, "s_search_rat",               sSearchRat,             SSearchRat,             sint32,                  utraSearchThreshold, "SsearchRAT");
+  PB_FIELD (21, "s_cell_prio",                sCellPrio,              SCellPrio,              uint32,
+                reselectionPriority, "Reselection priority of the serving cell (0: lowest)");
+  PB_LIST  (22, "eutra_prio_info",            eutraPrioInfos,         EutraPrioInfos, eutraPrioInfo, EutraPrioInfo, repeated<message<EutraFreqInfo>>,
+                "One entry per LTE frequency", viewer::pageEntriesGetTimestamp);
+  PB_LIST  (23, "utra_prio_info",             utraPrioInfos,          UtraPrioInfos, utraPrioInfo, UtraPrioInfo, repeated<message<UtraFreqInfo>>,
+                "One entry per UMTS frequency", viewer::pageEntriesGetTimestamp);
+  PB_LIST  (24, "gsm_prio_info",              gsmPrioInfos,           GsmPrioInfos, gsmPrioInfo, GsmPrioInfo, repeated<message<GsmFreqInfo>>,
+                "One entry per GSM frequency", viewer::pageEntriesGetTimestamp);
 };
 
-// One UMTS neighbour; RSCP in dBm is rscp - 116, Ec/No in dB is ecno / 2 - 24.5 (3GPP TS 25.133, 9.1).
 class UtraCellMeasResult final : public PBCodable {
-  PB_MESSAGE(UtraCellMeasResult)
-  PB_FIELD(1, "uarfcn", uarfcn, Uarfcn, uint32);
-  PB_FIELD(2, "band",   band,   Band,   uint32);
-  PB_FIELD(3, "psc",    psc,    Psc,    uint32);
-  PB_FIELD(4, "ecno",   ecno,   Ecno,   uint32);
-  PB_FIELD(5, "rscp",   rscp,   Rscp,   sint32);
+  PB_MESSAGE(UtraCellMeasResult, "One UMTS neighbour, RSCP and Ec/No as reported (3GPP TS 25.133, 9.1).")
+  PB_FIELD(1, "uarfcn", uarfcn, Uarfcn, uint32, uarfcn,   "UARFCN");
+  PB_FIELD(2, "band",   band,   Band,   uint32, utraBand, "Number of the operating band");
+  PB_FIELD(3, "psc",    psc,    Psc,    uint32, utraPsc,  "Primary scrambling code");
+  PB_FIELD(4, "ecno",   ecno,   Ecno,   uint32, utraEcNo, "Reported Ec/No", viewer::convertedOnPage);
+  PB_FIELD(5, "rscp",   rscp,   Rscp,   sint32, utraRscp, "Reported RSCP", viewer::convertedOnPage);
 };
 
-// One GSM neighbour; the level in dBm is rxlev - 110 (3GPP TS 45.008, 8.1.4).
 class GsmCellMeasResult final : public PBCodable {
-  PB_MESSAGE(GsmCellMeasResult)
-  PB_FIELD(1, "arfcn", arfcn, Arfcn, uint32);
-  PB_FIELD(2, "bsic",  bsic,  Bsic,  uint32);
-  PB_FIELD(3, "rxlev", rxlev, Rxlev, uint32);
+  PB_MESSAGE(GsmCellMeasResult, "One GSM neighbour, the level as reported (3GPP TS 45.008, 8.1.4).")
+  PB_FIELD(1, "arfcn", arfcn, Arfcn, uint32, arfcn,    "ARFCN");
+  PB_FIELD(2, "bsic",  bsic,  Bsic,  uint32, gsmBsic,  "Base station identity code");
+  PB_FIELD(3, "rxlev", rxlev, Rxlev, uint32, gsmRxLev, "Received level", viewer::convertedOnPage);
 };
 
-// One LTE neighbour; RSRP in dBm is rsrp - 140, RSRQ in dB is rsrq / 2 - 19.5 (3GPP TS 36.133, 9.1).
 class LteCellMeasResult final : public PBCodable {
-  PB_MESSAGE(LteCellMeasResult)
-  PB_FIELD(1, "earfcn",      earfcn,    Earfcn,    uint32);
-  PB_FIELD(2, "phy_cell_id", phyCellId, PhyCellId, uint32);
-  PB_FIELD(3, "eutra_band",  eutraBand, EutraBand, uint32);
-  PB_FIELD(4, "rsrp",        rsrp,      Rsrp,      sint32);
-  PB_FIELD(5, "rsrq",        rsrq,      Rsrq,      sint32);
+  PB_MESSAGE(LteCellMeasResult, "One LTE neighbour, RSRP and RSRQ as reported (3GPP TS 36.133, 9.1).")
+  PB_FIELD(1, "earfcn",      earfcn,    Earfcn,    uint32, earfcn,    "EARFCN");
+  PB_FIELD(2, "phy_cell_id", phyCellId, PhyCellId, uint32, eutraPci,  "Physical cell identity");
+  PB_FIELD(3, "eutra_band",  eutraBand, EutraBand, uint32, eutraBand, "Number of the E-UTRA operating band");
+  PB_FIELD(4, "rsrp",        rsrp,      Rsrp,      sint32, lteRsrp,   "Reported RSRP", viewer::convertedOnPage);
+  PB_FIELD(5, "rsrq",        rsrq,      Rsrq,      sint32, lteRsrq,   "Reported RSRQ", viewer::convertedOnPage);
 };
 
-// Measured UMTS, GSM and LTE neighbour cells of a UMTS cell.
 class KCellularWcdmaNbrCellMeas final : public PBCodable {
-  PB_MESSAGE(KCellularWcdmaNbrCellMeas)
-  PB_FIELD(1, "timestamp",        timestamp,       Timestamp,       uint64);
-  PB_LIST (2, "meas_utra_result", measUtraResults, MeasUtraResults, measUtraResult, MeasUtraResult, repeated<message<UtraCellMeasResult>>);
-  PB_LIST (3, "meas_gsm_result",  measGsmResults,  MeasGsmResults, measGsmResult, MeasGsmResult, repeated<message<GsmCellMeasResult>>);
-  PB_LIST (4, "meas_lte_result",  measLteResults,  MeasLteResults, measLteResult, MeasLteResult, repeated<message<LteCellMeasResult>>);
+  PB_MESSAGE(KCellularWcdmaNbrCellMeas,
+             "Measured UMTS, GSM and LTE neighbour cells of a UMTS cell.",
+             "\"UMTS UMTS Neighbor Cell Meas\", \"UMTS GSM Neighbor Cell Meas\" and \"UMTS LTE Neighbor Cell Meas\"")
+  PB_FIELD(1, "timestamp",        timestamp,       Timestamp, uint64, timestamp, "Time of the values", viewer::localTime);
+  PB_LIST (2, "meas_utra_result", measUtraResults, MeasUtraResults, measUtraResult, MeasUtraResult, repeated<message<UtraCellMeasResult>>,
+              "One entry per UMTS neighbour", viewer::pageEntriesGetTimestamp);
+  PB_LIST (3, "meas_gsm_result",  measGsmResults,  MeasGsmResults, measGsmResult, MeasGsmResult, repeated<message<GsmCellMeasResult>>,
+              "One entry per GSM neighbour", viewer::pageEntriesGetTimestamp);
+  PB_LIST (4, "meas_lte_result",  measLteResults,  MeasLteResults, measLteResult, MeasLteResult, repeated<message<LteCellMeasResult>>,
+              "One entry per LTE neighbour", viewer::pageEntriesGetTimestamp);
 };
 
 // All of them, in the order of the registry.

@@ -12,6 +12,7 @@
 
 #include "messages/runtime/byte_field.h"
 #include "messages/runtime/enumeration.h"
+#include "messages/runtime/field_meaning.h"
 #include "messages/runtime/message_list.h"
 #include "messages/runtime/repeated_scalar.h"
 #include "messages/runtime/wire_format.h"
@@ -138,8 +139,11 @@ struct MessageDescriptor {
   // Destroys the message and makes an empty one in its place.
   void (*renew)(PBCodable& message);
   DropRule* drops;
+  MessageMeaning meaning;
+  const FieldMeaning* meanings;  // in the order of the rows
 
   std::span<const FieldDescriptor> fields() const noexcept { return {rows, rowCount}; }
+  const FieldMeaning& meaningOf(const FieldDescriptor& row) const noexcept { return meanings[&row - rows]; }
   // Null when there is no such field.
   const FieldDescriptor* field(std::uint64_t number) const noexcept {
     if (number >= fieldNumberLimit) return nullptr;

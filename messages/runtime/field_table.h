@@ -1,14 +1,15 @@
 // SPDX-License-Identifier: Apache-2.0
 //
 // How a message class is written: as the table of its fields, one row each, in the order number, key of the dictionary
-// form, property, type. A row makes the member, the accessors and the field's descriptor. A number used twice in one
-// class, or a type or name that is mistyped, does not compile.
+// form, property and its capitalized form, type, and what the field means. A row makes the member, the accessors and
+// the field's descriptor. A number used twice in one class or a type that does not exist does not compile, nor does a
+// row whose names disagree: key, property and the accessors are the same letters.
 //
 //   class KCellularLteTxPower final : public PBCodable {
-//     PB_MESSAGE(KCellularLteTxPower)
-//     PB_FIELD(1, "timestamp",     timestamp,    Timestamp,    uint64);
+//     PB_MESSAGE(KCellularLteTxPower, "Uplink transmit power, per subframe.", "\"UMTS Tx Power\"")
+//     PB_FIELD(1, "timestamp",     timestamp,    Timestamp,    uint64, timestamp, "Time of the values");
 //     PB_LIST (2, "tx_power_info", txPowerInfos, TxPowerInfos, txPowerInfo, TxPowerInfo,
-//              repeated<message<TxPowerInfo>>);
+//              repeated<message<TxPowerInfo>>, "One entry per subframe");
 //   };
 //
 // and, in one source file, PB_DEFINE(KCellularLteTxPower), or, for a class whose decoding drops some numbers,
@@ -25,6 +26,11 @@
 //   PB_VALUES  repeated numbers: csTxPwrs(), csTxPwrsCount(), clearCsTxPwrs(), addCsTxPwr(value),
 //              csTxPwrAtIndex(index), setCsTxPwrs(values, count).
 //   An index that is too large throws std::out_of_range, "idx (7) is out of range (3)".
+//
+// What a field means stands behind its type: for numbers the quantity, a name of the namespace `quantities` of where
+// the table stands, then for all a text, which leaves unit, range and clause to the quantity, then, where they apply,
+// the mark `personal` and a ViewerNote. What a class means is its text and the pages that show it. Tables that are not
+// published leave all that out.
 #pragma once
 
 #include <array>
@@ -32,6 +38,7 @@
 #include <span>
 
 #include "messages/runtime/codable.h"
+#include "messages/runtime/field_meaning.h"
 #include "messages/runtime/field_run.h"
 
 namespace probeview {
@@ -52,6 +59,26 @@ consteval std::string_view nameIn(std::string_view printedKey) {
     if (!isLetter && !(character >= '0' && character <= '9') && character != '_') throw "a key is an identifier";
   }
   return name;
+}
+
+constexpr char lowerCase(char letter) {
+  return letter >= 'A' && letter <= 'Z' ? static_cast<char>(letter - 'A' + 'a') : letter;
+}
+
+// Whether the accessors' name is the property's with its first letter in upper case.
+constexpr bool isCapitalized(std::string_view property, std::string_view accessor) {
+  return property.substr(1) == accessor.substr(1) && property[0] == lowerCase(accessor[0]) &&
+         property[0] != accessor[0];
+}
+
+// Whether key and property are the same letters. A list's property may be the plural.
+constexpr bool isNamedAfter(std::string_view property, std::string_view key, bool isList) {
+  std::size_t at = 0;
+  for (const char letter : key) {
+    if (letter == '_') continue;
+    if (at == property.size() || lowerCase(property[at++]) != lowerCase(letter)) return false;
+  }
+  return at == property.size() || (isList && property.substr(at) == "s");
 }
 
 template <typename Message, unsigned Number>
@@ -108,6 +135,27 @@ consteval auto collectScalars() {
 template <const auto& rows>
 inline constexpr auto scalarRows = collectScalars<rows>();
 
+// In the order of the rows. Those of a table that is not published are empty.
+template <typename Message>
+consteval auto collectMeanings() {
+  std::array<FieldMeaning, countFields<Message>()> meanings;
+  std::size_t count = 0;
+  const auto collect = [&]<std::size_t Number>() {
+    if constexpr (hasField<Message, Number>) {
+      if constexpr (requires { Message::pbMeaning(FieldNumber<Number>{}); }) {
+        meanings[count] = Message::pbMeaning(FieldNumber<Number>{});
+      }
+      ++count;
+    }
+  };
+  [&]<std::size_t... Numbers>(std::index_sequence<Numbers...>) { (collect.template operator()<Numbers>(), ...); }
+  (std::make_index_sequence<fieldNumberLimit>{});
+  return meanings;
+}
+
+template <typename Message>
+inline constexpr auto fieldMeanings = collectMeanings<Message>();
+
 template <typename Message, DropRule* drops = dropNothing>
 consteval MessageDescriptor describeMessage(std::string_view name) {
   constexpr const auto& rows = fieldRows<Message, drops>;
@@ -132,6 +180,8 @@ consteval MessageDescriptor describeMessage(std::string_view name) {
   descriptor.make = []() -> std::unique_ptr<PBCodable> { return std::make_unique<Message>(); };
   descriptor.renew = [](PBCodable& message) { Message::renew(static_cast<Message&>(message)); };
   descriptor.drops = drops;
+  descriptor.meaning = Message::pbMeaning();
+  descriptor.meanings = fieldMeanings<Message>.data();
   return descriptor;
 }
 
@@ -139,7 +189,7 @@ consteval MessageDescriptor describeMessage(std::string_view name) {
 
 // Macros, because a row must make names: of a member, of its accessors and of its descriptor.
 
-#define PB_MESSAGE(Class)                                                                                    \
+#define PB_MESSAGE(Class, ...)                                                                               \
  public:                                                                                                     \
   Class() noexcept = default;                                                                                \
   Class(const Class& other) : PBCodable() { copyFrom(other); }                                               \
@@ -149,6 +199,7 @@ consteval MessageDescriptor describeMessage(std::string_view name) {
     return *this;                                                                                            \
   }                                                                                                          \
   static const ::probeview::MessageDescriptor pbDescriptor;                                                  \
+  static constexpr ::probeview::MessageMeaning pbMeaning() { return {__VA_ARGS__}; }                         \
   const ::probeview::MessageDescriptor& descriptor() const noexcept override;                                \
   std::unique_ptr<Class> copyWithZone() const { return std::make_unique<Class>(*this); }                     \
   void copyTo(Class& target) const { PBCodable::copyTo(target); }                                            \
@@ -169,6 +220,15 @@ consteval MessageDescriptor describeMessage(std::string_view name) {
       ::probeview::detail::describeMessage<Class __VA_OPT__(, ) __VA_ARGS__>(#Class); \
   const ::probeview::MessageDescriptor& Class::descriptor() const noexcept { return pbDescriptor; }
 
+#define PB_NAMES(key, property, Property, isList)                                                            \
+  static_assert(::probeview::detail::isNamedAfter(#property, key, isList), key " and " #property " differ"); \
+  static_assert(::probeview::detail::isCapitalized(#property, #Property), #property " and " #Property " differ");
+
+#define PB_MEANING(number, ...)                                                                       \
+  __VA_OPT__(static constexpr ::probeview::FieldMeaning pbMeaning(::probeview::FieldNumber<number>) { \
+    return ::probeview::FieldMeaning(__VA_ARGS__);                                                    \
+  })
+
 #define PB_ROW(number, key, property, type)                                                          \
   static constexpr ::probeview::FieldDescriptor pbField(::probeview::FieldNumber<number>) {          \
     return type::describe(number, ::probeview::detail::nameIn("\"" key "\": "), &Self::_##property); \
@@ -177,7 +237,7 @@ consteval MessageDescriptor describeMessage(std::string_view name) {
  private:                                                                                            \
   type::Stored _##property {}
 
-#define PB_FIELD(number, key, property, Property, type)                                            \
+#define PB_FIELD(number, key, property, Property, type, ...)                                       \
  public:                                                                                           \
   type::Stored property() const noexcept { return hasBit(number) ? _##property : type::Stored{}; } \
   void set##Property(type::Stored value) noexcept {                                                \
@@ -186,9 +246,11 @@ consteval MessageDescriptor describeMessage(std::string_view name) {
   }                                                                                                \
   bool has##Property() const noexcept { return hasBit(number); }                                   \
   void setHas##Property(bool present) noexcept { setBit(number, present); }                        \
+  PB_NAMES(key, property, Property, false)                                                         \
+  PB_MEANING(number __VA_OPT__(, quantities::) __VA_ARGS__)                                        \
   PB_ROW(number, key, property, type)
 
-#define PB_OBJECT(number, key, property, Property, type)                   \
+#define PB_OBJECT(number, key, property, Property, type, ...)              \
  public:                                                                   \
   type::Value property() const noexcept { return type::get(_##property); } \
   void set##Property(type::Value value) {                                  \
@@ -198,9 +260,11 @@ consteval MessageDescriptor describeMessage(std::string_view name) {
   void set##Property(std::nullptr_t) noexcept { _##property.clear(); }     \
   void set##Property(::probeview::detail::EmptyBraces) = delete;           \
   bool has##Property() const noexcept { return _##property.isPresent(); }  \
+  PB_NAMES(key, property, Property, false)                                 \
+  PB_MEANING(number __VA_OPT__(, ) __VA_ARGS__)                            \
   PB_ROW(number, key, property, type)
 
-#define PB_LIST(number, key, property, Property, single, Single, type)                                    \
+#define PB_LIST(number, key, property, Property, single, Single, type, ...)                               \
  public:                                                                                                  \
   type::View property() const noexcept { return {_##property.elements(), _##property.count()}; }          \
   void set##Property(type::View elements) { type::set(_##property, *this, elements); }                    \
@@ -215,9 +279,12 @@ consteval MessageDescriptor describeMessage(std::string_view name) {
   }                                                                                                       \
   std::size_t property##Count() const noexcept { return _##property.count(); }                            \
   type::Handle single##AtIndex(std::size_t index) const { return type::at(_##property, index); }          \
+  PB_NAMES(key, property, Property, true)                                                                 \
+  PB_NAMES(key, single, Single, false)                                                                    \
+  PB_MEANING(number __VA_OPT__(, ) __VA_ARGS__)                                                           \
   PB_ROW(number, key, property, type)
 
-#define PB_VALUES(number, key, property, Property, single, Single, type)                                \
+#define PB_VALUES(number, key, property, Property, single, Single, type, ...)                           \
  public:                                                                                                \
   const type::Number* property() const noexcept { return _##property.data(); }                          \
   std::size_t property##Count() const noexcept { return _##property.count(); }                          \
@@ -232,6 +299,9 @@ consteval MessageDescriptor describeMessage(std::string_view name) {
     _##property.set(values);                                                                            \
   }                                                                                                     \
   void set##Property(const type::Number* values, std::size_t count) { set##Property({values, count}); } \
+  PB_NAMES(key, property, Property, true)                                                               \
+  PB_NAMES(key, single, Single, false)                                                                  \
+  PB_MEANING(number __VA_OPT__(, quantities::) __VA_ARGS__)                                             \
   PB_ROW(number, key, property, type)
 
 }  // namespace probeview
