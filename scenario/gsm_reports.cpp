@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include <algorithm>
 
-#include "messages/wire_units.h"
+#include "messages/quantities.h"
 #include "scenario/family_reports.h"
 #include "scenario/selection.h"
 
@@ -54,7 +54,7 @@ void report(const Phone& phone, KCellularGsmIdleConfig& message) {
   message.setMultibRep(2);         // neighbours of the other band to report
   message.setGsmBand(static_cast<std::uint32_t>(bandCode(carrier)));
   message.setMsTxpwr(largestPowerLevel(carrier));
-  message.setRxAccMin(units::gsmRxLev.toUnsigned(GsmSelection::rxLevAccessMin));
+  message.setRxAccMin(quantities::gsmRxLev.toUnsigned(GsmSelection::rxLevAccessMin));
   message.setCbq(0);
   message.setCba(0);
   message.setC2Valid(1);
@@ -79,7 +79,7 @@ void report(const Phone& phone, KCellularGsmIdleScellMeasurement& message) {
   const GsmState& gsm = phone.gsm();
   message.setScellArfcn(phone.network().carrierOf(*gsm.serving).channel);
   message.setCurrentAntenna(gsm.antenna);
-  message.setIdleRxlevDBm(units::gsmIdleLevel.toSigned(gsm.rxLev));
+  message.setIdleRxlevDBm(quantities::gsmIdleLevel.toSigned(gsm.rxLev));
 }
 
 void report(const Phone& phone, KCellularGsmCsRfMeasurement& message) {
@@ -88,7 +88,7 @@ void report(const Phone& phone, KCellularGsmCsRfMeasurement& message) {
   message.setScellArfcn(carrier.channel);
   message.setCurrentAntenna(gsm.antenna);
   for (const int power : gsm.transmitPowers) message.addCsTxPwr(power);
-  message.setCsRxlevSub(units::gsmRxLev.toUnsigned(gsm.dedicatedRxLev));
+  message.setCsRxlevSub(quantities::gsmRxLev.toUnsigned(gsm.dedicatedRxLev));
   message.setCsRxqualSub(gsm.rxQual);
   message.setScellBand(static_cast<std::uint32_t>(bandCode(carrier)));
 }
@@ -104,23 +104,24 @@ void report(const Phone& phone, KCellularGsmGrrEventMeasCr& message) {
     neighbour.setCi(cell.identity);
     neighbour.setBsic(cell.physicalIdentity);
     neighbour.setArfcn(network.carrierOf(measured.cell).channel);
-    neighbour.setRxlev(units::gsmRxLev.toUnsigned(measured.strength));
+    neighbour.setRxlev(quantities::gsmRxLev.toUnsigned(measured.strength));
   }
   for (const CellMeasurement& measured : phone.gsm().neighbours.umts) {
     UmtsNcellMeas& neighbour = message.addUmtsNcellMeas();
     neighbour.setCpichSc(network.cells[measured.cell].physicalIdentity);
     neighbour.setDlUarfcn(network.carrierOf(measured.cell).channel);
-    neighbour.setCpichRscp(units::utraRscp.toUnsigned(measured.strength));
-    neighbour.setCpichEcn0(units::utraEcNo.toUnsigned(measured.quality));
+    neighbour.setCpichRscp(quantities::utraRscp.toUnsigned(measured.strength));
+    neighbour.setCpichEcn0(quantities::utraEcNo.toUnsigned(measured.quality));
   }
   for (const CellMeasurement& measured : phone.gsm().neighbours.lte) {
     const Carrier& carrier = network.carrierOf(measured.cell);
     LteNcellMeas& neighbour = message.addLteNcellMeas();
     neighbour.setPhysicalCellId(network.cells[measured.cell].physicalIdentity);
-    if (const auto index = units::lteBandwidthIndex(bandwidthMegahertz(carrier))) neighbour.setBandwidth(*index);
-    neighbour.setRsrp(units::lteRsrp.toUnsigned(measured.strength));
+    if (const auto index = quantities::lteBandwidth.indexOf(bandwidthMegahertz(carrier)))
+      neighbour.setBandwidth(*index);
+    neighbour.setRsrp(quantities::lteRsrp.toUnsigned(measured.strength));
     neighbour.setEarfcn(carrier.channel);
-    neighbour.setRsrq(units::lteRsrq.toUnsigned(measured.quality));
+    neighbour.setRsrq(quantities::lteRsrq.toUnsigned(measured.quality));
   }
 }
 

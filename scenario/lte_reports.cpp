@@ -4,7 +4,7 @@
 #include <set>
 #include <string>
 
-#include "messages/wire_units.h"
+#include "messages/quantities.h"
 #include "scenario/family_reports.h"
 #include "scenario/selection.h"
 
@@ -12,7 +12,7 @@ namespace probeview::scenario {
 namespace {
 
 std::uint32_t bandwidthIndex(const Carrier& carrier) {
-  return units::lteBandwidthIndex(bandwidthMegahertz(carrier)).value_or(0);
+  return quantities::lteBandwidth.indexOf(bandwidthMegahertz(carrier)).value_or(0);
 }
 
 // System information counts levels in steps of 2 dB (3GPP TS 36.331, 6.3.4: Q-RxLevMin, ReselectionThreshold).
@@ -20,12 +20,12 @@ constexpr int lteDecibelsPerStep = 2;
 
 void fill(RsrpRsrqSinr& values, const Network& network, const LteSample& sample) {
   values.setPhyCellId(network.cells[sample.cell].physicalIdentity);
-  values.setRsrp0(units::lteSampleRsrp.toSigned(sample.rsrp[0]));
-  values.setRsrp1(units::lteSampleRsrp.toSigned(sample.rsrp[1]));
-  values.setRsrq0(units::lteSampleRsrq.toSigned(sample.rsrq[0]));
-  values.setRsrq1(units::lteSampleRsrq.toSigned(sample.rsrq[1]));
-  values.setSinr0(units::lteSampleSinr.toSigned(sample.sinr[0]));
-  values.setSinr1(units::lteSampleSinr.toSigned(sample.sinr[1]));
+  values.setRsrp0(quantities::lteSampleRsrp.toSigned(sample.rsrp[0]));
+  values.setRsrp1(quantities::lteSampleRsrp.toSigned(sample.rsrp[1]));
+  values.setRsrq0(quantities::lteSampleRsrq.toSigned(sample.rsrq[0]));
+  values.setRsrq1(quantities::lteSampleRsrq.toSigned(sample.rsrq[1]));
+  values.setSinr0(quantities::lteSampleSinr.toSigned(sample.sinr[0]));
+  values.setSinr1(quantities::lteSampleSinr.toSigned(sample.sinr[1]));
 }
 
 }  // namespace
@@ -61,8 +61,8 @@ void report(const Phone& phone, KCellularLteScellInfo& message) {
   message.setPhyCellId(cell.physicalIdentity);
   message.setDlFreq(carrier.channel);
   message.setUlFreq(carrier.channel + uplinkChannelOffset);
-  message.setDlBw(units::lteServingDownlinkBandwidth(bandwidthMegahertz(carrier)));
-  message.setUlBw(units::lteServingUplinkBandwidth(bandwidthMegahertz(carrier)));
+  message.setDlBw(quantities::lteServingDownlinkBandwidth.toUnsigned(bandwidthMegahertz(carrier)));
+  message.setUlBw(quantities::lteServingUplinkBandwidth.toUnsigned(bandwidthMegahertz(carrier)));
   message.setCellId(cell.identity);
   message.setFreqBandInd(carrier.band);
   message.setTrackingAreaCode(cell.areaCode);
@@ -176,10 +176,10 @@ void report(const Phone& phone, KCellularLteCarrierAggregationStatus& message) {
     listed.setDlBandwidth(bandwidthIndex(carrier));
     listed.setHasUplink(false);                                 // the phone sends on its primary carrier only
     if (entry.state == SecondaryState::Deconfigured) continue;  // and is not measured any more
-    listed.setRsrp(units::lteCarrierRsrp.toSigned(entry.rsrp));
-    listed.setRsrq(units::lteCarrierRsrq.toSigned(entry.rsrq));
+    listed.setRsrp(quantities::lteCarrierRsrp.toSigned(entry.rsrp));
+    listed.setRsrq(quantities::lteCarrierRsrq.toSigned(entry.rsrq));
     listed.setSnr(wholeDecibels(entry.sinr));
-    listed.setRssi(units::lteCarrierRssi.toSigned(entry.rssi));
+    listed.setRssi(quantities::lteCarrierRssi.toSigned(entry.rssi));
   }
 }
 
@@ -190,8 +190,8 @@ void report(const Phone& phone, KCellularLteNbrEutraCellMeas& message) {
     neighbour.setNbrEarfcn(network.carrierOf(measured.cell).channel);
     neighbour.setNbrPhysCellId(network.cells[measured.cell].physicalIdentity);
     neighbour.setFreqBandInd(network.carrierOf(measured.cell).band);
-    neighbour.setNbrRsrp(units::lteRsrp.toSigned(measured.strength));
-    neighbour.setNbrRsrq(units::lteRsrq.toSigned(measured.quality));
+    neighbour.setNbrRsrp(quantities::lteRsrp.toSigned(measured.strength));
+    neighbour.setNbrRsrq(quantities::lteRsrq.toSigned(measured.quality));
   }
 }
 
@@ -201,14 +201,14 @@ void report(const Phone& phone, KCellularLteNbrInterRatCellMeas& message) {
     EgwErrcNbrUtraMeas& neighbour = message.addMeasNbrUtra();
     neighbour.setUarfcn(network.carrierOf(measured.cell).channel);
     neighbour.setPsc(network.cells[measured.cell].physicalIdentity);
-    neighbour.setRscp(units::utraRscp.toSigned(measured.strength));
-    neighbour.setEcno(units::utraEcNo.toUnsigned(measured.quality));
+    neighbour.setRscp(quantities::utraRscp.toSigned(measured.strength));
+    neighbour.setEcno(quantities::utraEcNo.toUnsigned(measured.quality));
   }
   for (const CellMeasurement& measured : phone.lte().neighbours.gsm) {
     EgwErrcNbrGeranMeas& neighbour = message.addMeasNbrGeran();
     neighbour.setArfcn(network.carrierOf(measured.cell).channel);
     neighbour.setBsic(network.cells[measured.cell].physicalIdentity);
-    neighbour.setRxlev(units::gsmRxLev.toUnsigned(measured.strength));
+    neighbour.setRxlev(quantities::gsmRxLev.toUnsigned(measured.strength));
   }
 }
 

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include <set>
 
-#include "messages/wire_units.h"
+#include "messages/quantities.h"
 #include "scenario/family_reports.h"
 #include "scenario/selection.h"
 
@@ -118,22 +118,22 @@ void report(const Phone& phone, KCellularWcdmaNbrCellMeas& message) {
     result.setUarfcn(network.carrierOf(measured.cell).channel);
     result.setBand(network.carrierOf(measured.cell).band);
     result.setPsc(network.cells[measured.cell].physicalIdentity);
-    result.setEcno(units::utraEcNo.toUnsigned(measured.quality));
-    result.setRscp(units::utraRscp.toSigned(measured.strength));
+    result.setEcno(quantities::utraEcNo.toUnsigned(measured.quality));
+    result.setRscp(quantities::utraRscp.toSigned(measured.strength));
   }
   for (const CellMeasurement& measured : phone.umts().neighbours.gsm) {
     GsmCellMeasResult& result = message.addMeasGsmResult();
     result.setArfcn(network.carrierOf(measured.cell).channel);
     result.setBsic(network.cells[measured.cell].physicalIdentity);
-    result.setRxlev(units::gsmRxLev.toUnsigned(measured.strength));
+    result.setRxlev(quantities::gsmRxLev.toUnsigned(measured.strength));
   }
   for (const CellMeasurement& measured : phone.umts().neighbours.lte) {
     LteCellMeasResult& result = message.addMeasLteResult();
     result.setEarfcn(network.carrierOf(measured.cell).channel);
     result.setPhyCellId(network.cells[measured.cell].physicalIdentity);
     result.setEutraBand(network.carrierOf(measured.cell).band);
-    result.setRsrp(units::lteRsrp.toSigned(measured.strength));
-    result.setRsrq(units::lteRsrq.toSigned(measured.quality));
+    result.setRsrp(quantities::lteRsrp.toSigned(measured.strength));
+    result.setRsrq(quantities::lteRsrq.toSigned(measured.quality));
   }
 }
 

@@ -9,6 +9,7 @@
 #include <string_view>
 #include <utility>
 
+#include "messages/quantities.h"
 #include "store/metric_validator.h"
 #include "values/dictionary.h"
 
@@ -31,29 +32,28 @@ struct Adjustment {
   double offset = 0.0;
 };
 
-constexpr Adjustment subtractInteger(std::string_view key, std::int32_t whole) {
-  return {key, Adjustment::Kind::SubtractInteger, whole};
+// How the number of a quantity becomes its value. Which of the four is done to a field is the store's; what the page
+// shows hangs on it, as whole numbers are cut and reals are not.
+constexpr Adjustment subtractInteger(std::string_view key, const Quantity& quantity) {
+  return {key, Adjustment::Kind::SubtractInteger, static_cast<std::int32_t>(quantity.offset)};
 }
-constexpr Adjustment divideInteger(std::string_view key, std::int32_t divisor) {
-  return {key, Adjustment::Kind::DivideInteger, divisor};
+constexpr Adjustment divideInteger(std::string_view key, const Quantity& quantity) {
+  return {key, Adjustment::Kind::DivideInteger, static_cast<std::int32_t>(quantity.scale)};
 }
-constexpr Adjustment scaleReal(std::string_view key, double factor, double offset = 0.0) {
-  return {key, Adjustment::Kind::ScaleReal, 0, factor, offset};
+constexpr Adjustment scaleReal(std::string_view key, const Quantity& quantity) {
+  return {key, Adjustment::Kind::ScaleReal, 0, 1 / quantity.scale, 0 - quantity.offset};
 }
-constexpr Adjustment divideReal(std::string_view key, double divisor) {
-  return {key, Adjustment::Kind::DivideReal, 0, divisor};
+constexpr Adjustment divideReal(std::string_view key, const Quantity& quantity) {
+  return {key, Adjustment::Kind::DivideReal, 0, quantity.scale};
 }
 constexpr Adjustment lookUpBandwidth(std::string_view key) { return {key, Adjustment::Kind::LookUpBandwidth}; }
 
 // The service sends measurements as indices of the reported ranges; shown is one edge of the interval.
-// 3GPP TS 36.133, 9.1.4 (RSRP, in dBm) and 9.1.7 (RSRQ, in half dB).
-constexpr Adjustment rsrpToDbm(std::string_view key) { return subtractInteger(key, 140); }
-constexpr Adjustment rsrqToDb(std::string_view key) { return scaleReal(key, 0.5, -19.5); }
-// 3GPP TS 25.133, 9.1.1.3 (RSCP, in dBm) and 9.1.2.3 (Ec/No, in half dB).
-constexpr Adjustment rscpToDbm(std::string_view key) { return subtractInteger(key, 116); }
-constexpr Adjustment ecnoToDb(std::string_view key) { return scaleReal(key, 0.5, -24.5); }
-// 3GPP TS 45.008, 8.1.4 (RxLev, in dBm).
-constexpr Adjustment rxlevToDbm(std::string_view key) { return subtractInteger(key, 110); }
+constexpr Adjustment rsrpToDbm(std::string_view key) { return subtractInteger(key, quantities::lteRsrp); }
+constexpr Adjustment rsrqToDb(std::string_view key) { return scaleReal(key, quantities::lteRsrq); }
+constexpr Adjustment rscpToDbm(std::string_view key) { return subtractInteger(key, quantities::utraRscp); }
+constexpr Adjustment ecnoToDb(std::string_view key) { return scaleReal(key, quantities::utraEcNo); }
+constexpr Adjustment rxlevToDbm(std::string_view key) { return subtractInteger(key, quantities::gsmRxLev); }
 
 using Adjustments = std::span<const Adjustment>;
 using KeyNames = std::span<const std::string_view>;

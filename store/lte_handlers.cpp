@@ -3,6 +3,7 @@
 // Handlers of the LTE metrics. Only reselection and carrier aggregation fill the LTE record; the measurements are
 // rewritten in their display dictionaries alone, so the record's lists for them keep their placeholder.
 #include "messages/metric_identifiers.h"
+#include "messages/quantities.h"
 #include "store/handlers.h"
 
 namespace probeview {
@@ -12,6 +13,7 @@ namespace {
 void servingCellInfo(HandlerTurn& turn) {
   turn.formatTimestamp();
   // The bandwidth travels in quarter megahertz. Two truncating steps, each of them stored.
+  static_assert(quantities::lteServingDownlinkBandwidth.scale == 2 * 2);
   turn.halveInteger("dl_bw");
   turn.halveInteger("dl_bw");
   turn.log();
@@ -48,7 +50,8 @@ void interRatMeasurement(HandlerTurn& turn) {
 
 void rsrpRsrqSinr(HandlerTurn& turn) {
   // The ratio of signal to noise travels in half decibels.
-  static constexpr Adjustment sample[] = {scaleReal("sinr0", 0.5), scaleReal("sinr1", 0.5)};
+  static constexpr Adjustment sample[] = {scaleReal("sinr0", quantities::lteSampleSinr),
+                                          scaleReal("sinr1", quantities::lteSampleSinr)};
   // The line shows the message as it came, its timestamp in milliseconds.
   turn.log();
   turn.formatTimestamp();
@@ -57,8 +60,9 @@ void rsrpRsrqSinr(HandlerTurn& turn) {
 
 void carrierAggregation(HandlerTurn& turn) {
   // Power and quality travel in hundredths.
-  static constexpr Adjustment carrier[] = {lookUpBandwidth("dl_bandwidth"), divideInteger("rsrp", 100),
-                                           divideInteger("rssi", 100), divideReal("rsrq", 100.0)};
+  static constexpr Adjustment carrier[] = {
+      lookUpBandwidth("dl_bandwidth"), divideInteger("rsrp", quantities::lteCarrierRsrp),
+      divideInteger("rssi", quantities::lteCarrierRssi), divideReal("rsrq", quantities::lteCarrierRsrq)};
   formatTimestampAndLog(turn);
   turn.collect("scc_list", turn.lte().CAStatusList, carrier);
 }

@@ -17,6 +17,7 @@
 #include <string_view>
 
 #include "client/radix_wrapper_delegate.h"
+#include "messages/quantities.h"
 #include "platform/time_zone.h"
 #include "platform/timestamp_formatter.h"
 #include "store/display_dictionaries.h"
@@ -77,7 +78,13 @@ class MetricValidator : public RadixWrapperDelegate {
   const Common& myCommon() const { return common_; }
 
   // MHz of a downlink bandwidth index (3GPP TS 36.331, 6.2.2, dl-Bandwidth: n6 to n100).
-  static constexpr std::array<float, 6> dlbwlookup = {1.4f, 3.0f, 5.0f, 10.0f, 15.0f, 20.0f};
+  static constexpr std::array<float, quantities::lteBandwidths.size()> dlbwlookup = [] {
+    std::array<float, quantities::lteBandwidths.size()> megahertz{};
+    for (std::size_t index = 0; index < megahertz.size(); ++index) {
+      megahertz[index] = static_cast<float>(quantities::lteBandwidths[index]);
+    }
+    return megahertz;
+  }();
 
   // A display dictionary: absent until its metric first arrives, then the whole dictionary form of the latest message,
   // its timestamp as text, with the changes of its handler. Handlers work through the mutable access, and what they

@@ -4,7 +4,7 @@
 #include <array>
 #include <cmath>
 
-#include "messages/wire_units.h"
+#include "messages/quantities.h"
 #include "service/sources/trace_cell.h"
 #include "service/sources/trace_field.h"
 #include "values/plain_text.h"
@@ -55,19 +55,19 @@ constexpr TechnologyName technologyNames[] = {
 
 // Which quantities a technology's columns hold.
 struct TechnologyColumns {
-  const units::Quantity& level;
-  const units::Quantity& quality;
+  const Quantity& level;
+  const Quantity& quality;
 };
 TechnologyColumns columnsOf(TraceTechnology technology) {
   switch (technology) {
     case TraceTechnology::Lte:
       break;
     case TraceTechnology::Umts:
-      return {units::utraRscp, units::utraEcNo};
+      return {quantities::utraRscp, quantities::utraEcNo};
     case TraceTechnology::Gsm:
-      return {units::gsmRxLev, units::gsmRxQual};
+      return {quantities::gsmRxLev, quantities::gsmRxQual};
   }
-  return {units::lteRsrp, units::lteRsrq};
+  return {quantities::lteRsrp, quantities::lteRsrq};
 }
 
 std::optional<std::chrono::milliseconds> parsedTime(std::string_view field) {
@@ -261,7 +261,7 @@ class Reader {
     dropUnlessMeasurable(fields, Quality, columns.quality, row.quality);
     if (*row.technology != TraceTechnology::Lte) return true;
     if (!readNumber(fields, SignalToNoise, row.signalToNoise)) return false;
-    dropUnlessMeasurable(fields, SignalToNoise, units::lteSampleSinr, row.signalToNoise);
+    dropUnlessMeasurable(fields, SignalToNoise, quantities::lteSampleSinr, row.signalToNoise);
     return true;
   }
 
@@ -322,9 +322,9 @@ class Reader {
     return true;
   }
 
-  void dropUnlessMeasurable(const Fields& fields, Column column, const units::Quantity& quantity,
+  void dropUnlessMeasurable(const Fields& fields, Column column, const Quantity& quantity,
                             std::optional<double>& number) {
-    if (!number || quantity.contains(*number)) return;
+    if (!number || quantity.isMeasurable(*number)) return;
     std::string text(columnNames[column]);
     text += ' ';
     text += shownNumber(fields[column]);

@@ -6,9 +6,9 @@
 #include "messages/gsm_messages.h"
 #include "messages/lte_messages.h"
 #include "messages/metric_identifiers.h"
+#include "messages/quantities.h"
 #include "messages/runtime/data_writer.h"
 #include "messages/umts_messages.h"
-#include "messages/wire_units.h"
 
 namespace probeview {
 
@@ -144,16 +144,16 @@ void TraceTranslator::translateLte(const TraceRow& row) {
   if (row.level || row.quality || row.signalToNoise) {
     auto message = messageAt<KCellularLteRsrpRsrqSinr>(row);
     RsrpRsrqSinr& sample = message.addInstValues();
-    if (row.level) sample.setRsrp0(units::lteSampleRsrp.toSigned(*row.level));
-    if (row.quality) sample.setRsrq0(units::lteSampleRsrq.toSigned(*row.quality));
-    if (row.signalToNoise) sample.setSinr0(units::lteSampleSinr.toSigned(*row.signalToNoise));
+    if (row.level) sample.setRsrp0(quantities::lteSampleRsrp.toSigned(*row.level));
+    if (row.quality) sample.setRsrq0(quantities::lteSampleRsrq.toSigned(*row.quality));
+    if (row.signalToNoise) sample.setSinr0(quantities::lteSampleSinr.toSigned(*row.signalToNoise));
     add(K_LTE_RSRP_RSRQ_SINR, message);
   }
   if (row.neighbourLevel || row.neighbourQuality) {
     auto message = messageAt<KCellularLteNbrEutraCellMeas>(row);
     EgwErrcNbrEutraMeas& neighbour = message.addMeasNbrEutra();
-    if (row.neighbourLevel) neighbour.setNbrRsrp(units::lteRsrp.toSigned(*row.neighbourLevel));
-    if (row.neighbourQuality) neighbour.setNbrRsrq(units::lteRsrq.toSigned(*row.neighbourQuality));
+    if (row.neighbourLevel) neighbour.setNbrRsrp(quantities::lteRsrp.toSigned(*row.neighbourLevel));
+    if (row.neighbourQuality) neighbour.setNbrRsrq(quantities::lteRsrq.toSigned(*row.neighbourQuality));
     add(K_LTE_INTRARAT_MEAS, message);
   }
 }
@@ -174,8 +174,8 @@ void TraceTranslator::translateUmts(const TraceRow& row) {
   if (row.neighbourLevel || row.neighbourQuality) {
     auto message = messageAt<KCellularWcdmaNbrCellMeas>(row);
     UtraCellMeasResult& neighbour = message.addMeasUtraResult();
-    if (row.neighbourQuality) neighbour.setEcno(units::utraEcNo.toUnsigned(*row.neighbourQuality));
-    if (row.neighbourLevel) neighbour.setRscp(units::utraRscp.toSigned(*row.neighbourLevel));
+    if (row.neighbourQuality) neighbour.setEcno(quantities::utraEcNo.toUnsigned(*row.neighbourQuality));
+    if (row.neighbourLevel) neighbour.setRscp(quantities::utraRscp.toSigned(*row.neighbourLevel));
     add(K_UMTS_NCELL_MEAS, message);
   }
 }
@@ -196,18 +196,18 @@ void TraceTranslator::translateGsm(const TraceRow& row) {
   if (dedicated.value_or(false)) {
     if (row.level || row.quality) {
       auto message = messageAt<KCellularGsmCsRfMeasurement>(row);
-      if (row.level) message.setCsRxlevSub(units::gsmRxLev.toUnsigned(*row.level));
-      if (row.quality) message.setCsRxqualSub(units::gsmRxQual.toUnsigned(*row.quality));
+      if (row.level) message.setCsRxlevSub(quantities::gsmRxLev.toUnsigned(*row.level));
+      if (row.quality) message.setCsRxqualSub(quantities::gsmRxQual.toUnsigned(*row.quality));
       add(K_GSM_CS_RF_MEAS, message);
     }
   } else if (row.level) {
     auto message = messageAt<KCellularGsmIdleScellMeasurement>(row);
-    message.setIdleRxlevDBm(units::gsmIdleLevel.toSigned(*row.level));
+    message.setIdleRxlevDBm(quantities::gsmIdleLevel.toSigned(*row.level));
     add(K_GSM_IDLE_SCELL_MEAS, message);
   }
   if (row.neighbourLevel) {
     auto message = messageAt<KCellularGsmGrrEventMeasCr>(row);
-    message.addGsmNcellMeas().setRxlev(units::gsmRxLev.toUnsigned(*row.neighbourLevel));
+    message.addGsmNcellMeas().setRxlev(quantities::gsmRxLev.toUnsigned(*row.neighbourLevel));
     add(K_GSM_NCELL_MEAS, message);
   }
 }

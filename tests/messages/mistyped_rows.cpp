@@ -16,16 +16,8 @@ class Mistyped final : public PBCodable {
   PB_FIELD(4, "prev_state",      prevState,    PrevStaet,    uint32);
 #elif defined(KEY)
   PB_FIELD(4, "prev_staet",      prevState,    PrevState,    uint32);
-#elif defined(SHORTER_KEY)
-  PB_FIELD(4, "prev",            prevState,    PrevState,    uint32);
-#elif defined(PLURAL_OF_ONE)
-  PB_OBJECT(4, "call_id",        callIds,      CallIds,      string);
-#elif defined(LIST)
-  PB_LIST(4, "scc_list",         scLists,      ScLists, scList, ScList, repeated<message<Mistyped>>);
 #elif defined(ELEMENT)
   PB_LIST(4, "scc_list",         sccLists,     SccLists, sccList, ScList, repeated<message<Mistyped>>);
-#elif defined(ELEMENT_OF_NUMBERS)
-  PB_VALUES(4, "band",           bands,        Bands, bnd, Bnd, repeated<uint32>);
 #elif defined(NUMBER)
   PB_FIELD(1, "state",           state,        State,        uint32);
 #endif
