@@ -8,7 +8,6 @@
 #include "messages/runtime/codable.h"
 #include "messages/runtime/data_reader.h"
 #include "radix/client.h"
-#include "tools/personal_data.h"
 #include "values/json.h"
 #include "values/plain_text.h"
 #include "values/printer.h"
@@ -34,6 +33,14 @@ std::optional<Dictionary> contentOf(const Dictionary& event) {
   return message->dictionaryRepresentation();
 }
 
+void hide(Value& value, const MessageDescriptor& message) {
+  if (Dictionary* const dictionary = value.mutableDictionary()) {
+    hidePersonalData(*dictionary, message);
+  } else if (List* const list = value.mutableList()) {
+    for (Value& element : *list) hide(element, message);
+  }
+}
+
 constexpr std::string_view timestampKey = "timestamp";
 
 // Without the times that change with every record, however deep they lie.
@@ -54,6 +61,18 @@ Value withoutTimestamps(const Value& value) {
 }
 
 }  // namespace
+
+void hidePersonalData(Dictionary& dictionary, const MessageDescriptor& message) {
+  for (auto& [key, value] : dictionary) {
+    const FieldDescriptor* const field = message.fieldNamed(key.text());
+    if (field == nullptr) continue;
+    if (message.meaningOf(*field).isPersonal) {
+      value = Value::constant("…");
+    } else if (field->element != nullptr) {
+      hide(value, *field->element);
+    }
+  }
+}
 
 std::string RecordText::line(const Dictionary& event) { return line(event, contentOf(event), {}); }
 
@@ -92,7 +111,8 @@ std::string RecordText::line(const Dictionary& event, std::optional<Dictionary> 
   const Value* origin = event.find(radix::kKeyOrigin);
   const std::string_view originText = origin != nullptr ? origin->text().value_or("") : "";
   const MetricIdentifier* metric = metricWithId(id);
-  if (content && !options_.personal) hidePersonalData(*content);
+  // Who has content has the message that it was decoded as.
+  if (content && !options_.personal) hidePersonalData(*content, *metric->message);
   const std::string name = metric != nullptr ? std::string(metric->name) : hexText(id);
 
   std::string text;

@@ -7,10 +7,14 @@
 #include <optional>
 #include <string>
 
+#include "messages/runtime/field_descriptor.h"
 #include "platform/timestamp_formatter.h"
 #include "values/dictionary.h"
 
 namespace probeview {
+
+// Puts "…" in the place of the fields of the message that are marked as personal, however deep they lie.
+void hidePersonalData(Dictionary& dictionary, const MessageDescriptor& message);
 
 // Shows metric events of the service, each as one line.
 class RecordText {

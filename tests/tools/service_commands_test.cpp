@@ -9,10 +9,11 @@
 #include <sstream>
 
 #include "messages/metric_identifiers.h"
+#include "messages/nas_messages.h"
 #include "tests/service/harness/temporary_folder.h"
 #include "tests/service/harness/test_service.h"
-#include "tools/personal_data.h"
 #include "tools/probectl.h"
+#include "tools/record_text.h"
 #include "values/printer.h"
 
 namespace probeview {
@@ -145,16 +146,22 @@ TEST(WatchCommand, ANumberOfRecordsThatIsNoneGetsAnErrorForPeople) {
 }
 
 TEST(PersonalData, IsHiddenHoweverDeepItLies) {
-  Dictionary dictionary{
-      {"imsi", Value::text("001010000000001")},
-      {"guti", Dictionary{{"m_tmsi", std::uint32_t{5}}}},
-      {"bearer_contexts", List{Dictionary{{"cid", std::uint32_t{1}}, {"pdp_addr", Value::text("x")}}}},
-      {"ef_list", List{Dictionary{{"ef_id", std::uint32_t{28423}}, {"content", Value::text("y")}}}},
+  const auto shown = [](const MessageDescriptor& message, Dictionary dictionary) {
+    hidePersonalData(dictionary, message);
+    return printed(dictionary);
   };
-  hidePersonalData(dictionary);
-  EXPECT_EQ(printed(dictionary),
-            "[\"imsi\": \"…\", \"guti\": \"…\", \"bearer_contexts\": [[\"cid\": 1, \"pdp_addr\": \"…\"]], "
-            "\"ef_list\": [[\"ef_id\": 28423, \"content\": \"…\"]]]");
+  EXPECT_EQ(shown(KCellularMmCommonInfo::pbDescriptor,
+                  {{"imsi", Value::text("001010000000001")},
+                   {"eplmn_list", List{Dictionary{{"encoded_plmn", Value::text("z")}}}}}),
+            "[\"imsi\": \"…\", \"eplmn_list\": [[\"encoded_plmn\": \"z\"]]]");
+  EXPECT_EQ(shown(KCellularEmmContext::pbDescriptor, {{"guti", Dictionary{{"m_tmsi", std::uint32_t{5}}}}}),
+            "[\"guti\": \"…\"]");
+  EXPECT_EQ(shown(KCellularActivatedBearerContexts::pbDescriptor,
+                  {{"bearer_contexts", List{Dictionary{{"cid", std::uint32_t{1}}, {"pdp_addr", Value::text("x")}}}}}),
+            "[\"bearer_contexts\": [[\"cid\": 1, \"pdp_addr\": \"…\"]]]");
+  EXPECT_EQ(shown(KCellularSimCardFiles::pbDescriptor,
+                  {{"ef_list", List{Dictionary{{"ef_id", std::uint32_t{28423}}, {"content", Value::text("y")}}}}}),
+            "[\"ef_list\": [[\"ef_id\": 28423, \"content\": \"…\"]]]");
 }
 
 TEST_F(ServiceCommands, QueryPrintsTheAnswerAndNotTheRecordFromBefore) {
