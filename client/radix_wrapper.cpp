@@ -42,22 +42,21 @@ struct RadixWrapper::Shared {
   // On the wrapper's queue.
   static void take(const std::shared_ptr<Shared>& shared, const radix::client::ObjectHandle& event,
                    std::string_view eventName, Operation operation, bool isRecord) {
-    auto content = std::make_shared<const Dictionary>(radix::client::nativeDictionary(*event));
     std::string line(blockName);
     line += ": ";
     line += eventName;
     line += " dict=";
-    print(*content, line);
+    print(radix::client::nativeDictionary(*event), line);
     shared->systemLog.line(line);
     if (shared->delegate.get().expired()) return;
     // It waits until the main thread has had it.
-    shared->mainQueue.post(
-        [shared, content = std::move(content), operation, isRecord, hold = radix::client::holdOf(*event)] {
-          const std::shared_ptr<RadixWrapperDelegate> receiver = shared->delegate.get().lock();
-          if (receiver == nullptr) return;
-          if (isRecord) shared->noteRecord(*content);
-          (*receiver.*operation)(content.get());
-        });
+    shared->mainQueue.post([shared, event, operation, isRecord] {
+      const std::shared_ptr<RadixWrapperDelegate> receiver = shared->delegate.get().lock();
+      if (receiver == nullptr) return;
+      const Dictionary& content = radix::client::nativeDictionary(*event);
+      if (isRecord) shared->noteRecord(content);
+      (*receiver.*operation)(&content);
+    });
   }
 
   void noteRecord(const Dictionary& event) {

@@ -4,6 +4,7 @@
 // is decoded by itself, where what is understood must come back the same from its own encoding; then all are said to a
 // service, one after the other, while another client listens, which must get every record.
 #include <algorithm>
+#include <chrono>
 #include <cstdint>
 #include <cstdlib>
 #include <memory>
@@ -12,10 +13,13 @@
 #include <vector>
 
 #include "platform/manual_loop.h"
+#include "radix/arrived_event.h"
 #include "radix/dictionary_bytes.h"
 #include "radix/frames.h"
 #include "radix/in_process_link.h"
+#include "radix/source_states.h"
 #include "service/service.h"
+#include "tests/support/frames.h"
 
 namespace {
 
@@ -35,28 +39,43 @@ void checkDictionary(std::span<const std::uint8_t> bytes) {
   check(second && radix::encodeDictionary(*second) == encoded);
 }
 
+// What the handler of an event is given holds what the event says, within its bounds.
+void checkArrival(const radix::Event& event, std::optional<std::chrono::milliseconds> age) {
+  radix::client::ArrivedEvent arrived = radix::client::arrivedEvent(event, age);
+  check(arrived.foreignBytes <= arrived.size());
+  const bool isMetric = arrived.kind == radix::EventKind::Metric;
+  const auto object = radix::client::objectOf(std::move(arrived), std::chrono::hours(1), {});
+  const probeview::Dictionary& content = radix::client::nativeDictionary(*object);
+  check(content.find(radix::kKeyOrigin)->text()->size() <= radix::longestOrigin);
+  check(content.contains(radix::kKeyAge) == (isMetric && age.has_value()));
+  check(!isMetric || std::ranges::equal(*content.find(radix::kKeyPayload)->bytes(), event.payload()));
+}
+
 // Encodes again what it is told and remembers it.
 class Echo final : public radix::FrameHandler {
  public:
-  void onHello(radix::Hello hello) override { encoded = *radix::encode(hello); }
-  void onCommand(radix::Command command) override {
-    checkDictionary(command.arguments);
+  void onHello(const radix::Hello& hello) override { encoded = *radix::encode(hello); }
+  void onCommand(const radix::Command& command) override {
+    checkDictionary(command.arguments());
     encoded = *radix::encode(command);
   }
-  void onReply(radix::Reply reply) override {
-    checkDictionary(reply.content);
+  void onReply(const radix::Reply& reply) override {
+    checkDictionary(reply.content());
     encoded = *radix::encode(reply);
   }
-  void onDelivery(radix::Delivery delivery) override { encoded = *radix::encode(delivery); }
-  void onEvent(radix::Event event) override {
+  void onDelivery(const radix::Delivery& delivery) override { encoded = *radix::encode(delivery); }
+  void onEvent(const radix::Event& event, std::optional<std::chrono::milliseconds> age) override {
     encoded = *radix::encode(event);
-    if (!event.age) return;
-    const radix::Trailer trailer = radix::ageTrailer(*event.age);
+    checkArrival(event, age);
+    if (!age) return;
+    check(*age >= age->zero() && *age <= radix::longestSpan);
+    const radix::Trailer trailer = radix::ageTrailer(*age);
     encoded->insert(encoded->end(), trailer.bytes.begin(), trailer.bytes.begin() + trailer.size);
   }
-  void onDropped(radix::Dropped dropped) override { encoded = *radix::encode(dropped); }
-  void onPing(radix::Ping ping) override { encoded = *radix::encode(ping); }
-  void onSources(radix::Sources sources) override { encoded = *radix::encode(sources); }
+  void onDropped(const radix::Dropped& dropped) override { encoded = *radix::encode(dropped); }
+  void onPing(const radix::Ping& ping) override { encoded = *radix::encode(ping); }
+  // What is understood of them is said again, and not what else there was.
+  void onSources(const radix::Sources& sources) override { encoded = *radix::encode(radix::statesOf(sources)); }
 
   std::optional<Bytes> encoded;
 };
@@ -103,7 +122,7 @@ class Client final : radix::LinkListener, radix::FrameHandler {
   void onBatchEnd() override {}
   void onWritable() override {}
   void onClosed() override { closed_ = true; }
-  void onEvent(radix::Event) override { ++events_; }
+  void onEvent(const radix::Event&, std::optional<std::chrono::milliseconds>) override { ++events_; }
 
   std::unique_ptr<radix::Link> link_;
   std::size_t events_ = 0;
@@ -133,8 +152,8 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
   service.accept(std::move(goodEnds.second), {});
   service.accept(std::move(badEnds.second), {});
   Client good(std::move(goodEnds.first));
-  good.say(*radix::encode(radix::Hello{.name = "good", .observes = true}));
-  good.say(*radix::encode(radix::Delivery{true}));
+  good.say(*radix::encode(radix::observer("good")));
+  good.say(*radix::encode(radix::Delivery(true)));
   loop.run();
   Client bad(std::move(badEnds.first));
   std::size_t emitted = 0;

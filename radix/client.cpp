@@ -8,9 +8,7 @@
 
 namespace radix::client {
 
-probeview::Dictionary nativeDictionary(const Object& object) { return object.content(); }
-
-EventHold holdOf(const Object& event) { return event.hold(); }
+const probeview::Dictionary& nativeDictionary(const Object& object) { return object.content(); }
 
 ObjectHandle makeObject(const probeview::Dictionary& dictionary) { return std::make_shared<Object>(dictionary); }
 

@@ -71,17 +71,14 @@ namespace client {
 class Manager;
 using ManagerHandle = std::shared_ptr<Manager>;
 
-// The service's typed message object: what goes over the connection, before it becomes a native dictionary.
+// The service's typed message object. It never changes, and any thread may read it. A handler that hands an event on to
+// another queue hands on the object: until the last handle has gone the event counts among those that wait, of which a
+// manager takes only so many; the rest waits in the service.
 class Object;
 using ObjectHandle = std::shared_ptr<const Object>;
-// A deep conversion to plain dictionaries, strings, numbers and data.
-probeview::Dictionary nativeDictionary(const Object& object);
+// The object as plain dictionaries, strings, numbers and data; lives as long as the object.
+const probeview::Dictionary& nativeDictionary(const Object& object);
 ObjectHandle makeObject(const probeview::Dictionary& dictionary);
-
-// For a handler that hands on what an event holds to another queue: until the object and the last copy of this have
-// gone, the event counts among those that wait. Of these a manager takes only so many; the rest waits in the service.
-using EventHold = std::shared_ptr<const void>;
-EventHold holdOf(const Object& event);
 
 // The source group of an event; zero unless a service uses groups.
 using Group = std::int64_t;

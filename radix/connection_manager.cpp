@@ -30,34 +30,6 @@ std::string sizeText(std::size_t size) {
   return (size > longestFrame ? "more than " : "") + std::to_string(std::min(size, longestFrame));
 }
 
-Value number(std::int64_t value) { return value; }
-
-// The event as it is handed over, so long after it has come.
-ObjectHandle makeEventObject(const Event& event, std::chrono::nanoseconds waited, const EventHold& hold) {
-  Dictionary content;
-  if (event.kind == EventKind::Trigger) {
-    content.reserve(5);
-    content.append(kKeyTriggerID, number(event.triggerId));
-    content.append(kKeyTriggerRef, number(event.triggerRef));
-    content.append(kKeyTriggerType, number(event.triggerType));
-  } else {
-    content.reserve(7);
-    content.append(kKeyMetricID, number(event.metricId));
-    content.append(kKeyPayload, Value::bytes(event.payload));
-    content.append(kKeyProfileID, number(event.profileId));
-  }
-  content.append(kKeyTime, number(event.time));
-  content.append(kKeyOrigin, Value::text(event.origin));
-  if (event.kind == EventKind::Metric) {
-    if (event.age) {
-      const auto age = *event.age + std::chrono::duration_cast<std::chrono::milliseconds>(waited);
-      content.append(kKeyAge, number(boundedSpan(age).count()));
-    }
-    if (event.period) content.append(kKeyPeriod, number(event.period->count()));
-  }
-  return std::make_shared<Object>(std::move(content), hold);
-}
-
 using Handlers = std::map<std::string, EventHandler, std::less<>>;
 
 // The way of the events from the connection to the handlers. Shared with the tasks on the handlers' queue, which may
@@ -88,8 +60,9 @@ class EventRoad : public std::enable_shared_from_this<EventRoad> {
   }
 
   // On the worker.
-  void deliver(TaskQueue& queue, std::vector<Event> events, const std::shared_ptr<ServiceConnection>& connection) {
-    EventHold hold = waiting_->add(events, connection);
+  void deliver(TaskQueue& queue, std::vector<ArrivedEvent> events,
+               const std::shared_ptr<ServiceConnection>& connection) {
+    auto hold = waiting_->add(events, connection);
     queue.post(
         [self = shared_from_this(), batch = Batch{std::move(events), std::move(hold), clock_.ageTime()}]() mutable {
           self->batches_.push_back(std::move(batch));
@@ -100,8 +73,8 @@ class EventRoad : public std::enable_shared_from_this<EventRoad> {
  private:
   // Events that came together, and those of them that have been handed over.
   struct Batch {
-    std::vector<Event> events;
-    EventHold hold;
+    std::vector<ArrivedEvent> events;
+    std::shared_ptr<const void> hold;
     std::chrono::nanoseconds arrived{};  // by Clock::ageTime()
     std::size_t handedOver = 0;
   };
@@ -125,13 +98,13 @@ class EventRoad : public std::enable_shared_from_this<EventRoad> {
     }
   }
 
-  void hand(const Event& event, const Batch& batch) const {
+  void hand(ArrivedEvent& event, const Batch& batch) const {
     // Asked for each event: the handler before it may have registered another one.
     const auto handlers = handlers_.get();
     if (!handlers) return;
     const auto found = handlers->find(event.kind == EventKind::Trigger ? kEventTrigger : kEventMetric);
     if (found == handlers->end() || !found->second) return;
-    found->second(makeEventObject(event, clock_.ageTime() - batch.arrived, batch.hold), event.group);
+    found->second(objectOf(std::move(event), clock_.ageTime() - batch.arrived, batch.hold), event.group);
   }
 
   std::shared_ptr<WaitingEvents> waiting_;
@@ -159,7 +132,7 @@ class ConnectionManager final : public Manager {
     connection_ = std::make_shared<ServiceConnection>(
         worker, std::move(connector), std::move(identity),
         ServiceConnection::Events{.events =
-                                      [road = road_, handlersQueue = queue_, holder](std::vector<Event> events) {
+                                      [road = road_, handlersQueue = queue_, holder](std::vector<ArrivedEvent> events) {
                                         const auto here = holder->lock();
                                         if (here) road->deliver(*handlersQueue, std::move(events), here);
                                       },
@@ -179,8 +152,7 @@ class ConnectionManager final : public Manager {
     auto pending = std::make_shared<PendingCommand>();
     pending->name = command;
     pending->arguments = encodeDictionary(arguments);
-    const std::size_t size =
-        encode(Command{.sequence = UINT32_MAX, .name = pending->name, .arguments = pending->arguments})->size();
+    const std::size_t size = encode(Command(UINT32_MAX, pending->name, pending->arguments))->size();
     if (size > longestFrame) {
       const Value* payload = arguments.find(kKeyPayload);
       const std::size_t given = payload != nullptr && payload->bytes() ? payload->bytes()->size() : size;

@@ -7,11 +7,47 @@
 
 #include "messages/runtime/data_reader.h"
 #include "messages/runtime/data_writer.h"
-#include "radix/frame_tables.h"
+#include "messages/runtime/field_table.h"
 
 namespace radix {
 
 namespace wire {
+
+using probeview::PBCodable;
+
+// clang-format off
+
+// One entry of a dictionary, or one value of a list (without a key). Lists and dictionaries inside are again one Items,
+// encoded as bytes, so that a reader decides how deep it follows.
+class Item final : public PBCodable {
+  PB_MESSAGE(Item)
+  PB_OBJECT(1, "key",     key,     Key,     string);
+  PB_FIELD (2, "kind",    kind,    Kind,    uint32);  // as ItemKind
+  PB_FIELD (3, "number",  number,  Number,  uint64);  // integers, truth values, the bits of reals
+  PB_OBJECT(4, "content", content, Content, bytes);   // texts, bytes, lists, dictionaries
+};
+
+class Items final : public PBCodable {
+  PB_MESSAGE(Items)
+  PB_LIST(1, "items", items, Items, item, Item, repeated<message<Item>>);
+};
+
+// clang-format on
+
+// The numbers of the value kinds on the wire.
+enum class ItemKind : std::uint32_t {
+  Int32 = 1,
+  UInt32 = 2,
+  Int64 = 3,
+  UInt64 = 4,
+  Bool = 5,
+  Float = 6,
+  Double = 7,
+  Text = 8,
+  Bytes = 9,
+  List = 10,
+  Dictionary = 11,
+};
 
 PB_DEFINE(Item)
 PB_DEFINE(Items)

@@ -5,26 +5,20 @@
 #include <iterator>
 #include <utility>
 
+#include "radix/source_states.h"
 #include "values/plain_text.h"
 
 namespace radix::client {
 
 namespace {
 
-std::string versionTrouble(const ServiceConnection::Identity& own, const Hello& service) {
-  const bool clientIsTooOld = service.oldestVersion > own.version;
-  return "the baseband service speaks version " + std::to_string(service.version) + " of the protocol and needs " +
-         std::to_string(service.oldestVersion) + ", this client speaks " + std::to_string(own.version) + " and needs " +
-         std::to_string(own.oldestVersion) + ": update " + (clientIsTooOld ? "the client" : "the service");
-}
-
 // Of what a service says, as much is kept as anybody reads.
 constexpr std::size_t longestTrouble = 1000;
 
 // What nobody waits for any more, in the form in which the results of commands stand in the log.
 std::string refusedLate(const Reply& reply) {
-  return "the baseband service refuses the configuration that was pushed: error=" + std::to_string(reply.status) +
-         " msg=" + probeview::onOneLine(probeview::beginningOf(reply.message, longestTrouble));
+  return "the baseband service refuses the configuration that was pushed: error=" + std::to_string(reply.status()) +
+         " msg=" + probeview::onOneLine(probeview::beginningOf(reply.message(), longestTrouble));
 }
 
 }  // namespace
@@ -77,7 +71,7 @@ void ServiceConnection::setDelivery(bool on) {
   // Also when it is on already: an older service gives the last records of a configuration that was pushed in the
   // meantime only when events are switched on.
   delivery_ = on;
-  if (phase_ == Phase::Ready) send(encode(Delivery{on}));
+  if (phase_ == Phase::Ready) send(encode(Delivery(on)));
 }
 
 void ServiceConnection::setAppetite(Appetite appetite) {
@@ -109,12 +103,9 @@ void ServiceConnection::attempt() {
   greetingDeadline_ = worker_.after(commandDeadline, [this] {
     lose(Status::TimedOut, "the baseband service accepted the connection and then did not greet");
   });
-  send(encode(Hello{.version = identity_.version,
-                    .oldestVersion = identity_.oldestVersion,
-                    .name = identity_.clientName,
-                    .refusalStatus = 0,
-                    .refusal = {},
-                    .observes = identity_.observes}));
+  Hello hello(identity_.clientName, identity_.versions);
+  if (identity_.observes) hello.setObserves(true);
+  send(encode(hello));
 }
 
 void ServiceConnection::scheduleAttempt(std::chrono::nanoseconds delay) {
@@ -181,7 +172,7 @@ void ServiceConnection::refuseConfiguration(const std::string& reason) {
   setConfigurationOutcome(ConfigurationOutcome::Refused, reason);
 }
 
-void ServiceConnection::setConfigurationOutcome(ConfigurationOutcome outcome, const std::string& trouble) {
+void ServiceConnection::setConfigurationOutcome(ConfigurationOutcome outcome, std::string_view trouble) {
   state_.configuration = outcome;
   const bool isTrouble = outcome == ConfigurationOutcome::Refused || outcome == ConfigurationOutcome::Unsent;
   state_.configurationTrouble = isTrouble ? probeview::beginningOf(trouble, longestTrouble) : std::string_view();
@@ -191,9 +182,9 @@ void ServiceConnection::setConfigurationOutcome(ConfigurationOutcome outcome, co
 void ServiceConnection::restore() {
   for (PushedConfiguration& one : configurations_) {
     one.sequence = nextSequence();
-    send(encode(Command{.sequence = one.sequence, .name = kCommandAddConfiguration, .arguments = one.arguments}));
+    send(encode(Command(one.sequence, kCommandAddConfiguration, one.arguments)));
   }
-  if (delivery_) send(encode(Delivery{true}));
+  if (delivery_) send(encode(Delivery(true)));
 }
 
 void ServiceConnection::acceptConfiguration(std::uint32_t sequence, std::vector<std::uint8_t> arguments) {
@@ -205,19 +196,19 @@ void ServiceConnection::acceptConfiguration(std::uint32_t sequence, std::vector<
 void ServiceConnection::judgeRestored(const Reply& reply) {
   const auto found = std::find_if(
       configurations_.begin(), configurations_.end(),
-      [&reply](const PushedConfiguration& one) { return one.sequence != 0 && one.sequence == reply.sequence; });
+      [&reply](const PushedConfiguration& one) { return one.sequence != 0 && one.sequence == reply.sequence(); });
   if (found == configurations_.end()) return;
-  const bool isOk = static_cast<Status>(reply.status) == Status::Ok;
+  const bool isOk = static_cast<Status>(reply.status()) == Status::Ok;
   // Of those before it nobody wants to know any more.
   const bool isLast = std::next(found) == configurations_.end();
   if (isOk) {
-    acceptConfiguration(reply.sequence, std::move(found->arguments));
+    acceptConfiguration(reply.sequence(), std::move(found->arguments));
   } else {
     configurations_.erase(found);
     if (events_.notice) events_.notice(refusedLate(reply));
   }
   if (!isLast) return;
-  setConfigurationOutcome(isOk ? ConfigurationOutcome::Accepted : ConfigurationOutcome::Refused, reply.message);
+  setConfigurationOutcome(isOk ? ConfigurationOutcome::Accepted : ConfigurationOutcome::Refused, reply.message());
 }
 
 std::uint32_t ServiceConnection::nextSequence() {
@@ -230,7 +221,7 @@ void ServiceConnection::sendWaiting() {
   for (Waiting& one : waiting_) {
     if (one.sequence != 0) continue;
     one.sequence = nextSequence();
-    send(encode(Command{.sequence = one.sequence, .name = one.command->name, .arguments = one.command->arguments}));
+    send(encode(Command(one.sequence, one.command->name, one.command->arguments)));
   }
 }
 
@@ -268,7 +259,7 @@ void ServiceConnection::onOverlongFrame(std::size_t size) {
 
 void ServiceConnection::onBatchEnd() {
   if (batch_.empty()) return;
-  std::vector<Event> batch;
+  std::vector<ArrivedEvent> batch;
   batch.swap(batch_);
   batchBytes_ = 0;
   events_.events(std::move(batch));
@@ -289,14 +280,14 @@ void ServiceConnection::onClosed() {
   }
 }
 
-void ServiceConnection::onHello(Hello hello) {
+void ServiceConnection::onHello(const Hello& hello) {
   if (phase_ != Phase::Greeting) return;
-  if (hello.refusalStatus != 0) {
-    lose(static_cast<Status>(hello.refusalStatus), hello.refusal);
+  if (hello.refusalStatus() != 0) {
+    lose(static_cast<Status>(hello.refusalStatus()), std::string(hello.refusal()));
     return;
   }
-  if (hello.oldestVersion > identity_.version || hello.version < identity_.oldestVersion) {
-    lose(Status::VersionMismatch, versionTrouble(identity_, hello));
+  if (const auto trouble = versionTrouble({"client", identity_.versions}, {"service", hello.versions()})) {
+    lose(Status::VersionMismatch, "the baseband " + *trouble);
     return;
   }
   greetingDeadline_.reset();
@@ -305,16 +296,16 @@ void ServiceConnection::onHello(Hello hello) {
   state_.connected = true;
   state_.everConnected = true;
   state_.since = worker_.clock().wallTime();
-  state_.serviceName = std::move(hello.name);
+  state_.serviceName = hello.name();
   state_.trouble.clear();
   publish();
   restore();
   sendWaiting();
 }
 
-void ServiceConnection::onReply(Reply reply) {
+void ServiceConnection::onReply(const Reply& reply) {
   const auto found = std::find_if(waiting_.begin(), waiting_.end(), [&reply](const Waiting& one) {
-    return one.sequence != 0 && one.sequence == reply.sequence;
+    return one.sequence != 0 && one.sequence == reply.sequence();
   });
   if (found == waiting_.end()) {
     // Nobody waits for it any more, or it answers what was restored.
@@ -323,41 +314,38 @@ void ServiceConnection::onReply(Reply reply) {
   }
   Waiting answered = std::move(*found);
   waiting_.erase(found);
-  answered.command->reply = std::move(reply.content);
-  finish(std::move(answered), static_cast<Status>(reply.status), std::move(reply.message), Judge::Service);
+  answered.command->reply.assign(reply.content().begin(), reply.content().end());
+  finish(std::move(answered), static_cast<Status>(reply.status()), std::string(reply.message()), Judge::Service);
   updateReading();
 }
 
-void ServiceConnection::onEvent(Event event) {
-  // The service cuts it, too; but who says that it is ours?
-  if (event.origin.size() > longestOrigin) {
-    event.origin = std::string(probeview::beginningOf(event.origin, longestOrigin));
-  }
-  batchBytes_ += sizeof event + event.payload.size() + event.origin.size();
-  batch_.push_back(std::move(event));
+void ServiceConnection::onEvent(const Event& event, std::optional<std::chrono::milliseconds> age) {
+  batch_.push_back(arrivedEvent(event, age));
+  batchBytes_ += batch_.back().size();
   // So that whoever counts what waits may stop the reading before too much is there.
   if (batchBytes_ >= largestBatch) onBatchEnd();
 }
 
-void ServiceConnection::onDropped(Dropped dropped) {
-  state_.lostEvents += dropped.count;
+void ServiceConnection::onDropped(const Dropped& dropped) {
+  state_.lostEvents += dropped.count();
   publish();
 }
 
-void ServiceConnection::onSources(Sources sources) {
+void ServiceConnection::onSources(const Sources& sources) {
   if (phase_ != Phase::Ready) return;
-  state_.sources = std::move(sources.states);
-  state_.areSourcesCut = sources.isCut;
+  SourceStates told = statesOf(sources);
+  state_.sources = std::move(told.states);
+  state_.areSourcesCut = told.isCut;
   publish();
 }
 
-void ServiceConnection::onPing(Ping ping) {
-  if (ping.isAnswer) return;
+void ServiceConnection::onPing(const Ping& ping) {
+  if (ping.isAnswer()) return;
   if (outgoing_.size() >= mostAnswersUnread) {
     lose(Status::MalformedFrame, "the baseband service asks without reading the answers");
     return;
   }
-  send(encode(Ping{ping.number, true}));
+  send(encode(Ping(ping.number(), true)));
 }
 
 }  // namespace radix::client

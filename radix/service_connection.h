@@ -10,9 +10,11 @@
 #include <memory>
 #include <optional>
 #include <string>
+#include <string_view>
 #include <vector>
 
 #include "platform/worker.h"
+#include "radix/arrived_event.h"
 #include "radix/client.h"
 #include "radix/frames.h"
 #include "radix/link.h"
@@ -58,7 +60,7 @@ class ServiceConnection final : public std::enable_shared_from_this<ServiceConne
  public:
   struct Events {
     // The events of one batch, in order.
-    std::function<void(std::vector<Event>)> events;
+    std::function<void(std::vector<ArrivedEvent>)> events;
     // Something of it has changed.
     std::function<void(const ConnectionState&)> state;
     // Something that concerns no command that waits, in one line for the log.
@@ -68,8 +70,7 @@ class ServiceConnection final : public std::enable_shared_from_this<ServiceConne
   struct Identity {
     std::string clientName;
     bool observes = false;
-    std::uint32_t version = protocolVersion;
-    std::uint32_t oldestVersion = oldestProtocolVersion;
+    ProtocolVersions versions{};
   };
 
   ServiceConnection(probeview::Worker& worker, std::unique_ptr<Connector> connector, Identity identity, Events events);
@@ -107,12 +108,12 @@ class ServiceConnection final : public std::enable_shared_from_this<ServiceConne
   void onBatchEnd() override;
   void onWritable() override;
   void onClosed() override;
-  void onHello(Hello hello) override;
-  void onReply(Reply reply) override;
-  void onEvent(Event event) override;
-  void onDropped(Dropped dropped) override;
-  void onPing(Ping ping) override;
-  void onSources(Sources sources) override;
+  void onHello(const Hello& hello) override;
+  void onReply(const Reply& reply) override;
+  void onEvent(const Event& event, std::optional<std::chrono::milliseconds> age) override;
+  void onDropped(const Dropped& dropped) override;
+  void onPing(const Ping& ping) override;
+  void onSources(const Sources& sources) override;
 
   void attempt();
   void scheduleAttempt(std::chrono::nanoseconds delay);
@@ -124,7 +125,7 @@ class ServiceConnection final : public std::enable_shared_from_this<ServiceConne
   // The service has taken the configuration that was pushed under the sequence number, and goes by no earlier one.
   void acceptConfiguration(std::uint32_t sequence, std::vector<std::uint8_t> arguments);
   void judgeRestored(const Reply& reply);
-  void setConfigurationOutcome(ConfigurationOutcome outcome, const std::string& trouble = {});
+  void setConfigurationOutcome(ConfigurationOutcome outcome, std::string_view trouble = {});
   std::uint32_t nextSequence();
   void sendWaiting();
   void send(FrameBytes frame);
@@ -155,7 +156,7 @@ class ServiceConnection final : public std::enable_shared_from_this<ServiceConne
   std::deque<PushedConfiguration> configurations_;
   bool delivery_ = false;
 
-  std::vector<Event> batch_;
+  std::vector<ArrivedEvent> batch_;
   std::size_t batchBytes_ = 0;
   Appetite appetite_ = Appetite::Everything;
   ConnectionState state_;

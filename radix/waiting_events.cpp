@@ -15,10 +15,10 @@ constexpr std::size_t mostBesideReplies = 4 * most;
 // A large event counts as several: what waits stays below some megabytes.
 constexpr std::size_t bytesOfOneEvent = 2048;
 
-std::size_t weightOf(const std::vector<Event>& events) {
+std::size_t weightOf(const std::vector<ArrivedEvent>& events) {
   std::size_t weight = 0;
   // What every event holds beside its payload and origin is within the one.
-  for (const Event& event : events) weight += 1 + (event.payload.size() + event.origin.size()) / bytesOfOneEvent;
+  for (const ArrivedEvent& event : events) weight += 1 + event.foreignBytes / bytesOfOneEvent;
   return weight;
 }
 
@@ -38,7 +38,8 @@ class WaitingEvents::Share {
   std::weak_ptr<ServiceConnection> connection_;
 };
 
-EventHold WaitingEvents::add(const std::vector<Event>& events, const std::shared_ptr<ServiceConnection>& connection) {
+std::shared_ptr<const void> WaitingEvents::add(const std::vector<ArrivedEvent>& events,
+                                               const std::shared_ptr<ServiceConnection>& connection) {
   const std::size_t weight = weightOf(events);
   weight_ += weight;
   auto hold = std::make_shared<const Share>(shared_from_this(), weight, connection);

@@ -7,8 +7,7 @@
 #include <vector>
 
 #include "platform/detachable_queue.h"
-#include "radix/client.h"
-#include "radix/frames.h"
+#include "radix/arrived_event.h"
 #include "radix/service_connection.h"
 
 namespace radix::client {
@@ -22,7 +21,8 @@ class WaitingEvents : public std::enable_shared_from_this<WaitingEvents> {
   explicit WaitingEvents(probeview::TaskQueue& worker) : worker_(worker) {}
 
   // They count until the last copy of what this returns has gone, on whatever thread. On the worker.
-  EventHold add(const std::vector<Event>& events, const std::shared_ptr<ServiceConnection>& connection);
+  std::shared_ptr<const void> add(const std::vector<ArrivedEvent>& events,
+                                  const std::shared_ptr<ServiceConnection>& connection);
   // Whether there are any. Any thread.
   bool any() const { return weight_ > 0; }
   // Tells the connection nothing any more. Any thread.

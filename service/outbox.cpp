@@ -79,7 +79,7 @@ void Outbox::discard(const std::function<bool(const Record& record)>& isUnwanted
 
 std::size_t Outbox::next(std::span<radix::OutgoingFrame> frames, std::chrono::nanoseconds ageTime) {
   if (lost_ != told_) {
-    words_.push_back(radix::encode(radix::Dropped{lost_ - told_}));
+    words_.push_back(radix::encode(radix::Dropped(lost_ - told_)));
     told_ = lost_;
   }
   if (news_ != nullptr) words_.push_back(std::exchange(news_, nullptr));

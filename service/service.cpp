@@ -9,6 +9,7 @@
 #include "radix/client.h"
 #include "radix/dictionary_bytes.h"
 #include "radix/service_commands.h"
+#include "radix/source_states.h"
 #include "radix/status.h"
 #include "service/payload_check.h"
 #include "service/plans.h"
@@ -27,8 +28,9 @@ using radix::Status;
 constexpr std::size_t mostNotesTold = 10;
 constexpr std::int64_t configurationPayloadType = 0;
 
-Reply answer(Status status, std::string message = {}) {
-  return {.sequence = 0, .status = static_cast<std::int32_t>(status), .message = std::move(message), .content = {}};
+// The session fills in the sequence number.
+Reply answer(Status status, std::string_view message = {}) {
+  return Reply(0, static_cast<std::int32_t>(status), message);
 }
 
 // An argument that need not be there; then it is 0.
@@ -71,7 +73,7 @@ PushedConfiguration readConfiguration(const Dictionary& arguments, ServiceLog& l
     log.write(LogLevel::Info, "the configuration of " + who + ": " + note);
     message += (message.empty() ? "" : "; ") + note;
   }
-  return {std::move(result.configuration), answer(Status::Ok, std::move(message))};
+  return {std::move(result.configuration), answer(Status::Ok, message)};
 }
 
 std::string nameOf(const Session& session) {
@@ -85,8 +87,7 @@ Service::Service(Worker& worker, ServiceLog log, Settings settings)
       log_(log),
       settings_(std::move(settings)),
       sessionSettings_{.serviceName = settings_.name,
-                       .version = settings_.version,
-                       .oldestVersion = settings_.oldestVersion,
+                       .versions = settings_.versions,
                        .greetingTime = settings_.greetingTime,
                        .leavingTime = settings_.leavingTime,
                        .outbox = settings_.outbox},
@@ -140,9 +141,9 @@ std::optional<std::string> Service::refusal(const Session& session) {
 }
 
 Reply Service::perform(Session& session, const radix::Command& command) {
-  const auto arguments =
-      command.arguments.empty() ? std::optional<Dictionary>(std::in_place) : radix::decodeDictionary(command.arguments);
-  const std::string_view name = command.name;
+  const auto arguments = command.arguments().empty() ? std::optional<Dictionary>(std::in_place)
+                                                     : radix::decodeDictionary(command.arguments());
+  const std::string_view name = command.name();
   // As a peer may have named it, it may be of any length.
   const std::string shownName(beginningOf(name, 64));
   if (!arguments) return answer(Status::BadArguments, "the arguments of " + shownName + " cannot be read");
@@ -242,8 +243,8 @@ Reply Service::queryMetric(Session& session, const Dictionary& arguments) {
   if (!withoutValue.empty()) {
     message += (message.empty() ? "" : "; ") + ("no source has a value of " + withoutValue + " yet");
   }
-  Reply reply = answer(any ? Status::Ok : Status::CannotFill, std::move(message));
-  if (any) reply.content = radix::encodeDictionary({{"metrics", std::move(asked)}});
+  Reply reply = answer(any ? Status::Ok : Status::CannotFill, message);
+  if (any) reply.setContent(radix::encodeDictionary({{"metrics", std::move(asked)}}));
   return reply;
 }
 
@@ -262,7 +263,7 @@ std::vector<std::int64_t> Service::metricsOfTrigger(const Session& session, std:
 
 Reply Service::showStatus() const {
   Reply reply = answer(Status::Ok);
-  reply.content = radix::encodeDictionary(StatusReport::of(*this));
+  reply.setContent(radix::encodeDictionary(StatusReport::of(*this)));
   return reply;
 }
 
@@ -276,15 +277,15 @@ void Service::wishesChanged(Session& session) {
 }
 
 radix::FrameBytes Service::sources() {
-  radix::Sources sources;
+  radix::SourceStates told;
   for (const auto& source : sources_) {
     SourceCondition condition = source->condition();
-    sources.states.push_back({.origin = source->origin(),
-                              .phase = condition.phase,
-                              .reason = std::move(condition.reason),
-                              .metrics = source->metrics()});
+    told.states.push_back({.origin = source->origin(),
+                           .phase = condition.phase,
+                           .reason = std::move(condition.reason),
+                           .metrics = source->metrics()});
   }
-  return radix::encode(sources);
+  return radix::encode(told);
 }
 
 void Service::sourcesChanged() {
@@ -316,17 +317,14 @@ void Service::removeEnded() {
 
 void Service::route(std::size_t source, MetricRecord record, std::chrono::nanoseconds now) {
   LastRecords::Record kept{.metricId = record.metricId, .frame = {}, .born = worker_.clock().ageTime() - record.age};
-  kept.frame = radix::encode(radix::Event{.kind = radix::EventKind::Metric,
-                                          .metricId = record.metricId,
-                                          .payload = std::move(record.payload),
-                                          .profileId = 0,
-                                          .time = record.time.count(),
-                                          .origin = std::move(record.origin),
-                                          .group = 0,
-                                          .triggerId = 0,
-                                          .triggerRef = 0,
-                                          .triggerType = 0,
-                                          .period = record.period});
+  radix::Event event(radix::EventKind::Metric);
+  event.setPayload(record.payload);
+  event.setTime(radix::unsignedOf(record.time.count()));
+  event.setOrigin(record.origin);
+  if (record.metricId != 0) event.setMetricId(radix::unsignedOf(record.metricId));
+  // 0 is said, too: that a metric comes on change is more than that nothing is known.
+  event.setPeriod(radix::unsignedOf(record.period.count()));
+  kept.frame = radix::encode(event);
   const std::uint64_t number = lastRecords_.keep(kept);
   for (const auto& session : sessions_) session->offer(source, kept, number, now);
 }

@@ -28,8 +28,7 @@ class Service final : Session::Host {
  public:
   struct Settings {
     std::string name = "radixd " PROBEVIEW_VERSION;
-    std::uint32_t version = radix::protocolVersion;
-    std::uint32_t oldestVersion = radix::oldestProtocolVersion;
+    radix::ProtocolVersions versions{};
     // Clients that are served at once; those past it are told so. Of connections there may be twice as many.
     std::size_t mostClients = 128;
     // Beside both, so many of the service's own user and root: others cannot keep them out.

@@ -199,16 +199,13 @@ void Session::onClosed() {
   end();
 }
 
-void Session::onHello(radix::Hello hello) {
+void Session::onHello(const radix::Hello& hello) {
   if (phase_ != Phase::Greeting) return;
-  clientName_ = beginningOf(hello.name, longestClientName);
+  clientName_ = beginningOf(hello.name(), longestClientName);
   std::optional<std::string> reason;
   Status status = Status::VersionMismatch;
-  if (hello.oldestVersion > settings_.version || hello.version < settings_.oldestVersion) {
-    reason = "the client speaks version " + std::to_string(hello.version) + " of the protocol and needs " +
-             std::to_string(hello.oldestVersion) + ", this service speaks " + std::to_string(settings_.version) +
-             " and needs " + std::to_string(settings_.oldestVersion) + ": update " +
-             (hello.oldestVersion > settings_.version ? "the service" : "the client");
+  if (const auto trouble = radix::versionTrouble({"service", settings_.versions}, {"client", hello.versions()})) {
+    reason = "the " + *trouble;
   } else {
     status = Status::TooMany;
     reason = host_.refusal(*this);
@@ -220,35 +217,33 @@ void Session::onHello(radix::Hello hello) {
   }
   deadline_.reset();
   phase_ = Phase::Active;
-  observes_ = hello.observes;
+  observes_ = hello.observes();
   log_.write(LogLevel::Info, description() + " has connected");
-  say(radix::encode(radix::Hello{.version = settings_.version,
-                                 .oldestVersion = settings_.oldestVersion,
-                                 .name = settings_.serviceName,
-                                 .refusalStatus = 0,
-                                 .refusal = {}}));
+  say(radix::encode(radix::Hello(settings_.serviceName, settings_.versions)));
   tellSources(host_.sources());
 }
 
-void Session::onCommand(radix::Command command) {
+void Session::onCommand(const radix::Command& command) {
   if (phase_ != Phase::Active) return;
   radix::Reply reply = host_.perform(*this, command);
-  reply.sequence = command.sequence;
+  reply.setSequence(command.sequence());
   if (log_.takes(LogLevel::Debug)) {
-    log_.write(LogLevel::Debug, description() + ": " + std::string(beginningOf(command.name, 64)) + " answered with " +
-                                    std::to_string(reply.status) + (reply.message.empty() ? "" : ", " + reply.message));
+    const std::string message(reply.message());
+    log_.write(LogLevel::Debug, description() + ": " + std::string(beginningOf(command.name(), 64)) +
+                                    " answered with " + std::to_string(reply.status()) +
+                                    (message.empty() ? "" : ", " + message));
   }
   say(radix::encode(reply));
 }
 
-void Session::onDelivery(radix::Delivery delivery) {
+void Session::onDelivery(const radix::Delivery& delivery) {
   if (phase_ != Phase::Active) return;
-  delivery_ = delivery.on;
-  host_.deliveryChanged(*this, delivery.on);
+  delivery_ = delivery.on();
+  host_.deliveryChanged(*this, delivery_);
 }
 
-void Session::onPing(radix::Ping ping) {
-  if (phase_ == Phase::Active && !ping.isAnswer) say(radix::encode(radix::Ping{ping.number, true}));
+void Session::onPing(const radix::Ping& ping) {
+  if (phase_ == Phase::Active && !ping.isAnswer()) say(radix::encode(radix::Ping(ping.number(), true)));
 }
 
 void Session::say(radix::FrameBytes frame) {
@@ -267,11 +262,10 @@ void Session::refuse(Status status, const std::string& reason) {
   host_.deliveryChanged(*this, false);
   // The link is closed by the client once it has read this: closing first could take the words away from it.
   deadline_ = worker_.after(settings_.leavingTime, [this] { end(); });
-  outbox_.addWord(radix::encode(radix::Hello{.version = settings_.version,
-                                             .oldestVersion = settings_.oldestVersion,
-                                             .name = settings_.serviceName,
-                                             .refusalStatus = static_cast<std::int32_t>(status),
-                                             .refusal = reason}));
+  radix::Hello hello(settings_.serviceName, settings_.versions);
+  hello.setRefusalStatus(static_cast<std::int32_t>(status));
+  hello.setRefusal(reason);
+  outbox_.addWord(radix::encode(hello));
   flush();
 }
 

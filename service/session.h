@@ -57,8 +57,7 @@ class Session final : radix::LinkListener, radix::FrameHandler {
 
   struct Settings {
     std::string serviceName;
-    std::uint32_t version = radix::protocolVersion;
-    std::uint32_t oldestVersion = radix::oldestProtocolVersion;
+    radix::ProtocolVersions versions{};
     std::chrono::milliseconds greetingTime{};
     std::chrono::milliseconds leavingTime{};
     Outbox::Limits outbox{};
@@ -112,10 +111,10 @@ class Session final : radix::LinkListener, radix::FrameHandler {
   void onBatchEnd() override {}
   void onWritable() override;
   void onClosed() override;
-  void onHello(radix::Hello hello) override;
-  void onCommand(radix::Command command) override;
-  void onDelivery(radix::Delivery delivery) override;
-  void onPing(radix::Ping ping) override;
+  void onHello(const radix::Hello& hello) override;
+  void onCommand(const radix::Command& command) override;
+  void onDelivery(const radix::Delivery& delivery) override;
+  void onPing(const radix::Ping& ping) override;
 
   // An answer to a query that has been asked.
   struct AwaitedAnswer {

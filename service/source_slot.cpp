@@ -127,7 +127,7 @@ void SourceSlot::emit(MetricRecord record) {
 
 void SourceSlot::conditionChanged(SourceCondition condition) {
   if (!failure_.empty()) return;
-  condition.reason.resize(beginningOf(condition.reason, radix::Sources::longestReason).size());
+  condition.reason.resize(beginningOf(condition.reason, radix::longestReason).size());
   if (condition.phase == SourceCondition::Phase::Failed) {
     log_.write(LogLevel::Error, origin_ + " has failed: " + condition.reason);
   }

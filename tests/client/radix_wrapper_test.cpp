@@ -213,6 +213,31 @@ TEST_F(RadixWrapperTest, EventsAreLoggedWhereTheyArriveAndDeliveredOnTheMainQueu
             (Lines{R"(metrics ["kKeyMetricID": 3952132, "kKeyPayload": <0801>])", R"(events ["kKeyTriggerID": 5])"}));
 }
 
+// One value of a large event that is copied costs as much as the event; one of a small event lies within its
+// dictionary.
+TEST_F(RadixWrapperTest, TheDelegateIsGivenTheEventThatTheLibraryHandedOverAndNoCopyOfIt) {
+  class Looking final : public RadixWrapperDelegate {
+   public:
+    void eventsDidUpdate(const Dictionary* event) override { seen = event; }
+    void metricsDidUpdate(const Dictionary* event) override { seen = event; }
+    const Dictionary* seen = nullptr;
+  };
+  const auto delegate = std::make_shared<Looking>();
+  wrapper_.setDelegate(delegate);
+  wrapper_.listen();
+  for (const char* name : {radix::kEventMetric, radix::kEventTrigger}) {
+    auto event = radix::client::makeObject({{"kKeyMetricID", std::int64_t{0x3C4E04}}});
+    const std::weak_ptr<const radix::client::Object> waits = event;
+    const Dictionary* content = &radix::client::nativeDictionary(*event);
+    manager_->handlers.at(name)(event, radix::client::Group{});
+    event.reset();
+    EXPECT_FALSE(waits.expired()) << "it counts among those that wait until the main thread has had it";
+    main_.run();
+    EXPECT_EQ(delegate->seen, content);
+    EXPECT_TRUE(waits.expired());
+  }
+}
+
 TEST_F(RadixWrapperTest, AnEventThatArrivesWhileTheDelegateIsUnsetIsLoggedAndNotDelivered) {
   wrapper_.listen();
   systemLog_.lines.clear();

@@ -12,6 +12,7 @@
 #include "radix/frames.h"
 #include "radix/in_process_link.h"
 #include "radix/service_commands.h"
+#include "tests/support/frames.h"
 
 namespace radix::client {
 namespace {
@@ -73,10 +74,10 @@ TYPED_TEST(EndingTest, AClientThatGoesWhileEventsWaitLeavesNothingBehind) {
     EventsOn(manager);
     loop.run();
     ASSERT_TRUE(speaker);
-    speaker->say(Hello{.name = "speaker"});
+    speaker->say(Hello("speaker"));
     loop.run();
     for (std::int64_t number = 0; number < 50; ++number) {
-      speaker->say(Event{.metricId = number, .payload = std::vector<std::uint8_t>(100), .origin = "speaker"});
+      speaker->say(metricEvent({.metricId = number, .payload = std::vector<std::uint8_t>(100), .origin = "speaker"}));
       if (number % 10 == 9) loop.run();
     }
     if (round % 2 == 0) {

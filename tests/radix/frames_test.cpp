@@ -3,13 +3,15 @@
 
 #include <gtest/gtest.h>
 
+#include <chrono>
 #include <cstdint>
+#include <optional>
 #include <string>
 #include <vector>
 
-#include "messages/runtime/data_writer.h"
 #include "radix/dictionary_bytes.h"
-#include "radix/frame_tables.h"
+#include "radix/source_states.h"
+#include "tests/support/frames.h"
 
 namespace radix {
 namespace {
@@ -23,100 +25,99 @@ using Bytes = std::vector<std::uint8_t>;
 // Writes down what it is told.
 class Recorder final : public FrameHandler {
  public:
-  void onHello(Hello hello) override {
-    said = "hello " + std::to_string(hello.version) + " " + std::to_string(hello.oldestVersion) + " " + hello.name +
-           " " + std::to_string(hello.refusalStatus) + " " + hello.refusal;
+  void onHello(const Hello& hello) override {
+    said = "hello " + std::to_string(hello.version()) + " " + std::to_string(hello.oldestVersion()) + " " +
+           std::string(hello.name()) + " " + std::to_string(hello.refusalStatus()) + " " +
+           std::string(hello.refusal()) + (hello.observes() ? " observes" : "");
   }
-  void onCommand(Command command) override {
-    said = "command " + std::to_string(command.sequence) + " " + command.name;
-    bytes = command.arguments;
+  void onCommand(const Command& command) override {
+    said = "command " + std::to_string(command.sequence()) + " " + std::string(command.name());
+    bytes = copyOf(command.arguments());
   }
-  void onReply(Reply reply) override {
-    said = "reply " + std::to_string(reply.sequence) + " " + std::to_string(reply.status) + " " + reply.message;
-    bytes = reply.content;
+  void onReply(const Reply& reply) override {
+    said = "reply " + std::to_string(reply.sequence()) + " " + std::to_string(reply.status()) + " " +
+           std::string(reply.message());
+    bytes = copyOf(reply.content());
   }
-  void onDelivery(Delivery delivery) override { said = delivery.on ? "delivery on" : "delivery off"; }
-  void onEvent(Event one) override {
+  void onDelivery(const Delivery& delivery) override { said = delivery.on() ? "delivery on" : "delivery off"; }
+  void onEvent(const Event& one, std::optional<milliseconds> itsAge) override {
     said = "event";
-    event = std::move(one);
+    event = one;
+    age = itsAge;
   }
-  void onDropped(Dropped dropped) override { said = "dropped " + std::to_string(dropped.count); }
-  void onPing(Ping ping) override { said = "ping " + std::to_string(ping.number) + (ping.isAnswer ? " answer" : ""); }
-
-  void onSources(Sources all) override {
-    said = "sources " + std::to_string(all.states.size());
-    sources = std::move(all);
+  void onDropped(const Dropped& dropped) override { said = "dropped " + std::to_string(dropped.count()); }
+  void onPing(const Ping& ping) override {
+    said = "ping " + std::to_string(ping.number()) + (ping.isAnswer() ? " answer" : "");
+  }
+  void onSources(const Sources& all) override {
+    sources = statesOf(all);
+    said = "sources " + std::to_string(sources.states.size());
   }
 
   std::string said;
   Bytes bytes;
   Event event;
-  Sources sources;
+  std::optional<milliseconds> age;
+  SourceStates sources;
 };
 
-template <typename Frame>
-Recorder roundTrip(const Frame& frame) {
+template <typename Sentence>
+Recorder roundTrip(const Sentence& sentence) {
   Recorder recorder;
-  EXPECT_TRUE(decodeFrame(*encode(frame), recorder));
+  EXPECT_TRUE(decodeFrame(*encode(sentence), recorder));
   return recorder;
 }
 
 TEST(Frames, EachKindComesBackAsItWasSent) {
-  EXPECT_EQ(roundTrip(Hello{.version = 3, .oldestVersion = 2, .name = "probeview"}).said, "hello 3 2 probeview 0 ");
-  EXPECT_EQ(
-      roundTrip(Hello{.version = 1, .oldestVersion = 1, .name = "radixd", .refusalStatus = 9, .refusal = "no"}).said,
-      "hello 1 1 radixd 9 no");
-  const Recorder command =
-      roundTrip(Command{.sequence = 4294967295U, .name = "kCommandQueryMetric", .arguments = {1, 2}});
+  EXPECT_EQ(roundTrip(Hello("probeview", {.spoken = 3, .oldest = 2})).said, "hello 3 2 probeview 0 ");
+  EXPECT_EQ(roundTrip(observer("watch")).said, "hello 1 1 watch 0  observes");
+  EXPECT_EQ(roundTrip(refusing(9, "no", "radixd")).said, "hello 1 1 radixd 9 no");
+  const Recorder command = roundTrip(Command(4294967295U, "kCommandQueryMetric", Bytes{1, 2}));
   EXPECT_EQ(command.said, "command 4294967295 kCommandQueryMetric");
   EXPECT_EQ(command.bytes, (Bytes{1, 2}));
-  const Recorder reply = roundTrip(Reply{.sequence = 7, .status = -3, .message = "why", .content = {9}});
+  const Recorder reply = roundTrip(Reply(7, -3, "why", Bytes{9}));
   EXPECT_EQ(reply.said, "reply 7 -3 why");
   EXPECT_EQ(reply.bytes, (Bytes{9}));
-  EXPECT_EQ(roundTrip(Delivery{true}).said, "delivery on");
-  EXPECT_EQ(roundTrip(Delivery{false}).said, "delivery off");
-  EXPECT_EQ(roundTrip(Dropped{18446744073709551615U}).said, "dropped 18446744073709551615");
-  EXPECT_EQ(roundTrip(Ping{5, false}).said, "ping 5");
-  EXPECT_EQ(roundTrip(Ping{5, true}).said, "ping 5 answer");
+  EXPECT_EQ(roundTrip(Delivery(true)).said, "delivery on");
+  EXPECT_EQ(roundTrip(Delivery(false)).said, "delivery off");
+  EXPECT_EQ(roundTrip(Dropped(18446744073709551615U)).said, "dropped 18446744073709551615");
+  EXPECT_EQ(roundTrip(Ping(5)).said, "ping 5");
+  EXPECT_EQ(roundTrip(Ping(5, true)).said, "ping 5 answer");
 }
 
 TEST(Frames, AnEventKeepsEveryNumberIncludingNegativeOnes) {
-  const Event sent{.kind = EventKind::Trigger,
-                   .metricId = -1,
-                   .payload = {0, 255},
-                   .profileId = -2,
-                   .time = 1709640000123,
-                   .origin = "scenario:city",
-                   .group = 4,
-                   .triggerId = 0x7F0013,
-                   .triggerRef = 9999,
-                   .triggerType = -7};
+  Event sent = metricEvent({.metricId = -1, .payload = {0, 255}, .time = 1709640000123, .origin = "scenario:city"});
+  sent.setKind(static_cast<std::int32_t>(EventKind::Trigger));
+  sent.setProfileId(unsignedOf(-2));
+  sent.setGroup(4);
+  sent.setTriggerId(0x7F0013);
+  sent.setTriggerRef(9999);
+  sent.setTriggerType(unsignedOf(-7));
   const Event got = roundTrip(sent).event;
-  EXPECT_EQ(got.kind, EventKind::Trigger);
-  EXPECT_EQ(got.metricId, -1);
-  EXPECT_EQ(got.payload, sent.payload);
-  EXPECT_EQ(got.profileId, -2);
-  EXPECT_EQ(got.time, sent.time);
-  EXPECT_EQ(got.origin, sent.origin);
-  EXPECT_EQ(got.group, 4);
-  EXPECT_EQ(got.triggerId, 0x7F0013);
-  EXPECT_EQ(got.triggerRef, 9999);
-  EXPECT_EQ(got.triggerType, -7);
+  EXPECT_EQ(got, sent);
+  EXPECT_TRUE(got.isOf(EventKind::Trigger));
+  EXPECT_EQ(signedOf(got.metricId()), -1);
+  EXPECT_EQ(copyOf(got.payload()), (Bytes{0, 255}));
+  EXPECT_EQ(signedOf(got.profileId()), -2);
+  EXPECT_EQ(got.time(), 1709640000123U);
+  EXPECT_EQ(got.origin(), "scenario:city");
+  EXPECT_EQ(got.group(), 4U);
+  EXPECT_EQ(got.triggerId(), 0x7F0013U);
+  EXPECT_EQ(got.triggerRef(), 9999U);
+  EXPECT_EQ(signedOf(got.triggerType()), -7);
 }
 
 TEST(Frames, AnEventTellsItsPeriodAndBehindItsBytesItsAge) {
-  EXPECT_EQ(roundTrip(Event{}).event.period, std::nullopt);
-  EXPECT_EQ(roundTrip(Event{}).event.age, std::nullopt);
-  EXPECT_EQ(roundTrip(Event{.period = milliseconds(0)}).event.period, milliseconds(0));
-  EXPECT_EQ(roundTrip(Event{.period = milliseconds(1500)}).event.period, milliseconds(1500));
+  EXPECT_FALSE(roundTrip(metricEvent()).event.hasPeriod());
+  EXPECT_EQ(roundTrip(metricEvent()).age, std::nullopt);
+  EXPECT_TRUE(roundTrip(metricEvent({.period = milliseconds(0)})).event.hasPeriod());
+  EXPECT_EQ(roundTrip(metricEvent({.period = milliseconds(0)})).event.period(), 0U);
+  EXPECT_EQ(roundTrip(metricEvent({.period = milliseconds(1500)})).event.period(), 1500U);
   const auto aged = [](std::chrono::nanoseconds age) {
-    Bytes bytes = *encode(Event{.metricId = 5});
-    const Trailer trailer = ageTrailer(age);
-    bytes.insert(bytes.end(), trailer.bytes.begin(), trailer.bytes.begin() + trailer.size);
     Recorder recorder;
-    EXPECT_TRUE(decodeFrame(bytes, recorder));
-    EXPECT_EQ(recorder.event.metricId, 5);
-    return recorder.event.age;
+    EXPECT_TRUE(decodeFrame(agedFrame(metricEvent({.metricId = 5}), age), recorder));
+    EXPECT_EQ(recorder.event.metricId(), 5U);
+    return recorder.age;
   };
   EXPECT_EQ(aged(std::chrono::nanoseconds(0)), milliseconds(0));
   EXPECT_EQ(aged(std::chrono::nanoseconds(-5)), milliseconds(0));
@@ -133,8 +134,8 @@ TEST(Frames, SourcesKeepWhatIsSaidOfThem) {
       {.origin = "scenario:city", .phase = State::Phase::Running, .reason = "", .metrics = {0x3C4E04, -1}},
       {.origin = "trace:x.csv", .phase = State::Phase::Ended, .reason = "", .metrics = {}},
       {.origin = "modem", .phase = State::Phase::Failed, .reason = "gone; plug it in", .metrics = {7}}};
-  EXPECT_EQ(roundTrip(Sources{sent}).sources.states, sent);
-  Recorder none = roundTrip(Sources{});
+  EXPECT_EQ(roundTrip(SourceStates{sent}).sources.states, sent);
+  const Recorder none = roundTrip(SourceStates{});
   EXPECT_EQ(none.said, "sources 0");
 }
 
@@ -143,32 +144,27 @@ TEST(Frames, HoweverMuchIsSaidOfTheSourcesItFitsIntoAFrame) {
                             .phase = client::SourceState::Phase::Failed,
                             .reason = std::string(100'000, 'r'),
                             .metrics = std::vector<std::int64_t>(100'000, -1)};
-  const Sources many{std::vector<client::SourceState>(40, state)};
+  const SourceStates many{std::vector<client::SourceState>(40, state)};
   EXPECT_LE(encode(many)->size(), longestFrame);
   const auto got = roundTrip(many).sources.states;
   ASSERT_FALSE(got.empty());
-  EXPECT_LE(got.size(), Sources::most);
-  EXPECT_EQ(got[0].origin, std::string(Sources::longestOrigin, 'o'));
-  EXPECT_EQ(got[0].reason, std::string(Sources::longestReason, 'r'));
+  EXPECT_LE(got.size(), SourceStates::most);
+  EXPECT_EQ(got[0].origin, std::string(longestOrigin, 'o'));
+  EXPECT_EQ(got[0].reason, std::string(longestReason, 'r'));
   EXPECT_EQ(got[0].metrics.size(), mostMetrics);
   // A peer that keeps to nothing of this is cut by whoever hears it.
-  auto content = probeview::Shared<wire::SourcesFrame>::make();
+  Sources rude;
   for (std::size_t count = 0; count < 100; ++count) {
-    wire::SourceFrame& source = content->addSource();
+    Source& source = rude.addSource();
     source.setOrigin(std::string(1200, 'o'));
     source.setPhase(77);
     if (count == 0) {
       for (int metric = 0; metric < 1000; ++metric) source.addMetric().setIdentifier(5);
     }
   }
-  wire::Frame frame;
-  frame.setSources(std::move(content));
-  probeview::PBDataWriter writer;
-  frame.writeTo(writer);
-  Recorder recorder;
-  ASSERT_TRUE(decodeFrame(writer.takeBytes(), recorder));
-  ASSERT_EQ(recorder.sources.states.size(), Sources::most);
-  EXPECT_EQ(recorder.sources.states[0].origin.size(), Sources::longestOrigin);
+  const Recorder recorder = roundTrip(rude);
+  ASSERT_EQ(recorder.sources.states.size(), SourceStates::most);
+  EXPECT_EQ(recorder.sources.states[0].origin.size(), longestOrigin);
   EXPECT_EQ(recorder.sources.states[0].metrics.size(), mostMetrics);
   EXPECT_EQ(recorder.sources.states[0].phase, client::SourceState::Phase::Running) << "of a later version";
   EXPECT_TRUE(recorder.sources.isCut);
@@ -177,24 +173,24 @@ TEST(Frames, HoweverMuchIsSaidOfTheSourcesItFitsIntoAFrame) {
 TEST(Frames, SourcesSayWhetherTheyAreAll) {
   const auto isCut = [](std::size_t sources, std::size_t metrics, std::size_t reason = 0, bool before = false) {
     client::SourceState state;
-    state.origin = std::string(Sources::longestOrigin, 'o');
+    state.origin = std::string(longestOrigin, 'o');
     state.reason = std::string(reason, 'r');
     state.metrics.assign(metrics, -1);
-    const auto got = roundTrip(Sources{std::vector<client::SourceState>(sources, state), before}).sources;
+    const auto got = roundTrip(SourceStates{std::vector<client::SourceState>(sources, state), before}).sources;
     EXPECT_LE(got.states.size(), sources);
     return got.isCut;
   };
   EXPECT_FALSE(isCut(0, 0));
-  EXPECT_FALSE(isCut(Sources::most, 0));
-  EXPECT_TRUE(isCut(Sources::most + 1, 0));
+  EXPECT_FALSE(isCut(SourceStates::most, 0));
+  EXPECT_TRUE(isCut(SourceStates::most + 1, 0));
   EXPECT_FALSE(isCut(1, mostMetrics));
   EXPECT_TRUE(isCut(1, mostMetrics + 1));
   EXPECT_FALSE(isCut(1, 0, 100'000)) << "a shorter reason is the same source";
-  EXPECT_TRUE(isCut(Sources::most, mostMetrics)) << "no frame holds them";
+  EXPECT_TRUE(isCut(SourceStates::most, mostMetrics)) << "no frame holds them";
   EXPECT_TRUE(isCut(1, 0, 0, true)) << "whoever was not told all cannot tell all";
 }
 
-TEST(Frames, AnEmptyPayloadIsAPayload) { EXPECT_TRUE(roundTrip(Event{}).event.payload.empty()); }
+TEST(Frames, AnEmptyPayloadIsAPayload) { EXPECT_TRUE(roundTrip(metricEvent()).event.payload().empty()); }
 
 TEST(Frames, UnknownFramesAndFieldsAreIgnored) {
   Recorder recorder;

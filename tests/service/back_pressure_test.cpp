@@ -16,6 +16,7 @@
 #include "radix/service_commands.h"
 #include "tests/service/harness/temporary_folder.h"
 #include "tests/service/harness/test_service.h"
+#include "tests/support/frames.h"
 
 namespace probeview {
 namespace {
@@ -36,7 +37,7 @@ class Flood final : radix::LinkListener {
  public:
   explicit Flood(std::unique_ptr<radix::Link> link) : link_(std::move(link)) {
     link_->start(*this);
-    send(radix::encode(radix::Hello{.name = "flood"}));
+    send(radix::encode(radix::Hello("flood")));
   }
   bool send(const radix::FrameBytes& frame) { return link_->sendOne(frame); }
 
@@ -78,7 +79,7 @@ TEST(BackPressure, AFloodOfLongOriginsIsCutAndLeftWithItsSenderWhileTheMainThrea
     wrapper.setDelegate(delegate);
     wrapper.listen();
     loop.run();
-    const auto frame = radix::encode(radix::Event{.metricId = 1, .origin = std::string(120'000, 'o')});
+    const auto frame = radix::encode(radix::metricEvent({.metricId = 1, .origin = std::string(120'000, 'o')}));
     const std::size_t before = ::mallinfo2().uordblks + ::mallinfo2().hblkhd;
     std::uint64_t sent = 0;
     for (int round = 0; round < 1000; ++round) {

@@ -13,6 +13,7 @@
 #include "radix/dictionary_bytes.h"
 #include "radix/object.h"
 #include "radix/service_commands.h"
+#include "radix/source_states.h"
 #include "radix/status.h"
 #include "tests/service/harness/raw_client.h"
 #include "tests/service/harness/test_service.h"
@@ -363,11 +364,10 @@ TEST_P(Contract, WhatWaitsForAClientThatReplacesItsConfigurationIsTakenBackAndIs
   Client& other = connect("other");
   RawClient stuck(world_->rawLink());
   const auto pushNow = [&](std::uint32_t sequence, std::string_view text) {
-    stuck.say(radix::Command{
-        .sequence = sequence,
-        .name = radix::kCommandAddConfiguration,
-        .arguments = radix::encodeDictionary(
-            {{radix::kKeyPayload, Value::bytes({reinterpret_cast<const std::uint8_t*>(text.data()), text.size()})}})});
+    stuck.say(radix::Command(
+        sequence, radix::kCommandAddConfiguration,
+        radix::encodeDictionary(
+            {{radix::kKeyPayload, Value::bytes({reinterpret_cast<const std::uint8_t*>(text.data()), text.size()})}})));
   };
   // Of the records that wait for it in the service.
   const auto queued = [&]() -> std::uint64_t {
@@ -378,8 +378,8 @@ TEST_P(Contract, WhatWaitsForAClientThatReplacesItsConfigurationIsTakenBackAndIs
     }
     return 0;
   };
-  stuck.say(radix::Hello{.name = "stuck"});
-  stuck.say(radix::Delivery{true});
+  stuck.say(radix::Hello("stuck"));
+  stuck.say(radix::Delivery(true));
   pushNow(1, "[metrics]\nK_LTE_RRC_STATE = \"on change\"\nK_LTE_CDRX_CONFIG = \"on change\"\n");
   ASSERT_TRUE(until([&] { return stuck.replies.size() == 1; }));
   stuck.setReading(false);
@@ -405,13 +405,13 @@ TEST_P(Contract, WhatWaitsForAClientThatReplacesItsConfigurationIsTakenBackAndIs
   ASSERT_TRUE(until([&] { return queued() == 1; }));
   stuck.setReading(true);
   ASSERT_TRUE(until([&] { return stuck.replies.size() == 2 && stuck.events.size() == count - waited + 2; }));
-  EXPECT_EQ(stuck.events.back().metricId, K_LTE_CDRX_CONFIG);
-  EXPECT_EQ(stuck.events.back().payload, numbered(101));
+  EXPECT_EQ(radix::signedOf(stuck.events.back().metricId()), K_LTE_CDRX_CONFIG);
+  EXPECT_EQ(radix::copyOf(stuck.events.back().payload()), numbered(101));
   EXPECT_EQ(stuck.dropped, 0U);
   // What was taken back was never sent: whoever wants it again gets the last of it.
   pushNow(3, "[metrics]\nK_LTE_RRC_STATE = 1000\n");
   ASSERT_TRUE(until([&] { return stuck.events.size() == count - waited + 3; }));
-  EXPECT_EQ(stuck.events.back().payload.at(1), number);
+  EXPECT_EQ(stuck.events.back().payload()[1], number);
   stuck.hangUp();
 }
 
@@ -528,14 +528,14 @@ TEST_P(Contract, OfMoreSourcesThanAreToldTheClientKnowsThatTheyAreNotAll) {
   EXPECT_FALSE(state().areSourcesCut);
   std::vector<std::shared_ptr<TestService::Script>> scripts;
   world_->onService([&] {
-    while (scripts.size() < radix::Sources::most) {
+    while (scripts.size() < radix::SourceStates::most) {
       scripts.push_back(std::make_shared<TestService::Script>());
       scripts.back()->origin = "source " + std::to_string(scripts.size());
       world_->service().addSource(std::make_unique<ScriptedSource>(scripts.back()));
     }
   });
   EXPECT_TRUE(until([&] { return state().areSourcesCut; }));
-  EXPECT_EQ(state().sources->size(), radix::Sources::most);
+  EXPECT_EQ(state().sources->size(), radix::SourceStates::most);
   // Of a service that is not there nothing is known, and the next one has one source.
   world_->kill();
   EXPECT_TRUE(until([&] { return !state().connected; }));
@@ -886,14 +886,14 @@ TEST_P(Contract, AClientPastTheLimitIsRefusedWithAReasonAndTheOthersAreServed) {
 }
 
 TEST_P(Contract, AClientOlderThanTheServiceLikesIsRefusedAndToldWhichSideToUpdate) {
-  make({.version = 3, .oldestVersion = 2});
+  make({.versions = {.spoken = 3, .oldest = 2}});
   const Result result = perform(connect(), radix::kCommandShowStatus);
   EXPECT_EQ(result.status, static_cast<int>(Status::VersionMismatch));
   EXPECT_NE(result.message.find("update the client"), std::string::npos) << result.message;
 }
 
 TEST_P(Contract, AServiceOfALaterVersionThatStillKnowsOursIsServed) {
-  make({.version = 3, .oldestVersion = 1});
+  make({.versions = {.spoken = 3, .oldest = 1}});
   EXPECT_EQ(perform(connect(), radix::kCommandShowStatus).status, 0);
 }
 

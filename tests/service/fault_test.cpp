@@ -15,6 +15,7 @@
 #include "radix/dictionary_bytes.h"
 #include "radix/in_process_link.h"
 #include "radix/service_commands.h"
+#include "radix/source_states.h"
 #include "radix/status.h"
 #include "service/service.h"
 #include "tests/service/harness/raw_client.h"
@@ -58,23 +59,20 @@ class Faults : public ::testing::Test, protected radix::Connector {
   // A raw client that has greeted and been greeted.
   std::unique_ptr<RawClient> greeted(const std::string& name = "raw", bool observes = true) {
     auto client = connectRaw();
-    client->say(radix::Hello{.name = name, .observes = observes});
+    client->say(observes ? radix::observer(name) : radix::Hello(name));
     loop_.run();
     EXPECT_TRUE(client->hello.has_value());
     return client;
   }
 
   static radix::Command query(std::int64_t metric) {
-    return {.sequence = 1,
-            .name = radix::kCommandQueryMetric,
-            .arguments = radix::encodeDictionary({{radix::kKeyMetricID, metric}})};
+    return {1, radix::kCommandQueryMetric, radix::encodeDictionary({{radix::kKeyMetricID, metric}})};
   }
 
   static radix::Command push(const std::string& text) {
     return {
-        .sequence = 1,
-        .name = radix::kCommandAddConfiguration,
-        .arguments = radix::encodeDictionary(
+        1, radix::kCommandAddConfiguration,
+        radix::encodeDictionary(
             {{radix::kKeyPayload, Value::bytes({reinterpret_cast<const std::uint8_t*>(text.data()), text.size()})}})};
   }
 
@@ -199,8 +197,8 @@ TEST_F(Faults, ADayOfComingAndGoingUnderAClockThatIsSetAgainAndAgainLeavesNothin
     const bool known = events_ > 0;
     const int before = events_;
     guest->say(push("[metrics]\nK_LTE_RRC_STATE = " + std::to_string(100 + stay) + "\nK_OF_NOBODY = 5\n"));
-    guest->say(radix::Delivery{true});
-    guest->say(radix::Command{.sequence = 2, .name = radix::kCommandQueryMetric, .arguments = {}});
+    guest->say(radix::Delivery(true));
+    guest->say(radix::Command(2, radix::kCommandQueryMetric));
     loop_.advance(minutes(2) + milliseconds(500));
     guest->setReading(false);
     loop_.advance(minutes(5));
@@ -229,16 +227,16 @@ TEST_F(Faults, AHundredAndTwentyEightClientsAreServedAndOneMoreIsToldSo) {
   std::deque<std::unique_ptr<RawClient>> crowd;
   for (int number = 0; number < 127; ++number) crowd.push_back(greeted(std::string(64, 'n')));
   EXPECT_EQ(service_.clientCount(), 128U);
-  for (const auto& client : crowd) EXPECT_EQ(client->hello->refusalStatus, 0);
+  for (const auto& client : crowd) EXPECT_EQ(client->hello->refusalStatus(), 0);
   // What the service has to say of so many fits into one frame.
   EXPECT_EQ(status().find("clients")->list()->size(), 128U);
   auto late = greeted("late");
-  EXPECT_EQ(late->hello->refusalStatus, static_cast<std::int32_t>(radix::Status::TooMany));
-  EXPECT_EQ(late->hello->refusal, "there are already 128 clients, more are not served");
+  EXPECT_EQ(late->hello->refusalStatus(), static_cast<std::int32_t>(radix::Status::TooMany));
+  EXPECT_EQ(late->hello->refusal(), "there are already 128 clients, more are not served");
   EXPECT_EQ(log_.count("'late' (process 0, user 0) was refused: there are already 128 clients"), 1U);
   crowd.pop_front();
   loop_.run();
-  EXPECT_EQ(greeted()->hello->refusalStatus, 0);
+  EXPECT_EQ(greeted()->hello->refusalStatus(), 0);
 }
 
 TEST_F(Faults, SixteenClientsAndConnectionsMoreAreKeptForTheServicesOwnUserAndRoot) {
@@ -249,16 +247,16 @@ TEST_F(Faults, SixteenClientsAndConnectionsMoreAreKeptForTheServicesOwnUserAndRo
   };
   std::deque<std::unique_ptr<RawClient>> crowd;
   for (int number = 0; number < 127; ++number) crowd.push_back(greeted(std::string(64, 'n')));
-  EXPECT_NE(greeted("late")->hello->refusalStatus, 0);
+  EXPECT_NE(greeted("late")->hello->refusalStatus(), 0);
   std::deque<std::unique_ptr<RawClient>> own;
   for (int number = 0; number < 17; ++number) {
     own.push_back(connectOwn());
-    own.back()->say(radix::Hello{.name = std::string(64, 'o')});
+    own.back()->say(radix::Hello(std::string(64, 'o')));
   }
   loop_.run();
   EXPECT_EQ(service_.clientCount(), 128U + 16);
-  EXPECT_EQ(own[15]->hello->refusalStatus, 0);
-  EXPECT_EQ(own[16]->hello->refusal, "there are already 144 clients, more are not served");
+  EXPECT_EQ(own[15]->hello->refusalStatus(), 0);
+  EXPECT_EQ(own[16]->hello->refusal(), "there are already 144 clients, more are not served");
   // What the service has to say of so many fits into one frame.
   EXPECT_EQ(status().find("clients")->list()->size(), 144U);
   own.clear();
@@ -297,7 +295,7 @@ TEST_F(Faults, AClientHasFiveSecondsToGreetAndWhoeverWasRefusedOneToGo) {
   loop_.advance(milliseconds(1));
   EXPECT_TRUE(silent->closed);
   const auto refused = connectRaw();
-  refused->say(radix::Delivery{true});
+  refused->say(radix::Delivery(true));
   loop_.run();
   ASSERT_TRUE(refused->hello.has_value());
   loop_.advance(seconds(1) - milliseconds(1));
@@ -324,12 +322,12 @@ TEST_F(Faults, AClientsNameIsKeptUpToSixtyFourBytesAndNoCharacterIsCutInTwo) {
 
 TEST_F(Faults, AnOriginIsKeptUpTo1024Bytes) {
   const auto client = greeted();
-  client->say(radix::Delivery{true});
+  client->say(radix::Delivery(true));
   loop_.run();
   for (const std::size_t size : {1024U, 1025U}) {
     script_->sink->emit({K_LTE_RRC_STATE, {}, milliseconds(1), std::string(size, 'o')});
     loop_.advance(milliseconds(1));
-    EXPECT_EQ(client->events.back().origin, std::string(1024, 'o'));
+    EXPECT_EQ(client->events.back().origin(), std::string(1024, 'o'));
   }
   auto other = std::make_shared<ScriptedSource::Script>();
   other->origin = std::string(1025, 'p');
@@ -363,12 +361,12 @@ TEST_F(Faults, OfTheRecordsThatAreWithheldTheFirstTheSecondTheFourthTheEighthAre
 TEST_F(Faults, ACommandsNameInAReplyIsCutAtSixtyFourBytes) {
   const auto client = greeted();
   for (const std::size_t size : {64U, 65U, 100'000U}) {
-    client->say(radix::Command{.sequence = 1, .name = std::string(size, 'c'), .arguments = {}});
-    client->say(radix::Command{.sequence = 2, .name = std::string(size, 'c'), .arguments = {0x0A, 0x7F}});
+    client->say(radix::Command(1, std::string(size, 'c')));
+    client->say(radix::Command(2, std::string(size, 'c'), std::vector<std::uint8_t>{0x0A, 0x7F}));
     loop_.run();
     ASSERT_EQ(client->replies.size(), 2U);
-    EXPECT_EQ(client->replies[0].message, "the command '" + std::string(64, 'c') + "' is not known");
-    EXPECT_EQ(client->replies[1].message, "the arguments of " + std::string(64, 'c') + " cannot be read");
+    EXPECT_EQ(client->replies[0].message(), "the command '" + std::string(64, 'c') + "' is not known");
+    EXPECT_EQ(client->replies[1].message(), "the arguments of " + std::string(64, 'c') + " cannot be read");
     client->replies.clear();
   }
 }
@@ -406,15 +404,15 @@ TEST_F(Faults, SixtyFourRepliesMayBeLeftUnreadAndAfterOneMoreTheClientIsNotListe
   // The greeting, and what feeds the service.
   link.room = 2;
   service_.accept(std::make_unique<StuckLink>(link), {});
-  link.listener->onFrame(*radix::encode(radix::Hello{.name = "stuck"}));
+  link.listener->onFrame(*radix::encode(radix::Hello("stuck")));
   loop_.run();
   EXPECT_EQ(link.sent, 2U);
   for (std::uint64_t number = 0; number < 64; ++number) {
-    link.listener->onFrame(*radix::encode(radix::Ping{.number = number}));
+    link.listener->onFrame(*radix::encode(radix::Ping(number)));
   }
   loop_.run();
   EXPECT_TRUE(link.reading);
-  link.listener->onFrame(*radix::encode(radix::Ping{.number = 64}));
+  link.listener->onFrame(*radix::encode(radix::Ping(64)));
   loop_.run();
   EXPECT_FALSE(link.reading);
   link.room = 64;
@@ -432,13 +430,17 @@ class Heard final : public radix::FrameHandler {
   explicit Heard(const std::vector<std::vector<std::uint8_t>>& frames) {
     for (const auto& frame : frames) EXPECT_TRUE(radix::decodeFrame(frame, *this));
   }
-  void onEvent(radix::Event event) override { events.push_back(std::move(event)); }
-  void onReply(radix::Reply reply) override { replies.push_back(std::move(reply)); }
-  void onSources(radix::Sources sources) override { told.push_back(std::move(sources)); }
-  void onDropped(radix::Dropped one) override { dropped += one.count; }
+  void onEvent(const radix::Event& event, std::optional<milliseconds> age) override {
+    events.push_back(event);
+    ages.push_back(age);
+  }
+  void onReply(const radix::Reply& reply) override { replies.push_back(reply); }
+  void onSources(const radix::Sources& sources) override { told.push_back(radix::statesOf(sources)); }
+  void onDropped(const radix::Dropped& one) override { dropped += one.count(); }
   std::vector<radix::Event> events;
+  std::vector<std::optional<milliseconds>> ages;
   std::vector<radix::Reply> replies;
-  std::vector<radix::Sources> told;
+  std::vector<radix::SourceStates> told;
   std::uint64_t dropped = 0;
 };
 
@@ -452,37 +454,35 @@ TEST_F(Faults, WhatWaitsForAClientThatClearsItsConfigurationIsTakenBackAndALater
   link.room = 2;
   service_.accept(std::make_unique<StuckLink>(link), {});
   const auto say = [&](const auto& sentence) { link.listener->onFrame(*radix::encode(sentence)); };
-  say(radix::Hello{.name = "stuck"});
-  say(radix::Delivery{true});
+  say(radix::Hello("stuck"));
+  say(radix::Delivery(true));
   say(push("[metrics]\nK_LTE_RRC_STATE = 1000\n"));
   loop_.advance(milliseconds(1));
   script_->emit(K_LTE_RRC_STATE, {0x10, 1}, milliseconds(1));
   script_->emit(K_LTE_RRC_STATE, {0x10, 1}, milliseconds(2));
-  say(radix::Command{.sequence = 2,
-                     .name = radix::kCommandQueryMetric,
-                     .arguments = radix::encodeDictionary({{radix::kKeyMetricID, K_LTE_RRC_STATE}})});
-  say(radix::Command{.sequence = 3, .name = radix::kCommandClearConfiguration, .arguments = {}});
+  say(radix::Command(2, radix::kCommandQueryMetric, radix::encodeDictionary({{radix::kKeyMetricID, K_LTE_RRC_STATE}})));
+  say(radix::Command(3, radix::kCommandClearConfiguration));
   link.room = 100;
   link.listener->onWritable();
   loop_.advance(milliseconds(1));
   Heard heard(link.frames);
   ASSERT_EQ(heard.replies.size(), 3U);
   ASSERT_EQ(heard.events.size(), 1U) << "the answer to its question is its own";
-  EXPECT_EQ(heard.events[0].time, 3);
+  EXPECT_EQ(heard.events[0].time(), 3U);
   EXPECT_EQ(heard.dropped, 0U) << "nobody was too slow";
   // Of the other metric nothing has left.
   link.room = 0;
   say(push("[metrics]\nK_LTE_TX_POWER = 1000\n"));
   script_->emit(K_LTE_TX_POWER, {}, milliseconds(4));
   loop_.advance(milliseconds(1));
-  say(radix::Command{.sequence = 5, .name = radix::kCommandClearConfiguration, .arguments = {}});
+  say(radix::Command(5, radix::kCommandClearConfiguration));
   say(push("[metrics]\nK_LTE_TX_POWER = 1000\nK_LTE_RRC_STATE = 1000\n"));
   link.room = 100;
   link.listener->onWritable();
   loop_.advance(milliseconds(1));
   heard = Heard(link.frames);
   ASSERT_EQ(heard.events.size(), 2U);
-  EXPECT_EQ(heard.events[1].time, 4);
+  EXPECT_EQ(heard.events[1].time(), 4U);
 }
 
 TEST_F(Faults, ARecordGrowsOlderWhileTheDeviceSleeps) {
@@ -490,12 +490,12 @@ TEST_F(Faults, ARecordGrowsOlderWhileTheDeviceSleeps) {
   loop_.advance(seconds(1));
   loop_.sleep(hours(8));
   const auto client = greeted();
-  client->say(radix::Delivery{true});
+  client->say(radix::Delivery(true));
   loop_.advance(milliseconds(1));
   ASSERT_EQ(client->events.size(), 1U);
-  ASSERT_TRUE(client->events[0].age);
-  EXPECT_GE(*client->events[0].age, hours(8) + seconds(1));
-  EXPECT_LT(*client->events[0].age, hours(8) + seconds(2));
+  ASSERT_TRUE(client->ages[0]);
+  EXPECT_GE(*client->ages[0], hours(8) + seconds(1));
+  EXPECT_LT(*client->ages[0], hours(8) + seconds(2));
   const Dictionary report = status();
   const auto ageOfLast = (*report.find("sources")->list())[0].dictionary()->find("last_record_age_ms")->int64();
   EXPECT_GE(milliseconds(ageOfLast.value()), hours(8) + seconds(1));
@@ -505,8 +505,8 @@ TEST_F(Faults, ARecordThatWaitsForAStuckReaderOverASleepHasGrownOlderWhenItLeave
   StuckLink::Shared link;
   link.room = 2;
   service_.accept(std::make_unique<StuckLink>(link), {});
-  link.listener->onFrame(*radix::encode(radix::Hello{.name = "stuck", .observes = true}));
-  link.listener->onFrame(*radix::encode(radix::Delivery{true}));
+  link.listener->onFrame(*radix::encode(radix::observer("stuck")));
+  link.listener->onFrame(*radix::encode(radix::Delivery(true)));
   loop_.advance(milliseconds(1));
   emit();
   loop_.advance(milliseconds(1));
@@ -516,9 +516,9 @@ TEST_F(Faults, ARecordThatWaitsForAStuckReaderOverASleepHasGrownOlderWhenItLeave
   loop_.advance(milliseconds(1));
   const Heard heard(link.frames);
   ASSERT_EQ(heard.events.size(), 1U);
-  ASSERT_TRUE(heard.events[0].age);
-  EXPECT_GE(*heard.events[0].age, hours(8));
-  EXPECT_LT(*heard.events[0].age, hours(8) + seconds(1));
+  ASSERT_TRUE(heard.ages[0]);
+  EXPECT_GE(*heard.ages[0], hours(8));
+  EXPECT_LT(*heard.ages[0], hours(8) + seconds(1));
 }
 
 TEST_F(Faults, ARecordTellsHowOldItWasWhenItLeftWhateverTheTimeOfDay) {
@@ -531,24 +531,25 @@ TEST_F(Faults, ARecordTellsHowOldItWasWhenItLeftWhateverTheTimeOfDay) {
   loop_.advance(minutes(3));
   loop_.setWallTime(loop_.wallTime() - hours(1000));
   const auto client = greeted();
-  client->say(radix::Delivery{true});
+  client->say(radix::Delivery(true));
   loop_.advance(milliseconds(1));
   ASSERT_EQ(client->events.size(), 1U);
-  EXPECT_EQ(client->events[0].age, milliseconds(185'000));
-  EXPECT_EQ(client->events[0].period, seconds(1));
+  EXPECT_EQ(client->ages[0], milliseconds(185'000));
+  EXPECT_EQ(client->events[0].period(), 1000U);
   emit();
   loop_.advance(milliseconds(1));
   ASSERT_EQ(client->events.size(), 2U);
-  EXPECT_EQ(client->events[1].age, milliseconds(0));
-  EXPECT_EQ(client->events[1].period, milliseconds(0)) << "on change";
+  EXPECT_EQ(client->ages[1], milliseconds(0));
+  EXPECT_TRUE(client->events[1].hasPeriod());
+  EXPECT_EQ(client->events[1].period(), 0U) << "on change";
 }
 
 TEST_F(Faults, ARecordThatWaitsForASlowClientGrowsOlderUntilItLeaves) {
   StuckLink::Shared link;
   link.room = 2;
   service_.accept(std::make_unique<StuckLink>(link), {});
-  link.listener->onFrame(*radix::encode(radix::Hello{.name = "slow", .observes = true}));
-  link.listener->onFrame(*radix::encode(radix::Delivery{true}));
+  link.listener->onFrame(*radix::encode(radix::observer("slow")));
+  link.listener->onFrame(*radix::encode(radix::Delivery(true)));
   loop_.advance(milliseconds(1));
   emit();
   loop_.advance(seconds(7));
@@ -556,14 +557,14 @@ TEST_F(Faults, ARecordThatWaitsForASlowClientGrowsOlderUntilItLeaves) {
   link.listener->onWritable();
   const Heard heard(link.frames);
   ASSERT_EQ(heard.events.size(), 1U);
-  EXPECT_EQ(heard.events[0].age, milliseconds(7000));
+  EXPECT_EQ(heard.ages[0], milliseconds(7000));
 }
 
 TEST_F(Faults, OfAllChangesOfTheSourcesASlowClientIsToldTheLastAlone) {
   StuckLink::Shared link;
   link.room = 2;
   service_.accept(std::make_unique<StuckLink>(link), {});
-  link.listener->onFrame(*radix::encode(radix::Hello{.name = "slow"}));
+  link.listener->onFrame(*radix::encode(radix::Hello("slow")));
   loop_.advance(milliseconds(1));
   using Phase = SourceCondition::Phase;
   for (int turn = 0; turn < 500; ++turn) {
@@ -584,10 +585,8 @@ TEST_F(Faults, AnAnswerThatComesAfterHalfAMinuteIsNone) {
   script_->onQuery = [](std::int64_t) { return true; };
   for (const auto late : {milliseconds(0), milliseconds(1)}) {
     const auto client = greeted("asks", false);
-    client->say(radix::Delivery{true});
-    client->say(radix::Command{.sequence = 1,
-                               .name = radix::kCommandQueryMetric,
-                               .arguments = radix::encodeDictionary({{radix::kKeyMetricID, K_LTE_RRC_STATE}})});
+    client->say(radix::Delivery(true));
+    client->say(query(K_LTE_RRC_STATE));
     loop_.run();
     loop_.advance(seconds(30) + late);
     emit();
@@ -606,10 +605,10 @@ TEST_F(Faults, AnAnswerThatCameWhileEventsWereOffIsThereHoweverLongTheyStayOff) 
   script_->emit(K_LTE_TX_POWER, {}, milliseconds(2));
   loop_.advance(milliseconds(1));
   ASSERT_TRUE(client->events.empty());
-  client->say(radix::Delivery{true});
+  client->say(radix::Delivery(true));
   loop_.advance(milliseconds(1));
   ASSERT_EQ(client->events.size(), 1U);
-  EXPECT_EQ(client->events[0].time, 1);
+  EXPECT_EQ(client->events[0].time(), 1U);
 }
 
 TEST_F(Faults, TwoHundredAndFiftySixQuestionsMayBeOpenAndOneMoreTakesThePlaceOfTheOldest) {
@@ -620,7 +619,7 @@ TEST_F(Faults, TwoHundredAndFiftySixQuestionsMayBeOpenAndOneMoreTakesThePlaceOfT
   service_.addSource(std::make_unique<ScriptedSource>(silent));
   for (const int others : {255, 256}) {
     const auto client = greeted("asks", false);
-    client->say(radix::Delivery{true});
+    client->say(radix::Delivery(true));
     client->say(query(K_LTE_RRC_STATE));
     for (int number = 0; number < others; ++number) {
       client->say(query(K_LTE_TX_POWER));

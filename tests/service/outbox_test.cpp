@@ -23,7 +23,7 @@ radix::FrameBytes frame(std::uint8_t mark, std::size_t size = 1) {
 // Notes the losses that it is told of.
 class Losses final : public radix::FrameHandler {
  public:
-  void onDropped(radix::Dropped dropped) override { count += dropped.count; }
+  void onDropped(const radix::Dropped& dropped) override { count += dropped.count(); }
   std::uint64_t count = 0;
 };
 

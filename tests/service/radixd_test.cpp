@@ -251,8 +251,8 @@ TEST_F(Radixd, FiftyClientsConnectAtOnceAndAllAreServed) {
     auto result = radix::makeSocketConnector(loop_, surroundings())->connect();
     ASSERT_TRUE(result.link) << "client " << number << ": " << result.error;
     crowd.push_back(std::make_unique<RawClient>(std::move(result.link)));
-    crowd.back()->say(radix::Hello{.name = "crowd", .observes = true});
-    crowd.back()->say(radix::Delivery{true});
+    crowd.back()->say(radix::observer("crowd"));
+    crowd.back()->say(radix::Delivery(true));
   }
   radixd.send(SIGCONT);
   for (const auto& client : crowd) {
@@ -274,7 +274,7 @@ TEST_F(Radixd, WithoutDescriptorsItStaysUpAndServesAgainWhenThereAreSome) {
   std::vector<std::unique_ptr<RawClient>> crowd;
   for (int number = 0; number < 30; ++number) {
     crowd.push_back(std::make_unique<RawClient>(radix::makeSocketConnector(loop_, surroundings())->connect().link));
-    crowd.back()->say(radix::Hello{.name = "crowd", .observes = true});
+    crowd.back()->say(radix::observer("crowd"));
   }
   EXPECT_TRUE(radixd.waitForLog("cannot accept a connection: Too many open files; trying again soon"));
   crowd.erase(crowd.begin(), crowd.begin() + 25);
@@ -396,7 +396,7 @@ TEST_F(Radixd, ItsLastLineComesAlsoAfterMoreLinesThanAMinuteMayHave) {
   RadixdProcess radixd(arguments());
   ASSERT_TRUE(radixd.waitForLog("listening"));
   // Each comes and goes with a line.
-  const auto hello = radix::encode(radix::Hello{.name = "guest"});
+  const auto hello = radix::encode(radix::Hello("guest"));
   for (int number = 0; number < 600; ++number) {
     const FileDescriptor guest(connectPlainly(socket_));
     ASSERT_TRUE(guest);
@@ -453,10 +453,9 @@ TEST_F(Radixd, AClientThatIsKilledWhileItTalksLeavesTheOthersServed) {
   ASSERT_TRUE(radixd.waitForLog("listening"));
   const auto other = manager();
   ASSERT_EQ(status(other), 0);
-  const auto hello = radix::encode(radix::Hello{.name = "victim"});
-  const auto on = radix::encode(radix::Delivery{true});
-  const auto command = radix::encode(
-      radix::Command{.sequence = 1, .name = radix::kCommandShowStatus, .arguments = std::vector<std::uint8_t>(60'000)});
+  const auto hello = radix::encode(radix::Hello("victim"));
+  const auto on = radix::encode(radix::Delivery(true));
+  const auto command = radix::encode(radix::Command(1, radix::kCommandShowStatus, std::vector<std::uint8_t>(60'000)));
   for (int round = 1; round <= 5; ++round) {
     const pid_t victim = ::fork();
     if (victim == 0) {
@@ -503,7 +502,7 @@ TEST_F(Radixd, AForeignUsersConnectionIsRefusedAndLogged) {
     ::setenv("LISTEN_PID", std::to_string(::getpid()).c_str(), 1);
   });
   ASSERT_TRUE(radixd.waitForLog("listening at a socket of the system manager")) << radixd.log();
-  const auto hello = radix::encode(radix::Hello{.name = "foreigner"});
+  const auto hello = radix::encode(radix::Hello("foreigner"));
   const pid_t foreigner = ::fork();
   if (foreigner == 0) {
     if (::setgroups(0, nullptr) != 0 || ::setgid(nobody) != 0 || ::setuid(nobody) != 0) ::_exit(3);

@@ -244,18 +244,18 @@ class ListenerTest : public ListeningSocketTest {
 TEST_F(ListenerTest, AForeignUsersConnectionIsRefusedWithAReasonAndLogged) {
   foreign_ = Credentials{4711, ::geteuid() + 1, 12345, {}};
   const auto client = connect();
-  client->say(radix::Hello{.name = "foreigner"});
+  client->say(radix::Hello("foreigner"));
   ASSERT_TRUE(loop_.runUntil([&] { return client->hello.has_value(); }, patience));
-  EXPECT_EQ(client->hello->refusalStatus, static_cast<std::int32_t>(radix::Status::NotPermitted));
-  EXPECT_THAT(client->hello->refusal, HasSubstr("may connect, not user " + std::to_string(::geteuid() + 1)));
+  EXPECT_EQ(client->hello->refusalStatus(), static_cast<std::int32_t>(radix::Status::NotPermitted));
+  EXPECT_THAT(client->hello->refusal(), HasSubstr("may connect, not user " + std::to_string(::geteuid() + 1)));
   EXPECT_EQ(log_.count("(process 4711, user " + std::to_string(::geteuid() + 1) + ") was refused"), 1U);
   EXPECT_EQ(service_.clientCount(), 0U);
   // The others are served.
   foreign_.reset();
   const auto own = connect();
-  own->say(radix::Hello{.name = "own"});
+  own->say(radix::Hello("own"));
   ASSERT_TRUE(loop_.runUntil([&] { return own->hello.has_value(); }, patience));
-  EXPECT_EQ(own->hello->refusalStatus, 0);
+  EXPECT_EQ(own->hello->refusalStatus(), 0);
 }
 
 TEST_F(ListenerTest, TheServicesOwnUserAndRootAreKnownAsSuch) {
@@ -283,15 +283,15 @@ TEST_F(ListenerTest, AConnectionWhoseUserTheSystemDoesNotTellIsRefused) {
   foreign_ = std::optional<Credentials>();
   const auto client = connect();
   ASSERT_TRUE(loop_.runUntil([&] { return client->hello.has_value(); }, patience));
-  EXPECT_EQ(client->hello->refusalStatus, static_cast<std::int32_t>(radix::Status::NotPermitted));
+  EXPECT_EQ(client->hello->refusalStatus(), static_cast<std::int32_t>(radix::Status::NotPermitted));
 }
 
 TEST_F(ListenerTest, AForeignUserWhoGoesOnTalkingIsNotHeard) {
   foreign_ = Credentials{4711, ::geteuid() + 1, 12345, {}};
   const auto client = connect();
-  client->say(radix::Hello{.name = "foreigner"});
-  client->say(radix::Delivery{true});
-  client->say(radix::Command{.sequence = 1, .name = radix::kCommandShowStatus, .arguments = {}});
+  client->say(radix::Hello("foreigner"));
+  client->say(radix::Delivery(true));
+  client->say(radix::Command(1, radix::kCommandShowStatus));
   ASSERT_TRUE(loop_.runUntil([&] { return client->closed; }, patience));
   EXPECT_TRUE(client->replies.empty());
 }
@@ -301,7 +301,7 @@ TEST_F(ListenerTest, WithoutDescriptorsItRestsBetweenTwoTriesAndTakesThoseWhoWai
   GTEST_SKIP() << "the sanitizer opens a pipe to look at memory and reports a fault of its own when it gets none";
 #endif
   const auto client = connect();
-  client->say(radix::Hello{.name = "waits"});
+  client->say(radix::Hello("waits"));
   rlimit before{};
   ASSERT_EQ(::getrlimit(RLIMIT_NOFILE, &before), 0);
   const int next = ::dup(0);

@@ -10,6 +10,7 @@
 #include <sstream>
 
 #include "messages/metric_identifiers.h"
+#include "tests/support/frames.h"
 #include "tests/support/harmless.h"
 #include "tests/support/output_of.h"
 #include "tests/tools/hostile_service.h"
@@ -135,10 +136,10 @@ class HostileTexts : public ::testing::Test {
   }
   static radix::Event event(std::string origin, std::int64_t time) {
     // An access point's name with a sequence that clears the screen.
-    return {.metricId = K_CELLULAR_ACTIVE_BEARER,
-            .payload = {0x1A, 0x07, 0x1A, 0x05, 0x1B, 0x5B, 0x32, 0x4A, 0xFF},
-            .time = time,
-            .origin = std::move(origin)};
+    return radix::metricEvent({.metricId = K_CELLULAR_ACTIVE_BEARER,
+                               .payload = {0x1A, 0x07, 0x1A, 0x05, 0x1B, 0x5B, 0x32, 0x4A, 0xFF},
+                               .time = time,
+                               .origin = std::move(origin)});
   }
 };
 
@@ -149,7 +150,7 @@ TEST_F(HostileTexts, OfARefusalReachNoTerminal) {
     EXPECT_EQ(outcome.status, 1);
     EXPECT_EQ(std::ranges::count(outcome.errors, '\n'), 1);
     EXPECT_THAT(outcome.errors, HasSubstr("\\u{1b}[2J"));
-    EXPECT_EQ(against({.hello = {.refusalStatus = 10, .refusal = hostileText()}}, arguments).status, 1);
+    EXPECT_EQ(against({.hello = radix::refusing(10, hostileText())}, arguments).status, 1);
   }
 }
 

@@ -21,7 +21,7 @@ namespace probeview {
 class HostileService {
  public:
   struct Part {
-    radix::Hello hello{.name = "hostile"};
+    radix::Hello hello{"hostile"};
     std::int32_t status = 0;  // of each command
     std::string message{};
     Dictionary content{};
@@ -66,15 +66,12 @@ class HostileService {
     void onBatchEnd() override {}
     void onWritable() override {}
     void onClosed() override {}
-    void onHello(radix::Hello) override { say(part_.hello); }
-    void onCommand(radix::Command command) override {
-      say(radix::Reply{.sequence = command.sequence,
-                       .status = part_.status,
-                       .message = part_.message,
-                       .content = radix::encodeDictionary(part_.content)});
+    void onHello(const radix::Hello&) override { say(part_.hello); }
+    void onCommand(const radix::Command& command) override {
+      say(radix::Reply(command.sequence(), part_.status, part_.message, radix::encodeDictionary(part_.content)));
     }
-    void onDelivery(radix::Delivery delivery) override {
-      if (!delivery.on) return;
+    void onDelivery(const radix::Delivery& delivery) override {
+      if (!delivery.on()) return;
       for (const radix::Event& event : part_.events) say(event);
     }
 

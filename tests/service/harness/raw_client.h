@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include <chrono>
 #include <cstdint>
 #include <memory>
 #include <optional>
@@ -10,6 +11,7 @@
 
 #include "radix/frames.h"
 #include "radix/link.h"
+#include "tests/support/frames.h"
 
 namespace probeview {
 
@@ -35,8 +37,8 @@ class RawClient final : radix::LinkListener, radix::FrameHandler {
   std::optional<radix::Hello> hello;
   std::vector<radix::Reply> replies;
   std::vector<radix::Event> events;
+  std::vector<std::optional<std::chrono::milliseconds>> ages;  // of the events' records
   std::vector<radix::Ping> pings;
-  std::vector<radix::Sources> told;  // what feeds the service, as often as it was said
   std::uint64_t dropped = 0;
   int droppedFrames = 0;
   bool closed = false;
@@ -47,15 +49,17 @@ class RawClient final : radix::LinkListener, radix::FrameHandler {
   void onBatchEnd() override {}
   void onWritable() override {}
   void onClosed() override { closed = true; }
-  void onHello(radix::Hello one) override { hello = std::move(one); }
-  void onReply(radix::Reply reply) override { replies.push_back(std::move(reply)); }
-  void onEvent(radix::Event event) override { events.push_back(std::move(event)); }
-  void onDropped(radix::Dropped one) override {
-    dropped += one.count;
+  void onHello(const radix::Hello& one) override { hello = one; }
+  void onReply(const radix::Reply& reply) override { replies.push_back(reply); }
+  void onEvent(const radix::Event& event, std::optional<std::chrono::milliseconds> age) override {
+    events.push_back(event);
+    ages.push_back(age);
+  }
+  void onDropped(const radix::Dropped& one) override {
+    dropped += one.count();
     ++droppedFrames;
   }
-  void onPing(radix::Ping ping) override { pings.push_back(ping); }
-  void onSources(radix::Sources sources) override { told.push_back(std::move(sources)); }
+  void onPing(const radix::Ping& ping) override { pings.push_back(ping); }
 
   std::unique_ptr<radix::Link> link_;
 };
