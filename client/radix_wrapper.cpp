@@ -19,7 +19,6 @@ namespace {
 
 // Only this application may use the door.
 constexpr std::string_view applicationId = "probeview";
-constexpr std::int64_t configurationPayloadType = 0;
 
 constexpr std::string_view blockName = "-[RadixWrapper listen]_block_invoke";
 
@@ -111,7 +110,7 @@ bool RadixWrapper::addTelemConfigForAppId(std::string_view appId, const std::str
   return perform("-[RadixWrapper addTelemConfigForAppId:andProtofFilePath:]", radix::kCommandAddConfiguration,
                  {{radix::kKeyAppID, radix::serviceAppId},
                   {radix::kKeyPayload, Value::bytes(*content.bytes)},
-                  {radix::kKeyPayloadType, configurationPayloadType}});
+                  {radix::kKeyPayloadType, radix::configurationPayloadType}});
 }
 
 bool RadixWrapper::removeTelemConfigForAppid(std::string_view appId) {
@@ -126,7 +125,7 @@ bool RadixWrapper::querySpecificMetric(std::string_view appId, std::int32_t trig
   return perform("-[RadixWrapper querySpecificMetric:triggerRef:triggerType:triggerID:profileID:metricID:]",
                  radix::kCommandQueryMetric,
                  {{radix::kKeyAppID, radix::serviceAppId},
-                  {radix::kKeyPayloadType, configurationPayloadType},
+                  {radix::kKeyPayloadType, radix::configurationPayloadType},
                   {radix::kKeyTriggerRef, widened(triggerRef)},
                   {radix::kKeyTriggerType, widened(triggerType)},
                   {radix::kKeyTriggerID, widened(triggerID)},

@@ -59,6 +59,8 @@ inline constexpr std::size_t mostMetrics = 256;
 
 // What our programs call themselves in kKeyAppID.
 inline constexpr std::int64_t serviceAppId = 2;
+// What kKeyPayload of a configuration holds, as kKeyPayloadType says it: the text of a configuration file.
+inline constexpr std::int64_t configurationPayloadType = 0;
 
 inline constexpr char kCommandAddConfiguration[] = "kCommandAddConfiguration";
 inline constexpr char kCommandClearConfiguration[] = "kCommandClearConfiguration";

@@ -26,7 +26,6 @@ using radix::Status;
 
 // More notes on one configuration than anybody reads.
 constexpr std::size_t mostNotesTold = 10;
-constexpr std::int64_t configurationPayloadType = 0;
 
 // The session fills in the sequence number.
 Reply answer(Status status, std::string_view message = {}) {
@@ -59,7 +58,8 @@ PushedConfiguration readConfiguration(const Dictionary& arguments, ServiceLog& l
   if (payload == nullptr || !payload->bytes()) {
     return {{}, answer(Status::BadArguments, "the configuration is missing: kKeyPayload must hold its bytes")};
   }
-  if (const std::int64_t type = integerArgument(arguments, radix::kKeyPayloadType); type != configurationPayloadType) {
+  if (const std::int64_t type = integerArgument(arguments, radix::kKeyPayloadType);
+      type != radix::configurationPayloadType) {
     return {{}, answer(Status::BadArguments, "the payload type " + std::to_string(type) + " is not known, only 0 is")};
   }
   const auto bytes = *payload->bytes();

@@ -26,7 +26,7 @@ ExitStatus push(const std::string& path, Tool& tool) {
   return client.perform(radix::kCommandSetBaseConfiguration,
                         {{radix::kKeyAppID, radix::serviceAppId},
                          {radix::kKeyPayload, Value::bytes(*content.bytes)},
-                         {radix::kKeyPayloadType, std::int64_t{0}}},
+                         {radix::kKeyPayloadType, radix::configurationPayloadType}},
                         nullptr, path);
 }
 
