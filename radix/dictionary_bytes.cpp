@@ -29,7 +29,7 @@ class Item final : public PBCodable {
 
 class Items final : public PBCodable {
   PB_MESSAGE(Items)
-  PB_LIST(1, "items", items, Items, item, Item, repeated<message<Item>>);
+  PB_LIST(1, "item", items, Items, item, Item, repeated<message<Item>>);
 };
 
 // clang-format on

@@ -135,14 +135,14 @@ class Source final : public PBCodable {
   PB_OBJECT(1, "origin",  origin,  Origin,  string);
   PB_FIELD (2, "phase",   phase,   Phase,   uint32);  // 0 running, 1 ended, 2 failed
   PB_OBJECT(3, "reason",  reason,  Reason,  string);
-  PB_LIST  (4, "metrics", metrics, Metrics, metric, Metric, repeated<message<SourceMetric>>);
+  PB_LIST  (4, "metric",  metrics, Metrics, metric, Metric, repeated<message<SourceMetric>>);
 };
 
 // What feeds the service: all of it, at the greeting and whenever something of it has changed. Made and read by
 // radix/source_states.h.
 class Sources final : public PBCodable {
   PB_MESSAGE(Sources)
-  PB_LIST (1, "sources", sources, Sources, source, Source, repeated<message<Source>>);
+  PB_LIST (1, "source",  sources, Sources, source, Source, repeated<message<Source>>);
   PB_FIELD(2, "is_cut",  isCut,   IsCut,   boolean);  // more is there than is told
 };
 

@@ -331,9 +331,9 @@ class Reader {
     text += " is no ";
     text += quantity.name;
     text += " (";
-    printNumber(quantity.lowest, text);
+    printNumber(quantity.measurable.lowest, text);
     text += " to ";
-    printNumber(quantity.highest, text);
+    printNumber(quantity.measurable.highest, text);
     if (!quantity.unit.empty()) text += ' ';
     text += quantity.unit;
     text += "), left out";
