@@ -48,7 +48,7 @@ enum class Fact : std::uint8_t {
   Bearers,
   SimFiles,
 };
-constexpr std::size_t factCount = 29;
+constexpr std::size_t factCount = static_cast<std::size_t>(Fact::SimFiles) + 1;
 
 // When each fact was last learnt. A report is due when the revision has moved on.
 class Facts {
