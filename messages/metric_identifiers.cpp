@@ -10,6 +10,30 @@ namespace probeview {
 
 namespace {
 
+// Whether the message has a field of the number by which the metric's identifier is dropped. Two fields share that of
+// the SIM files, as the service has it: they are written, but never read.
+template <std::int64_t metric, typename Message>
+consteval bool hidesAField() {
+  constexpr unsigned number = metric & 0xFFFF;
+  if constexpr (number < fieldNumberLimit && detail::hasField<Message, number>) {
+    const std::string_view key = Message::pbField(FieldNumber<number>{}).name;
+    return metric != K_SIM_FILE_INFO || (key != "Thresh_serving_lowQ" && key != "cr_offset");
+  }
+  return false;
+}
+
+#define OR_HIDES(Class) || hidesAField<metric, Class>()
+template <std::int64_t metric>
+constexpr bool hidesAnyField = false LTE_MESSAGES(OR_HIDES) UMTS_MESSAGES(OR_HIDES) GSM_MESSAGES(OR_HIDES)
+    NAS_MESSAGES(OR_HIDES);
+#undef OR_HIDES
+
+#define METRIC(constant, ...) \
+  static_assert(!hidesAnyField<constant>, "the low 16 bits of " #constant " are the number of a field");
+#define METRIC_WITHOUT_HANDLER METRIC
+#define METRIC_WITHOUT_CLASS METRIC
+#include "messages/metrics.inc"
+
 constexpr MetricIdentifier metrics[] = {
 #define METRIC(constant, identifier, Class, ...) {constant, #constant, &Class::pbDescriptor, true},
 #define METRIC_WITHOUT_HANDLER(constant, ...) {constant, #constant, nullptr, false},

@@ -20,7 +20,7 @@ namespace probeview {
 struct MetricIdentifier {
   std::int64_t id;
   std::string_view name;  // of the constant, such as "K_LTE_RRC_STATE"
-  // What its payload is decoded as; null for the two that are left alone. For K_LTE_RLF there is no class;
+  // What its payload is decoded as; null for those that are left alone. For K_LTE_RLF there is no class;
   // K_LTE_SCELL_MEAS has one, KCellularLteServingCellMeasurement, which nothing uses.
   const MessageDescriptor* message;
   bool isHandled;  // whether the store takes it
