@@ -10,6 +10,7 @@
 #include "messages/metric_utility.h"
 #include "messages/runtime/repeated_scalar.h"
 #include "tests/messages/support.h"
+#include "tests/support/second_opinion.h"
 
 namespace probeview {
 namespace {
@@ -246,16 +247,22 @@ TEST(RepeatedScalar, AnIndexOutOfRangeIsSaidWithIndexAndCount) {
   }
 }
 
-TEST(MetricUtility, KnowsThe31NumbersAndNoOther) {
-  EXPECT_EQ(KBBMetricUtility::rows().size(), 31U);
+TEST(MetricUtility, KnowsTheNumbersOfItsRowsAndNoOther) {
   std::size_t known = 0;
   for (std::uint32_t number = 0; number <= 0x20000; ++number) known += KBBMetricUtility::isMetricId(number) ? 1 : 0;
-  EXPECT_EQ(known, 31U);
+  EXPECT_EQ(known, KBBMetricUtility::rows().size());
   for (const KBBMetricUtility::Row& row : KBBMetricUtility::rows()) {
     EXPECT_TRUE(KBBMetricUtility::isMetricId(row.metricId)) << row.name;
   }
-  EXPECT_EQ(KBBMetricUtility::rows().front().name, "KCellularLteRrcState");
-  EXPECT_EQ(KBBMetricUtility::rows().back().name, "kCellularSimCardFiles");
+}
+
+TEST(MetricUtility, ItsRowsStandInTheirOrderWithTheirOddNames) {
+  const auto& said = secondOpinion().tags;
+  ASSERT_EQ(KBBMetricUtility::rows().size(), said.size());
+  for (std::size_t index = 0; index < said.size(); ++index) {
+    EXPECT_EQ(KBBMetricUtility::rows()[index].metricId, said[index].number);
+    EXPECT_EQ(KBBMetricUtility::rows()[index].name, said[index].name);
+  }
 }
 
 TEST(MetricUtility, SaysThatATagIsOneOfAMetric) {

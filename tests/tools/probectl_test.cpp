@@ -8,7 +8,9 @@
 #include <nlohmann/json.hpp>
 
 #include "messages/metric_identifiers.h"
+#include "messages/registry.h"
 #include "tests/tools/run_probectl.h"
+#include "ui/varnet_view_items.h"
 #include "values/plain_text.h"
 
 namespace probeview {
@@ -93,9 +95,9 @@ TEST(Probectl, MetricsExplainsTheFieldsOfThoseThatAreNamed) {
 }
 
 TEST(Probectl, NamesAreOneALine) {
-  EXPECT_EQ(std::ranges::count(probectl({"names", "metrics"}).output, '\n'), 31);
-  EXPECT_EQ(std::ranges::count(probectl({"names", "classes"}).output, '\n'), 54);
-  EXPECT_EQ(std::ranges::count(probectl({"names", "pages"}).output, '\n'), 42);
+  EXPECT_EQ(std::ranges::count(probectl({"names", "metrics"}).output, '\n'), std::ssize(metricIdentifiers()));
+  EXPECT_EQ(std::ranges::count(probectl({"names", "classes"}).output, '\n'), std::ssize(messageClasses()));
+  EXPECT_EQ(std::ranges::count(probectl({"names", "pages"}).output, '\n'), std::ssize(navigablePageKeys()));
   EXPECT_EQ(probectl({"names", "pets"}).status, 2);
 }
 

@@ -89,7 +89,6 @@ TEST_F(PageFeeds, APageChangesWithExactlyTheMetricsThatItsRuleNames) {
     }
   }
   std::size_t fed = 0;
-  ASSERT_EQ(navigablePageKeys().size(), 42u);
   for (const auto& key : keys()) {
     const auto feed = feedOf(categoryPageRule(key));
     const std::set<std::int64_t> named(feed.begin(), feed.end());
@@ -99,7 +98,7 @@ TEST_F(PageFeeds, APageChangesWithExactlyTheMetricsThatItsRuleNames) {
   }
   // Nothing reports IMSI and IMEISV, two pages of GSM have their cells under other keys, and no handler fills the lists
   // of five pages of LTE.
-  EXPECT_EQ(fed, 42u + 4u - 9u);
+  EXPECT_EQ(fed, keys().size() - 9u);
 }
 
 TEST_F(PageFeeds, EveryMetricThatIsHandledIsKnownByItsDictionary) {
