@@ -9,6 +9,7 @@
 #include <string>
 #include <vector>
 
+#include "messages/runtime/data_reader.h"
 #include "radix/dictionary_bytes.h"
 #include "radix/source_states.h"
 #include "tests/support/frames.h"
@@ -204,6 +205,34 @@ TEST(Frames, UnknownFramesAndFieldsAreIgnored) {
   recorder.said.clear();
   EXPECT_TRUE(decodeFrame(Bytes{0x2A, 0x02, 0x08, 0x07}, recorder));
   EXPECT_EQ(recorder.said, "");
+}
+
+// A frame of a later version. In a metric's message 19 is the number of a metric, and dropped.
+class LaterFrame final : public PBCodable {
+  PB_MESSAGE(LaterFrame)
+  PB_FIELD(1, "first", first, First, uint64);
+  PB_OBJECT(19, "text", text, Text, string);
+  PB_FIELD(63, "last", last, Last, uint64);
+};
+PB_DEFINE(LaterFrame)
+
+TEST(Frames, AFrameMayHaveAFieldOfAnyNumberAlsoOfOneThatMetricsHave) {
+  // Field 19, a text of one byte: 9A 01 01 'x'; field 63: F8 03 07.
+  const Bytes inOrder{0x08, 5, 0x9A, 0x01, 1, 'x', 0xF8, 0x03, 7};
+  const Bytes inAnotherOrder{0xF8, 0x03, 7, 0x9A, 0x01, 1, 'x', 0x08, 5};
+  for (const Bytes& bytes : {inOrder, inAnotherOrder}) {
+    LaterFrame frame;
+    probeview::PBDataReader reader(bytes);
+    EXPECT_TRUE(frame.readFrom(reader));
+    EXPECT_EQ(frame.first(), 5U);
+    EXPECT_EQ(frame.text(), "x");
+    EXPECT_EQ(frame.last(), 7U);
+  }
+  // In a frame that does not know it, it is skipped like all that is unknown, whatever it holds: a ping, 3A 08, with
+  // the bytes FF FF FF in field 19 before its number.
+  Recorder recorder;
+  EXPECT_TRUE(decodeFrame(Bytes{0x3A, 8, 0x9A, 0x01, 3, 0xFF, 0xFF, 0xFF, 0x08, 5}, recorder));
+  EXPECT_EQ(recorder.said, "ping 5");
 }
 
 TEST(Frames, NoBytesAreNoFrame) {
