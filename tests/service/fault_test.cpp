@@ -21,6 +21,7 @@
 #include "tests/service/harness/raw_client.h"
 #include "tests/service/harness/scripted_source.h"
 #include "tests/service/harness/test_service.h"
+#include "tests/support/frames.h"
 
 namespace probeview {
 namespace {

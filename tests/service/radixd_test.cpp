@@ -26,6 +26,7 @@
 #include "tests/service/harness/radixd_process.h"
 #include "tests/service/harness/raw_client.h"
 #include "tests/service/harness/temporary_folder.h"
+#include "tests/support/frames.h"
 
 namespace probeview {
 namespace {

@@ -20,6 +20,7 @@
 #include "radix/status.h"
 #include "tests/service/harness/raw_client.h"
 #include "tests/service/harness/test_service.h"
+#include "tests/support/frames.h"
 
 namespace probeview {
 namespace {

@@ -11,7 +11,6 @@
 
 #include "radix/frames.h"
 #include "radix/link.h"
-#include "tests/support/frames.h"
 
 namespace probeview {
 
