@@ -28,7 +28,7 @@ Bytes ipv6(std::uint16_t network, std::uint64_t host) {
 
 }  // namespace
 
-Bearer Bearers::make(unsigned connection, const std::string& name, AddressType type) {
+Bearer Bearers::make(unsigned connection, const std::string& name, AddressType::Value type) {
   Bearer bearer;
   bearer.connection = connection;
   bearer.accessPoint = firstAccessPoint + connection;
@@ -36,20 +36,20 @@ Bearer Bearers::make(unsigned connection, const std::string& name, AddressType t
   bearer.type = type;
   const auto host = static_cast<std::uint8_t>(random_.integerBetween(2, 200));
   const auto network = static_cast<std::uint16_t>(random_.integerBetween(0x100, 0xFFF));
-  if (type != AddressType::Ipv6) bearer.address = ipv4(192, host);
-  if (type != AddressType::Ipv4) {
+  if (type != AddressType::PDP_TYPE_IPv6) bearer.address = ipv4(192, host);
+  if (type != AddressType::PDP_TYPE_IPv4) {
     const Bytes six = ipv6(network, random_.next() & 0xFDFFFFFFFFFFFFFFU);
     bearer.address.insert(bearer.address.end(), six.begin(), six.end());
   }
-  if (type == AddressType::Ipv6) {
-    bearer.primaryDnsType = bearer.secondaryDnsType = AddressType::Ipv6;
+  if (type == AddressType::PDP_TYPE_IPv6) {
+    bearer.primaryDnsType = bearer.secondaryDnsType = AddressType::PDP_TYPE_IPv6;
     bearer.primaryDns = ipv6(0, 0x35);
     bearer.secondaryDns = ipv6(1, 0x35);
   } else {
     bearer.primaryDns = ipv4(198, 53);
     bearer.secondaryDns = ipv4(198, 54);
-    if (type == AddressType::Ipv4AndIpv6) {
-      bearer.secondaryDnsType = AddressType::Ipv6;
+    if (type == AddressType::PDP_TYPE_IPv4v6) {
+      bearer.secondaryDnsType = AddressType::PDP_TYPE_IPv6;
       bearer.secondaryDns = ipv6(0, 0x35);
     }
   }
@@ -74,13 +74,13 @@ void Bearers::advance(Milliseconds now, unsigned attaches, bool packetService, b
     changed = true;
   }
   if (packetService && attaches_ > 0 && !has(internetName)) {
-    active_.insert(active_.begin(), make(1, internetName, AddressType::Ipv4AndIpv6));
+    active_.insert(active_.begin(), make(1, internetName, AddressType::PDP_TYPE_IPv4v6));
     changed = true;
   }
   const bool wantsIms = packetService && voiceOverIms;
   if (wantsIms != has(imsName)) {
     if (wantsIms) {
-      active_.push_back(make(2, imsName, AddressType::Ipv6));
+      active_.push_back(make(2, imsName, AddressType::PDP_TYPE_IPv6));
     } else {
       drop(imsName);
     }
@@ -94,7 +94,7 @@ void Bearers::advance(Milliseconds now, unsigned attaches, bool packetService, b
       extraAt_ = now + stepTime * random_.integerBetween(1000, 4000);
     } else {
       extraIsMessages_ = random_.chance(0.5);
-      active_.push_back(make(3, extraIsMessages_ ? messagesName : positioningName, AddressType::Ipv4));
+      active_.push_back(make(3, extraIsMessages_ ? messagesName : positioningName, AddressType::PDP_TYPE_IPv4));
       extraOn_ = true;
       extraAt_ = now + stepTime * random_.integerBetween(200, 800);
     }

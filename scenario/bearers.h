@@ -5,24 +5,24 @@
 #include <string>
 #include <vector>
 
+#include "messages/nas_messages.h"
 #include "scenario/facts.h"
 #include "scenario/random.h"
 
 namespace probeview::scenario {
 
-// The numbers are those of the metric service; the types of packet data connections of EPS.
-enum class AddressType : std::int32_t { Ipv4 = 0, Ipv6 = 1, Ipv4AndIpv6 = 2 };
+using AddressType = BearerContext::PdpType;
 
 // One packet data connection. Addresses are of the blocks set aside for documentation (RFC 5737, RFC 3849).
 struct Bearer {
   unsigned connection = 0;   // the number by which the phone's applications know it
   unsigned accessPoint = 0;  // NSAPI, or EPS bearer identity: 5 to 15
   std::string name;          // of the access point
-  AddressType type = AddressType::Ipv4;
+  AddressType::Value type = AddressType::PDP_TYPE_IPv4;
   std::vector<std::uint8_t> address;  // 4, 16 or 20 bytes
-  AddressType primaryDnsType = AddressType::Ipv4;
+  AddressType::Value primaryDnsType = AddressType::PDP_TYPE_IPv4;
   std::vector<std::uint8_t> primaryDns;
-  AddressType secondaryDnsType = AddressType::Ipv4;
+  AddressType::Value secondaryDnsType = AddressType::PDP_TYPE_IPv4;
   std::vector<std::uint8_t> secondaryDns;
   bool keepsAddress = false;  // when the technology changes
 };
@@ -39,7 +39,7 @@ class Bearers {
   void advance(Milliseconds now, unsigned attaches, bool packetService, bool voiceOverIms, Facts& facts);
 
  private:
-  Bearer make(unsigned connection, const std::string& name, AddressType type);
+  Bearer make(unsigned connection, const std::string& name, AddressType::Value type);
   bool has(const std::string& name) const;
   void drop(const std::string& name);
 

@@ -50,7 +50,4 @@ inline std::int32_t wholeDecibels(double value) {
   return static_cast<std::int32_t>(value < 0 ? value - 0.5 : value + 0.5);
 }
 
-// The radio band's number in the metric service's enumeration of bands.
-std::int32_t bandCode(const Carrier& carrier);
-
 }  // namespace probeview::scenario

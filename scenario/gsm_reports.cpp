@@ -11,6 +11,13 @@ namespace {
 // System information counts some differences in steps.
 constexpr std::uint32_t gsmDecibelsPerStep = 2;
 
+using Band = KCellularWcdmaCellInfo::WcdmaBand;
+
+// Of the two bands in which the made-up networks have GSM.
+Band::Value gsmBandOf(const Carrier& carrier) {
+  return carrier.band == 1800 ? Band::SYS_BAND_GSM_DCS_1800 : Band::SYS_BAND_GSM_PGSM_900;
+}
+
 // The power control level of the largest power in the band (3GPP TS 45.005, 4.1.1).
 std::uint32_t largestPowerLevel(const Carrier& carrier) { return carrier.band == 1800 ? 0 : 5; }
 
@@ -29,7 +36,7 @@ void report(const Phone& phone, KCellularGsmScellInfo& message) {
   message.setMnc(networkCode);
   message.setLac(cell.areaCode);
   message.setCellId(cell.identity);
-  message.setGsmBand(bandCode(carrier));
+  message.setGsmBand(gsmBandOf(carrier));
   message.setArfcn(carrier.channel);
   message.setBsic(cell.physicalIdentity);
   message.setState(phone.gsm().connection == GsmConnection::Dedicated
@@ -52,7 +59,7 @@ void report(const Phone& phone, KCellularGsmIdleConfig& message) {
   message.setDtxFromBs(1);         // the phone shall use discontinuous transmission
   message.setRadioLinkTimeout(4);  // 20 SACCH blocks
   message.setMultibRep(2);         // neighbours of the other band to report
-  message.setGsmBand(static_cast<std::uint32_t>(bandCode(carrier)));
+  message.setGsmBand(static_cast<std::uint32_t>(gsmBandOf(carrier)));
   message.setMsTxpwr(largestPowerLevel(carrier));
   message.setRxAccMin(quantities::gsmRxLev.toUnsigned(GsmSelection::rxLevAccessMin));
   message.setCbq(0);
@@ -90,7 +97,7 @@ void report(const Phone& phone, KCellularGsmCsRfMeasurement& message) {
   for (const int power : gsm.transmitPowers) message.addCsTxPwr(power);
   message.setCsRxlevSub(quantities::gsmRxLev.toUnsigned(gsm.dedicatedRxLev));
   message.setCsRxqualSub(gsm.rxQual);
-  message.setScellBand(static_cast<std::uint32_t>(bandCode(carrier)));
+  message.setScellBand(static_cast<std::uint32_t>(gsmBandOf(carrier)));
 }
 
 void report(const Phone& phone, KCellularGsmGrrEventMeasCr& message) {

@@ -15,7 +15,7 @@ void LteModem::aggregate(const Circumstances& c) {
   bool changed = false;
   if (c.demand.download) {
     if (downloadSince_ < 0) downloadSince_ = c.now;
-    const bool configured = !secondaries.empty() && secondaries.front().state != SecondaryState::Deconfigured;
+    const bool configured = !secondaries.empty() && secondaries.front().state != SecondaryState::SCC_STATE_DECONFIGURED;
     if (!configured) {
       changed = !secondaries.empty();
       secondaries.clear();
@@ -26,24 +26,24 @@ void LteModem::aggregate(const Circumstances& c) {
           continue;
         }
         if (secondaries.size() == mostSecondaries) break;
-        secondaries.push_back({cell, static_cast<std::uint32_t>(secondaries.size()) + 1, SecondaryState::Deactivated,
-                               c.surroundings.strength(cell), c.surroundings.quality(cell),
-                               c.surroundings.interferenceRatio(cell),
+        secondaries.push_back({cell, static_cast<std::uint32_t>(secondaries.size()) + 1,
+                               SecondaryState::SCC_STATE_CONFIGURED_DEACTIVATED, c.surroundings.strength(cell),
+                               c.surroundings.quality(cell), c.surroundings.interferenceRatio(cell),
                                std::min(c.surroundings.carrierPower(cell), 0.0)});
         changed = true;
       }
       if (changed) c.facts.learn(Fact::LteComponentCarriers, c.now);
     } else if (c.now - downloadSince_ >= measurementPeriod) {
       for (SecondaryCarrier& carrier : secondaries) {
-        changed |= carrier.state != SecondaryState::Activated;
-        carrier.state = SecondaryState::Activated;
+        changed |= carrier.state != SecondaryState::SCC_STATE_ACTIVATED;
+        carrier.state = SecondaryState::SCC_STATE_ACTIVATED;
       }
     }
   } else {
     downloadSince_ = -1;
     for (SecondaryCarrier& carrier : secondaries) {
-      if (carrier.state != SecondaryState::Activated) continue;
-      carrier.state = SecondaryState::Deactivated;
+      if (carrier.state != SecondaryState::SCC_STATE_ACTIVATED) continue;
+      carrier.state = SecondaryState::SCC_STATE_CONFIGURED_DEACTIVATED;
       changed = true;
     }
   }
@@ -53,8 +53,8 @@ void LteModem::aggregate(const Circumstances& c) {
 void LteModem::endAggregation(const Circumstances& c) {
   bool changed = false;
   for (SecondaryCarrier& carrier : state_.secondaries) {
-    changed |= carrier.state != SecondaryState::Deconfigured;
-    carrier.state = SecondaryState::Deconfigured;
+    changed |= carrier.state != SecondaryState::SCC_STATE_DECONFIGURED;
+    carrier.state = SecondaryState::SCC_STATE_DECONFIGURED;
   }
   downloadSince_ = -1;
   if (!changed) return;

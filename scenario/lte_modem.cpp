@@ -9,8 +9,6 @@
 namespace probeview::scenario {
 namespace {
 
-constexpr Milliseconds inactivity = 5000;         // the network releases a connection without data after this
-constexpr Milliseconds handoverPreparation = 80;  // from the measurement report to the new cell
 constexpr std::size_t mostSamples = 10;
 constexpr std::size_t fewestSamples = 5;                  // that are worth a report, just after a change of the cell
 constexpr double largestPower = 23, smallestPower = -40;  // 3GPP TS 36.101, 6.2.2 and 6.3.2
@@ -19,7 +17,7 @@ double bounded(double power) { return std::clamp(power, smallestPower, largestPo
 
 }  // namespace
 
-void LteModem::change(LteConnection to, LteCause cause, const Circumstances& c) {
+void LteModem::change(LteConnection::Value to, LteCause::Value cause, const Circumstances& c) {
   state_.previous = state_.connection;
   state_.previousDuration = c.now - state_.since;
   state_.connection = to;
@@ -56,18 +54,18 @@ void LteModem::enter(CellIndex cell, Manner manner, const Circumstances& c) {
   samples_.clear();
   forgetDeconfigured(c);
   if (manner == Manner::Handover) {
-    change(LteConnection::AttemptingInboundMobility, LteCause::NotApplicable, c);
+    change(LteConnection::KLTE_RRC_STATE_ATMPT_INBND_MOBILITY, LteCause::KLTE_RRC_CAUSE_NA, c);
     deadline_ = c.now + 120;
   } else {
-    change(LteConnection::Idle, LteCause::NotApplicable, c);
+    change(LteConnection::KLTE_RRC_STATE_IDLE, LteCause::KLTE_RRC_CAUSE_NA, c);
     backOff_ = 0;
   }
   serve(cell, c);
 }
 
-void LteModem::leave(LteCause cause, const Circumstances& c) {
+void LteModem::leave(LteCause::Value cause, const Circumstances& c) {
   endAggregation(c);
-  change(LteConnection::Null, cause, c);
+  change(LteConnection::KLTE_RRC_STATE_NULL, cause, c);
   reestablishing_ = false;
   executing_.reset();
   leaving_.reset();
@@ -87,7 +85,7 @@ void LteModem::measure(const Circumstances& c) {
   c.facts.learn(Fact::LteNeighbours, c.now);
   c.facts.learn(Fact::LteInterRatNeighbours, c.now);
   for (SecondaryCarrier& carrier : state_.secondaries) {
-    if (carrier.state == SecondaryState::Deconfigured) continue;
+    if (carrier.state == SecondaryState::SCC_STATE_DECONFIGURED) continue;
     carrier.rsrp = c.surroundings.strength(carrier.cell);
     carrier.rsrq = c.surroundings.quality(carrier.cell);
     carrier.sinr = c.surroundings.interferenceRatio(carrier.cell);
@@ -143,11 +141,11 @@ std::optional<Departure> LteModem::advance(const Circumstances& c) {
     return std::exchange(leaving_, std::nullopt);
   }
   switch (state_.connection) {
-    case LteConnection::Null:
+    case LteConnection::KLTE_RRC_STATE_NULL:
       return std::nullopt;
-    case LteConnection::Idle:
+    case LteConnection::KLTE_RRC_STATE_IDLE:
       return advanceIdle(c);
-    case LteConnection::AttemptingConnection:
+    case LteConnection::KLTE_RRC_STATE_ATMPT_CONNECTION:
       if (reestablishing_) {
         advanceReestablishment(c);
       } else if (c.now >= deadline_) {
@@ -155,27 +153,27 @@ std::optional<Departure> LteModem::advance(const Circumstances& c) {
         if (state_.sinr > -8 && (c.random.chance(0.98) || c.firstSearch)) {
           becomeConnected(state_.cause, c);
         } else {
-          change(LteConnection::Idle, LteCause::EstablishNoResponse, c);
+          change(LteConnection::KLTE_RRC_STATE_IDLE, LteCause::KLTE_RRC_CAUSE_EST_FAIL_NO_RESP_FROM_CELL, c);
           backOff_ = c.now + 1000;
         }
       }
       return std::nullopt;
-    case LteConnection::Connected:
+    case LteConnection::KLTE_RRC_STATE_CONNECTED:
       return advanceConnected(c);
-    case LteConnection::Ending:
-      if (c.now >= deadline_) change(LteConnection::Idle, state_.cause, c);
+    case LteConnection::KLTE_RRC_STATE_ENDING:
+      if (c.now >= deadline_) change(LteConnection::KLTE_RRC_STATE_IDLE, state_.cause, c);
       return std::nullopt;
-    case LteConnection::AttemptingOutboundMobility:
+    case LteConnection::KLTE_RRC_STATE_ATMPT_OUTBND_MOBILITY:
       return std::nullopt;
-    case LteConnection::AttemptingInboundMobility:
-      if (c.now >= deadline_) becomeConnected(LteCause::EstablishMobilityToEutran, c);
+    case LteConnection::KLTE_RRC_STATE_ATMPT_INBND_MOBILITY:
+      if (c.now >= deadline_) becomeConnected(LteCause::KLTE_RRC_CAUSE_EST_SUCC_MOB_TO_EUTRAN, c);
       return std::nullopt;
   }
   return std::nullopt;
 }
 
-void LteModem::becomeConnected(LteCause cause, const Circumstances& c) {
-  change(LteConnection::Connected, cause, c);
+void LteModem::becomeConnected(LteCause::Value cause, const Circumstances& c) {
+  change(LteConnection::KLTE_RRC_STATE_CONNECTED, cause, c);
   lastActivity_ = c.now;
   downloadSince_ = -1;
   outOfSync_ = 0;
@@ -254,140 +252,12 @@ std::optional<Departure> LteModem::advanceIdle(const Circumstances& c) {
   }
   if (!c.demand.any() || c.now < backOff_ || state_.rsrp <= LteSelection::qRxLevMin) return std::nullopt;
   if (c.forbidden.knownForbidden(*state_.serving)) return std::nullopt;
-  const LteCause cause = c.demand.registering        ? LteCause::EstablishSignalling
-                         : c.demand.mobileTerminated ? LteCause::EstablishMobileTerminated
-                                                     : LteCause::EstablishData;
-  change(LteConnection::AttemptingConnection, cause, c);
+  const LteCause::Value cause = c.demand.registering        ? LteCause::KLTE_RRC_CAUSE_EST_MO_SIGNAL
+                                : c.demand.mobileTerminated ? LteCause::KLTE_RRC_CAUSE_EST_MT_ACC
+                                                            : LteCause::KLTE_RRC_CAUSE_EST_MO_DATA;
+  change(LteConnection::KLTE_RRC_STATE_ATMPT_CONNECTION, cause, c);
   deadline_ = c.now + stepTime * c.random.integerBetween(2, 4);
   return std::nullopt;
-}
-
-// Event A3 towards cells of the same carrier and, with a larger offset, of others; A5 towards other carriers.
-std::optional<CellIndex> LteModem::handoverCandidate(const Circumstances& c) const {
-  const CellIndex serving = *state_.serving;
-  const CarrierIndex carrier = network_.cells[serving].carrier;
-  for (const CellIndex cell : c.surroundings.heard(Technology::Lte)) {
-    // The network hands nobody over to where he may not be (3GPP TS 36.413, handover restriction list).
-    if (cell == serving || network_.cells[cell].areaCode == network_.forbiddenAreaCode) continue;
-    const double strength = c.surroundings.strength(cell);
-    if (network_.cells[cell].carrier == carrier) {
-      if (strength - LteMobility::hysteresis > state_.rsrp + LteMobility::a3Offset) return cell;
-    } else if (state_.rsrp + LteMobility::hysteresis < LteMobility::a5Serving &&
-               strength - LteMobility::hysteresis > LteMobility::a5Candidate) {
-      return cell;
-    }
-  }
-  return std::nullopt;
-}
-
-std::optional<CellIndex> LteModem::outboundCandidate(const Circumstances& c) const {
-  if (state_.rsrp + LteMobility::hysteresis >= LteMobility::b2Serving) return std::nullopt;
-  if (const auto cell = strongestAllowed(c, Technology::Umts, LteMobility::b2Umts)) return cell;
-  return strongestAllowed(c, Technology::Gsm, LteMobility::b2Gsm);
-}
-
-std::optional<Departure> LteModem::advanceConnected(const Circumstances& c) {
-  if (executing_) {
-    if (c.now < executesAt_) return std::nullopt;
-    const CellIndex target = *executing_;
-    executing_.reset();
-    // The target has to answer the random access before T304 runs out.
-    if (c.surroundings.interferenceRatio(target) < -9) {
-      beginReestablishment(LteCause::ReestablishHandoverFailure, c);
-      return std::nullopt;
-    }
-    serve(target, c);
-    c.facts.learn(Fact::LteDrx, c.now);  // the new cell configures it anew
-    return std::nullopt;
-  }
-  if (c.demand.any()) lastActivity_ = c.now;
-  if (c.measured) {
-    control(c);
-    superviseLink(c);
-    if (reestablishing_) return std::nullopt;
-    if (!c.demand.signalling && c.now - lastActivity_ >= inactivity) {
-      endAggregation(c);
-      c.facts.end(Fact::LteTransmitPower);
-      change(LteConnection::Ending, c.random.chance(0.04) ? LteCause::ReleaseLoadBalancing : LteCause::ReleaseOther, c);
-      deadline_ = c.now + stepTime;
-      return std::nullopt;
-    }
-    // 3GPP TS 23.272: without voice over IMS a call is made on UMTS or GSM.
-    if (c.demand.voice && !c.voiceOverIms) {
-      std::optional<CellIndex> target = strongestAllowed(c, Technology::Umts, UmtsSelection::qRxLevMin + 6);
-      if (!target) target = strongestAllowed(c, Technology::Gsm, GsmSelection::rxLevAccessMin + 6);
-      if (target) {
-        leaving_ = Departure{*target, Manner::FallbackForVoice};
-        executesAt_ = c.now + handoverPreparation;
-        return std::nullopt;
-      }
-    }
-    if (const auto target = handoverCandidate(c); handover_.holds(target, c.now, LteMobility::timeToTrigger)) {
-      endAggregation(c);  // by the very command, while the primary cell is still the old one
-      executing_ = target;
-      executesAt_ = c.now + handoverPreparation;
-      return std::nullopt;
-    }
-    if (const auto target = outboundCandidate(c);
-        c.mayLeave && outbound_.holds(target, c.now, LteMobility::timeToTrigger)) {
-      // A call is handed over (3GPP TS 23.216); data is redirected, which is easier on the network.
-      const bool handover = c.demand.voice;
-      leaving_ = Departure{*target, handover ? Manner::Handover : Manner::Redirection};
-      executesAt_ = c.now + (handover ? 160 : handoverPreparation);
-      if (handover) {
-        endAggregation(c);
-        change(LteConnection::AttemptingOutboundMobility, LteCause::NotApplicable, c);
-      }
-      return std::nullopt;
-    }
-    aggregate(c);
-  }
-  return std::nullopt;
-}
-
-void LteModem::superviseLink(const Circumstances& c) {
-  if (t310Ends_ >= 0) {
-    if (state_.sinr > LteSupervision::inSync) {
-      t310Ends_ = -1;
-      outOfSync_ = 0;
-    } else if (c.now >= t310Ends_) {
-      beginReestablishment(LteCause::ReestablishT310Expired, c);
-    }
-    return;
-  }
-  outOfSync_ = state_.sinr < LteSupervision::outOfSync ? outOfSync_ + 1 : 0;
-  if (outOfSync_ >= LteSupervision::n310) t310Ends_ = c.now + LteSupervision::t310;
-}
-
-void LteModem::beginReestablishment(LteCause cause, const Circumstances& c) {
-  endAggregation(c);
-  change(LteConnection::AttemptingConnection, cause, c);
-  c.facts.end(Fact::LteTransmitPower);
-  reestablishing_ = true;
-  t310Ends_ = -1;
-  deadline_ = c.now + LteSupervision::t311;
-}
-
-// 3GPP TS 36.331, 5.3.7: the phone looks for any suitable cell and asks it to go on.
-void LteModem::advanceReestablishment(const Circumstances& c) {
-  if (c.measured && c.now - state_.since >= 160) {
-    const std::optional<CellIndex> found = strongestAllowed(c, Technology::Lte, LteSelection::qRxLevMin);
-    if (found && c.surroundings.interferenceRatio(*found) > LteSupervision::inSync) {
-      if (*found != state_.serving) serve(*found, c);
-      if (c.random.chance(0.9)) {
-        becomeConnected(state_.cause, c);
-      } else {
-        reestablishing_ = false;
-        change(LteConnection::Idle, LteCause::ReleaseReestablishmentRejected, c);
-      }
-      return;
-    }
-  }
-  if (c.now < deadline_) return;
-  reestablishing_ = false;
-  change(LteConnection::Idle, LteCause::ReleaseT311Expired, c);
-  // The search has been made already; the next look decides where to go.
-  cellFailingSince_ = c.now - 1200;
 }
 
 }  // namespace probeview::scenario

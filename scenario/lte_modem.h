@@ -7,45 +7,19 @@
 #include <string>
 #include <vector>
 
+#include "messages/lte_messages.h"
 #include "scenario/modem.h"
 
 namespace probeview::scenario {
 
-// The numbers are those of the metric service.
-enum class LteConnection : std::int32_t {
-  Null = 0,
-  Idle = 1,
-  AttemptingConnection = 2,
-  Connected = 3,
-  Ending = 4,
-  AttemptingOutboundMobility = 5,
-  AttemptingInboundMobility = 6,
-};
-
-enum class LteCause : std::int32_t {
-  EstablishMobileTerminated = 2,
-  EstablishSignalling = 3,
-  EstablishData = 4,
-  ReestablishHandoverFailure = 7,
-  ReleaseT311Expired = 11,
-  ReleaseReestablishmentRejected = 13,
-  ReleaseLoadBalancing = 14,
-  ReleaseOther = 15,
-  ReleaseMobilityFromEutran = 20,
-  EstablishMobilityToEutran = 21,
-  EstablishNoResponse = 22,
-  ReestablishT310Expired = 27,
-  NoService = 254,
-  NotApplicable = 255,
-};
-
-// The numbers are those of the metric service.
-enum class SecondaryState : std::int32_t { Deconfigured = 0, Deactivated = 1, Activated = 2 };
+using LteConnection = KCellularLteRrcState::State;
+using LteCause = KCellularLteRrcState::Cause;
+using SecondaryState = SecondaryComponentCarrier::State;
 
 struct SecondaryCarrier {
   CellIndex cell = 0;
   std::uint32_t index = 1;  // from 1; stays as long as the carrier is there, whatever becomes of the others
-  SecondaryState state = SecondaryState::Deactivated;
+  SecondaryState::Value state = SecondaryState::SCC_STATE_CONFIGURED_DEACTIVATED;
   double rsrp = 0, rsrq = 0, sinr = 0, rssi = 0;
 };
 
@@ -65,11 +39,11 @@ struct TransmitPower {
 };
 
 struct LteState {
-  LteConnection connection = LteConnection::Null;
-  std::optional<LteConnection> previous;  // none before the first change
+  LteConnection::Value connection = LteConnection::KLTE_RRC_STATE_NULL;
+  std::optional<LteConnection::Value> previous;  // none before the first change
   Milliseconds since = 0;
   Milliseconds previousDuration = 0;
-  LteCause cause = LteCause::NotApplicable;
+  LteCause::Value cause = LteCause::KLTE_RRC_CAUSE_NA;
   std::optional<CellIndex> serving;  // the cell that serves, or the last one that did
   double rsrp = 0, rsrq = 0, sinr = 0;
   NeighbourLists neighbours;
@@ -81,8 +55,8 @@ struct LteState {
   // C-DRX is configured with the connection and ends with it, also when the phone leaves, looks for a cell in which to
   // go on or is on its way to another technology (3GPP TS 36.331, 5.3.7.2, 5.3.12 and 5.4.3).
   bool drxConfigured() const { return connected(); }
-  bool connected() const { return connection == LteConnection::Connected; }
-  bool camped() const { return connection != LteConnection::Null; }
+  bool connected() const { return connection == LteConnection::KLTE_RRC_STATE_CONNECTED; }
+  bool camped() const { return connection != LteConnection::KLTE_RRC_STATE_NULL; }
 };
 
 // The phone in E-UTRA: idle mode, connections, handover, carrier aggregation, radio link failure.
@@ -95,14 +69,14 @@ class LteModem {
   // Camps on a cell, or arrives in it with a connection.
   void enter(CellIndex cell, Manner manner, const Circumstances& c);
   // The phone has gone to another technology.
-  void leave(LteCause cause, const Circumstances& c);
+  void leave(LteCause::Value cause, const Circumstances& c);
   // Goes one step on. A departure is the wish to be elsewhere; the phone then calls leave() here and enter() there.
   std::optional<Departure> advance(const Circumstances& c);
   // Whether the cell that served is gone and no other of this technology has been found.
   bool lost() const { return lost_; }
 
  private:
-  void change(LteConnection to, LteCause cause, const Circumstances& c);
+  void change(LteConnection::Value to, LteCause::Value cause, const Circumstances& c);
   void serve(CellIndex cell, const Circumstances& c);
   void measure(const Circumstances& c);
   void sample(const Circumstances& c);
@@ -113,12 +87,12 @@ class LteModem {
   std::optional<CellIndex> handoverCandidate(const Circumstances& c) const;
   std::optional<CellIndex> outboundCandidate(const Circumstances& c) const;
   void superviseLink(const Circumstances& c);
-  void beginReestablishment(LteCause cause, const Circumstances& c);
+  void beginReestablishment(LteCause::Value cause, const Circumstances& c);
   void advanceReestablishment(const Circumstances& c);
   void aggregate(const Circumstances& c);
   void endAggregation(const Circumstances& c);
   void forgetDeconfigured(const Circumstances& c);
-  void becomeConnected(LteCause cause, const Circumstances& c);
+  void becomeConnected(LteCause::Value cause, const Circumstances& c);
   std::optional<CellIndex> selectionCandidate(const Circumstances& c) const;
 
   const Network& network_;

@@ -32,17 +32,17 @@ void fill(RsrpRsrqSinr& values, const Network& network, const LteSample& sample)
 
 void report(const Phone& phone, KCellularLteRrcState& message) {
   const LteState& lte = phone.lte();
-  message.setState(static_cast<std::int32_t>(lte.connection));
+  message.setState(lte.connection);
   if (lte.previous) {
-    message.setPrevState(static_cast<std::int32_t>(*lte.previous));
+    message.setPrevState(*lte.previous);
     message.setPrevStateDurMs(static_cast<std::uint32_t>(lte.previousDuration));
   }
-  message.setCause(static_cast<std::int32_t>(lte.cause));
+  message.setCause(lte.cause);
 }
 
 void report(const Phone& phone, KCellularLteCdrxConfig& message) {
   const LteState& lte = phone.lte();
-  message.setRrcState(static_cast<std::int32_t>(lte.connection));
+  message.setRrcState(lte.connection);
   message.setCdrxConfigStatus(lte.drxConfigured() ? 1 : 0);
   if (!lte.drxConfigured()) return;
   message.setOnDurationMs(LteDrx::onDuration);
@@ -150,7 +150,7 @@ void report(const Phone& phone, KCellularLteComponentCarrierInfo& message) {
   message.setPccBandwidth(bandwidthIndex(primary));
   unsigned secondary = 0;
   for (const SecondaryCarrier& entry : phone.lte().secondaries) {
-    if (entry.state == SecondaryState::Deconfigured) continue;
+    if (entry.state == SecondaryState::SCC_STATE_DECONFIGURED) continue;
     const Carrier& carrier = network.carrierOf(entry.cell);
     if (secondary == 0) {
       message.setScc0Earfcn(carrier.channel);
@@ -169,13 +169,13 @@ void report(const Phone& phone, KCellularLteCarrierAggregationStatus& message) {
     const Carrier& carrier = network.carrierOf(entry.cell);
     SecondaryComponentCarrier& listed = message.addSccList();
     listed.setIndex(entry.index);
-    listed.setState(static_cast<std::int32_t>(entry.state));
+    listed.setState(entry.state);
     listed.setPci(network.cells[entry.cell].physicalIdentity);
     listed.setDlEarfcn(carrier.channel);
     listed.setDlRfBand(carrier.band);
     listed.setDlBandwidth(bandwidthIndex(carrier));
-    listed.setHasUplink(false);                                 // the phone sends on its primary carrier only
-    if (entry.state == SecondaryState::Deconfigured) continue;  // and is not measured any more
+    listed.setHasUplink(false);                                           // the phone sends on its primary carrier only
+    if (entry.state == SecondaryState::SCC_STATE_DECONFIGURED) continue;  // and is not measured any more
     listed.setRsrp(quantities::lteCarrierRsrp.toSigned(entry.rsrp));
     listed.setRsrq(quantities::lteCarrierRsrq.toSigned(entry.rsrq));
     listed.setSnr(wholeDecibels(entry.sinr));

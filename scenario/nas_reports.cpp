@@ -25,8 +25,8 @@ void report(const Phone& phone, KCellularMmCommonInfo& message) {
 
 void report(const Phone& phone, KCellularMmContext& message) {
   const MobilityContext& context = phone.registration().mobility();
-  message.setRegStatus(static_cast<std::int32_t>(context.service));
-  message.setUpdateStatus(static_cast<std::int32_t>(context.update));
+  message.setRegStatus(context.service);
+  message.setUpdateStatus(context.update);
   if (context.locationArea) {
     auto area = Shared<KCellularLocationAreaId>::make();
     area->setEncodedPlmn(encodedPlmn());
@@ -35,15 +35,15 @@ void report(const Phone& phone, KCellularMmContext& message) {
   }
   if (context.temporaryIdentity) message.setTmsi(*context.temporaryIdentity);
   if (context.periodicSeconds) message.setT3212DurS(*context.periodicSeconds);
-  message.setProcFailureCause(static_cast<std::int32_t>(context.failure));
-  message.setRejectCause(static_cast<std::int32_t>(context.reject));
+  message.setProcFailureCause(context.failure);
+  message.setRejectCause(context.reject);
   message.setIsCombinedProc(context.combined);
 }
 
 void report(const Phone& phone, KCellularGmmContext& message) {
   const GprsContext& context = phone.registration().gprs();
-  message.setRegStatus(static_cast<std::int32_t>(context.service));
-  message.setUpdateStatus(static_cast<std::int32_t>(context.update));
+  message.setRegStatus(context.service);
+  message.setUpdateStatus(context.update);
   if (context.locationArea) {
     auto area = Shared<RoutingAreaId>::make();
     area->setEncodedPlmn(encodedPlmn());
@@ -53,15 +53,15 @@ void report(const Phone& phone, KCellularGmmContext& message) {
   }
   if (context.temporaryIdentity) message.setPTmsi(*context.temporaryIdentity);
   if (context.periodicSeconds) message.setT3312DurS(*context.periodicSeconds);
-  message.setProcFailureCause(static_cast<std::int32_t>(context.failure));
-  message.setRejectCause(static_cast<std::int32_t>(context.reject));
-  message.setRegProc(static_cast<std::int32_t>(context.procedure));
+  message.setProcFailureCause(context.failure);
+  message.setRejectCause(context.reject);
+  message.setRegProc(context.procedure);
 }
 
 void report(const Phone& phone, KCellularEmmContext& message) {
   const EpsContext& context = phone.registration().eps();
-  message.setRegStatus(static_cast<std::int32_t>(context.service));
-  message.setUpdateStatus(static_cast<std::int32_t>(context.update));
+  message.setRegStatus(context.service);
+  message.setUpdateStatus(context.update);
   message.setUeOpMode(KCellularEmmContext::UeOpMode::EPS_UE_OP_MODE_CSPS_MODE_1);
   for (const std::uint32_t area : context.trackingAreas) {
     KCellularTrackingAreaId& listed = message.addTaiList();
@@ -75,8 +75,8 @@ void report(const Phone& phone, KCellularEmmContext& message) {
     guti->setMTmsi(*context.temporaryIdentity);
     message.setGuti(std::move(guti));
   }
-  message.setRejectCause(static_cast<std::int32_t>(context.reject));
-  message.setRegProc(static_cast<std::int32_t>(context.procedure));
+  message.setRejectCause(context.reject);
+  message.setRegProc(context.procedure);
   if (context.periodicSeconds) message.setT3412DurS(*context.periodicSeconds);
   if (!context.temporaryIdentity) return;  // the network says so when it accepts
   message.setIsImsVoiceSupported(context.voiceOverIms);
@@ -90,11 +90,11 @@ void report(const Phone& phone, KCellularActivatedBearerContexts& message) {
     context.setCid(bearer.connection);
     context.setNsapi(bearer.accessPoint);
     context.setApn(bearer.name);
-    context.setPdpType(static_cast<std::int32_t>(bearer.type));
+    context.setPdpType(bearer.type);
     context.setPdpAddr(bearer.address);
-    context.setPrimaryDnsType(static_cast<std::int32_t>(bearer.primaryDnsType));
+    context.setPrimaryDnsType(bearer.primaryDnsType);
     context.setPrimaryDnsAddr(bearer.primaryDns);
-    context.setSecondaryDnsType(static_cast<std::int32_t>(bearer.secondaryDnsType));
+    context.setSecondaryDnsType(bearer.secondaryDnsType);
     context.setSecondaryDnsAddr(bearer.secondaryDns);
     context.setIsAddrIratMobile(bearer.keepsAddress);
   }

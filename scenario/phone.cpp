@@ -81,7 +81,7 @@ Circumstances Phone::circumstances() {
   registration_.addTo(c.demand);
   if (technology_ == Technology::Gsm) {
     // In GSM, packets and packet registration need no connection; only calls and location updates do.
-    const bool located = registration_.mobility().update == LocationUpdate::Updated;
+    const bool located = registration_.mobility().update == MobilityUpdate::STATUS_UPDATED;
     c.demand.signalling = c.demand.signalling && registration_.circuitProcedure();
     c.demand.registering = c.demand.signalling;
     if (firstSearch_) c.mayLeave = located;
@@ -129,9 +129,11 @@ void Phone::leave(Manner manner) {
       umts_.leave(c);
       break;
     case Technology::Lte: {
-      LteCause cause = LteCause::NotApplicable;
-      if (manner == Manner::Handover) cause = LteCause::ReleaseMobilityFromEutran;
-      if (manner == Manner::Redirection || manner == Manner::FallbackForVoice) cause = LteCause::ReleaseOther;
+      LteCause::Value cause = LteCause::KLTE_RRC_CAUSE_NA;
+      if (manner == Manner::Handover) cause = LteCause::KLTE_RRC_CAUSE_REL_SUCC_MOB_FROM_EUTRAN;
+      if (manner == Manner::Redirection || manner == Manner::FallbackForVoice) {
+        cause = LteCause::KLTE_RRC_CAUSE_REL_OTHER;
+      }
       lte_.leave(cause, c);
       break;
     }
@@ -168,7 +170,7 @@ void Phone::loseService() {
       umts_.leave(c);
       break;
     case Technology::Lte:
-      lte_.leave(LteCause::NoService, c);
+      lte_.leave(LteCause::KLTE_RRC_CAUSE_NO_SERVICE, c);
       break;
   }
   technology_.reset();

@@ -4,7 +4,20 @@
 #include <algorithm>
 
 namespace probeview::scenario {
+
+// Why a network refuses: to circuit and GPRS services (3GPP TS 24.008, 10.5.3.6) and to EPS (24.301, 9.9.3.9).
+struct Refusal {
+  Reject::Value cause;
+  EpsReject::Value epsCause;
+  bool final;  // the area stays refused, and the phone does not try again there
+};
+
 namespace {
+
+constexpr Refusal noSuitableCell{Reject::KNAS_MM_REJ_CAUSE_NO_SUITABLE_CELL_IN_LA,
+                                 EpsReject::EMM_CAUSE_NO_SUITABLE_CELLS_IN_TRACKING_AREA, true};
+constexpr Refusal networkFailure{Reject::KNAS_MM_REJ_CAUSE_NW_FAILURE, EpsReject::EMM_CAUSE_NETWORK_FAILURE, false};
+constexpr Refusal congestion{Reject::KNAS_MM_REJ_CAUSE_CONGESTION, EpsReject::EMM_CAUSE_CONGESTION, false};
 
 // Now and then a network is too busy or broken; the phone tries again after T3411, T3311 or T3211.
 constexpr double refusalChance = 0.06;
@@ -42,18 +55,21 @@ void Registration::arrive(CellIndex cell, bool fromElsewhere, Milliseconds now, 
     const Procedure interrupted = procedure_;
     procedure_ = Procedure::None;
     ends_ = -1;
-    gprs_.procedure = GprsProcedure::None;
-    eps_.procedure = EpsProcedure::None;
-    for (Service* service : {&mobility_.service, &gprs_.service, &eps_.service}) {
-      if (*service == Service::RegistrationInProgress) *service = Service::NotRegistered;
+    gprs_.procedure = GprsProcedure::KNAS_MM_REG_PROC_PROC_NONE;
+    eps_.procedure = EpsProcedure::EMM_PROC_NO_PROC;
+    for (Service::Value* service : {&mobility_.service, &gprs_.service, &eps_.service}) {
+      if (*service == Service::KREG_STATUS_REGISTRATION_IN_PROGRESS) *service = Service::KREG_STATUS_AT_NOT_REGISTERED;
     }
     touch(interrupted, now, facts);
   }
   retryAt_ = -1;
   if (!hadService) {
-    if (mobility_.service == Service::None && mobility_.locationArea) mobility_.service = Service::Normal;
-    if (gprs_.service == Service::None && gprs_.temporaryIdentity) gprs_.service = Service::Normal;
-    if (eps_.service == Service::None && eps_.temporaryIdentity) eps_.service = Service::Normal;
+    const auto regain = [](Service::Value& service, bool registered) {
+      if (service == Service::KREG_STATUS_NO_SERVICE && registered) service = Service::KREG_STATUS_NORMAL_SERVICE;
+    };
+    regain(mobility_.service, mobility_.locationArea.has_value());
+    regain(gprs_.service, gprs_.temporaryIdentity.has_value());
+    regain(eps_.service, eps_.temporaryIdentity.has_value());
     facts.learn(Fact::MobilityContext, now);
     facts.learn(Fact::GprsContext, now);
     facts.learn(Fact::EpsContext, now);
@@ -65,9 +81,9 @@ void Registration::loseService(Milliseconds now, Facts& facts) {
   cell_.reset();
   procedure_ = Procedure::None;
   ends_ = retryAt_ = -1;
-  for (Service* service : {&mobility_.service, &gprs_.service, &eps_.service}) *service = Service::None;
-  gprs_.procedure = GprsProcedure::None;
-  eps_.procedure = EpsProcedure::None;
+  mobility_.service = gprs_.service = eps_.service = Service::KREG_STATUS_NO_SERVICE;
+  gprs_.procedure = GprsProcedure::KNAS_MM_REG_PROC_PROC_NONE;
+  eps_.procedure = EpsProcedure::EMM_PROC_NO_PROC;
   facts.learn(Fact::MobilityContext, now);
   facts.learn(Fact::GprsContext, now);
   facts.learn(Fact::EpsContext, now);
@@ -76,22 +92,22 @@ void Registration::loseService(Milliseconds now, Facts& facts) {
 void Registration::requestService(Technology technology, Milliseconds now, Facts& facts) {
   if (procedure_ != Procedure::None) return;
   if (technology == Technology::Lte && eps_.registered()) {
-    eps_.procedure = EpsProcedure::ServiceRequest;
+    eps_.procedure = EpsProcedure::EMM_PROC_SERV_REQ;
     facts.learn(Fact::EpsContext, now);
   }
   if (technology == Technology::Umts && gprs_.temporaryIdentity) {
-    gprs_.procedure = GprsProcedure::ServiceRequest;
+    gprs_.procedure = GprsProcedure::KNAS_MM_REG_PROC_SERVICE_REQ;
     facts.learn(Fact::GprsContext, now);
   }
 }
 
 void Registration::endService(Milliseconds now, Facts& facts) {
-  if (eps_.procedure == EpsProcedure::ServiceRequest) {
-    eps_.procedure = EpsProcedure::None;
+  if (eps_.procedure == EpsProcedure::EMM_PROC_SERV_REQ) {
+    eps_.procedure = EpsProcedure::EMM_PROC_NO_PROC;
     facts.learn(Fact::EpsContext, now);
   }
-  if (gprs_.procedure == GprsProcedure::ServiceRequest) {
-    gprs_.procedure = GprsProcedure::None;
+  if (gprs_.procedure == GprsProcedure::KNAS_MM_REG_PROC_SERVICE_REQ) {
+    gprs_.procedure = GprsProcedure::KNAS_MM_REG_PROC_PROC_NONE;
     facts.learn(Fact::GprsContext, now);
   }
 }
@@ -106,18 +122,19 @@ void Registration::plan(Milliseconds now, Facts& facts) {
   if (network_.technologyOf(*cell_) == Technology::Lte) {
     if (!eps_.temporaryIdentity) {
       begin(Procedure::EpsAttach, now, facts);
-    } else if (fromElsewhere_ || eps_.update != PacketUpdate::Updated || !contains(eps_.trackingAreas, cell.areaCode)) {
+    } else if (fromElsewhere_ || eps_.update != EpsUpdate::EPS_STATUS_UPDATED ||
+               !contains(eps_.trackingAreas, cell.areaCode)) {
       begin(Procedure::TrackingAreaUpdate, now, facts);
     } else if (periodicAt_ >= 0 && now >= periodicAt_) {
       begin(Procedure::PeriodicAreaUpdate, now, facts);
     }
     return;
   }
-  if (mobility_.locationArea != cell.areaCode || mobility_.update != LocationUpdate::Updated) {
+  if (mobility_.locationArea != cell.areaCode || mobility_.update != MobilityUpdate::STATUS_UPDATED) {
     begin(Procedure::LocationUpdate, now, facts);
   } else if (!gprs_.temporaryIdentity) {
     begin(Procedure::GprsAttach, now, facts);
-  } else if (fromElsewhere_ || gprs_.update != PacketUpdate::Updated || gprs_.locationArea != cell.areaCode ||
+  } else if (fromElsewhere_ || gprs_.update != GprsUpdate::GPRS_STATUS_UPDATED || gprs_.locationArea != cell.areaCode ||
              gprs_.routingArea != cell.routingAreaCode) {
     begin(Procedure::RoutingAreaUpdate, now, facts);
   }
@@ -150,25 +167,25 @@ void Registration::begin(Procedure procedure, Milliseconds now, Facts& facts) {
     case Procedure::None:
       return;
     case Procedure::LocationUpdate:
-      mobility_.service = mobility_.locationArea ? mobility_.service : Service::RegistrationInProgress;
+      mobility_.service = mobility_.locationArea ? mobility_.service : Service::KREG_STATUS_REGISTRATION_IN_PROGRESS;
       mobility_.combined = false;
       break;
     case Procedure::GprsAttach:
-      gprs_.service = Service::RegistrationInProgress;
-      gprs_.procedure = GprsProcedure::Attach;
+      gprs_.service = Service::KREG_STATUS_REGISTRATION_IN_PROGRESS;
+      gprs_.procedure = GprsProcedure::KNAS_MM_REG_PROC_ATTACH;
       break;
     case Procedure::RoutingAreaUpdate:
-      gprs_.procedure = GprsProcedure::RoutingAreaUpdate;
+      gprs_.procedure = GprsProcedure::KNAS_MM_REG_PROC_ROUTING_AREA_UPDATE;
       break;
     case Procedure::EpsAttach:
-      eps_.service = Service::RegistrationInProgress;
-      eps_.procedure = EpsProcedure::AttachCombined;
+      eps_.service = Service::KREG_STATUS_REGISTRATION_IN_PROGRESS;
+      eps_.procedure = EpsProcedure::EMM_PROC_ATTACH_COMB;
       break;
     case Procedure::TrackingAreaUpdate:
-      eps_.procedure = EpsProcedure::AreaUpdateCombined;
+      eps_.procedure = EpsProcedure::EMM_PROC_TAU_COMB;
       break;
     case Procedure::PeriodicAreaUpdate:
-      eps_.procedure = EpsProcedure::PeriodicAreaUpdate;
+      eps_.procedure = EpsProcedure::EMM_PROC_PERIODIC_TAU;
       break;
   }
   touch(procedure, now, facts);
@@ -191,9 +208,11 @@ void Registration::advance(Milliseconds now, bool connected, Facts& facts) {
   }
   if (!connected && !packetInGsm) {
     ends_ = -1;  // the connection broke; the procedure waits for the next
-    if (procedure_ == Procedure::LocationUpdate) mobility_.failure = ProcedureFailure::LowerLayers;
+    if (procedure_ == Procedure::LocationUpdate) {
+      mobility_.failure = ProcedureFailure::KNAS_MM_PROC_FAILURE_CAUSE_LOWER_LAYER_FAILURE;
+    }
     if (procedure_ == Procedure::GprsAttach || procedure_ == Procedure::RoutingAreaUpdate) {
-      gprs_.failure = ProcedureFailure::LowerLayers;
+      gprs_.failure = ProcedureFailure::KNAS_MM_PROC_FAILURE_CAUSE_LOWER_LAYER_FAILURE;
     }
     touch(procedure_, now, facts);
     return;
@@ -206,9 +225,9 @@ void Registration::finish(Milliseconds now, Facts& facts) {
   const bool first =
       procedure_ == Procedure::EpsAttach || procedure_ == Procedure::GprsAttach || !mobility_.locationArea;
   if (cell.areaCode == network_.forbiddenAreaCode) {
-    refuse(Reject::NoSuitableCellInLocationArea, now, facts);
+    refuse(noSuitableCell, now, facts);
   } else if (!first && random_.chance(refusalChance)) {
-    refuse(random_.chance(0.5) ? Reject::NetworkFailure : Reject::Congestion, now, facts);
+    refuse(random_.chance(0.5) ? networkFailure : congestion, now, facts);
   } else {
     accept(now, facts);
   }
@@ -224,12 +243,12 @@ void Registration::accept(Milliseconds now, Facts& facts) {
     facts.learn(Fact::MobilityCommon, now);
   }
   const auto updateLocation = [&](bool combined) {
-    mobility_.service = Service::Normal;
-    mobility_.update = LocationUpdate::Updated;
+    mobility_.service = Service::KREG_STATUS_NORMAL_SERVICE;
+    mobility_.update = MobilityUpdate::STATUS_UPDATED;
     mobility_.locationArea = cell.areaCode;
     mobility_.periodicSeconds = periodicLocation;
-    mobility_.failure = ProcedureFailure::None;
-    mobility_.reject = Reject::None;
+    mobility_.failure = ProcedureFailure::KNAS_MM_PROC_FAILURE_CAUSE_NONE;
+    mobility_.reject = Reject::KNAS_MM_REJ_CAUSE_NONE;
     mobility_.combined = combined;
     if (!mobility_.temporaryIdentity || random_.chance(0.5)) mobility_.temporaryIdentity = newTmsi();
     facts.learn(Fact::MobilityContext, now);
@@ -243,14 +262,14 @@ void Registration::accept(Milliseconds now, Facts& facts) {
     case Procedure::GprsAttach:
     case Procedure::RoutingAreaUpdate:
       fromElsewhere_ = false;
-      gprs_.service = Service::Normal;
-      gprs_.update = PacketUpdate::Updated;
+      gprs_.service = Service::KREG_STATUS_NORMAL_SERVICE;
+      gprs_.update = GprsUpdate::GPRS_STATUS_UPDATED;
       gprs_.locationArea = cell.areaCode;
       gprs_.routingArea = cell.routingAreaCode;
       gprs_.periodicSeconds = periodicRouting;
-      gprs_.failure = ProcedureFailure::None;
-      gprs_.reject = Reject::None;
-      gprs_.procedure = GprsProcedure::None;
+      gprs_.failure = ProcedureFailure::KNAS_MM_PROC_FAILURE_CAUSE_NONE;
+      gprs_.reject = Reject::KNAS_MM_REJ_CAUSE_NONE;
+      gprs_.procedure = GprsProcedure::KNAS_MM_REG_PROC_PROC_NONE;
       if (!gprs_.temporaryIdentity || random_.chance(0.5)) gprs_.temporaryIdentity = newPacketTmsi();
       break;
     case Procedure::EpsAttach:
@@ -258,10 +277,10 @@ void Registration::accept(Milliseconds now, Facts& facts) {
     case Procedure::PeriodicAreaUpdate: {
       if (done == Procedure::EpsAttach) ++epsAttaches_;
       fromElsewhere_ = false;
-      eps_.service = Service::Normal;
-      eps_.update = PacketUpdate::Updated;
-      eps_.reject = Reject::None;
-      eps_.procedure = EpsProcedure::None;
+      eps_.service = Service::KREG_STATUS_NORMAL_SERVICE;
+      eps_.update = EpsUpdate::EPS_STATUS_UPDATED;
+      eps_.reject = EpsReject::EMM_CAUSE_NO_CAUSE;
+      eps_.procedure = EpsProcedure::EMM_PROC_NO_PROC;
       eps_.periodicSeconds = periodicTracking;
       periodicAt_ = now + Milliseconds{periodicTracking} * 1000;
       // Two neighbouring areas make a list; within it nothing needs to be said.
@@ -278,8 +297,8 @@ void Registration::accept(Milliseconds now, Facts& facts) {
   touch(done, now, facts);
 }
 
-void Registration::refuse(Reject cause, Milliseconds now, Facts& facts) {
-  const bool final = cause == Reject::NoSuitableCellInLocationArea;
+void Registration::refuse(const Refusal& refusal, Milliseconds now, Facts& facts) {
+  const bool final = refusal.final;
   const Procedure refused = procedure_;
   const std::uint32_t area = network_.cells[*cell_].areaCode;
   procedure_ = Procedure::None;
@@ -289,26 +308,26 @@ void Registration::refuse(Reject cause, Milliseconds now, Facts& facts) {
     case Procedure::None:
       return;
     case Procedure::LocationUpdate:
-      mobility_.service = final ? Service::Limited : Service::RegistrationFailure;
-      mobility_.update = final ? LocationUpdate::RoamingNotAllowed : LocationUpdate::NotUpdated;
-      mobility_.failure = ProcedureFailure::Rejected;
-      mobility_.reject = cause;
+      mobility_.service = final ? Service::KREG_STATUS_LIMITED_SERVICE : Service::KREG_STATUS_REGISTRATION_FAILURE;
+      mobility_.update = final ? MobilityUpdate::STATUS_ROAMING_NOT_ALLOWED : MobilityUpdate::STATUS_NOT_UPDATED;
+      mobility_.failure = ProcedureFailure::KNAS_MM_PROC_FAILURE_CAUSE_REJECTED_BY_NW;
+      mobility_.reject = refusal.cause;
       break;
     case Procedure::GprsAttach:
     case Procedure::RoutingAreaUpdate:
-      gprs_.service = final ? Service::Limited : Service::RegistrationFailure;
-      gprs_.update = final ? PacketUpdate::RoamingNotAllowed : PacketUpdate::NotUpdated;
-      gprs_.failure = ProcedureFailure::Rejected;
-      gprs_.reject = cause;
-      gprs_.procedure = GprsProcedure::None;
+      gprs_.service = final ? Service::KREG_STATUS_LIMITED_SERVICE : Service::KREG_STATUS_REGISTRATION_FAILURE;
+      gprs_.update = final ? GprsUpdate::GPRS_STATUS_ROAMING_NOT_ALLOWED : GprsUpdate::GPRS_STATUS_NOT_UPDATED;
+      gprs_.failure = ProcedureFailure::KNAS_MM_PROC_FAILURE_CAUSE_REJECTED_BY_NW;
+      gprs_.reject = refusal.cause;
+      gprs_.procedure = GprsProcedure::KNAS_MM_REG_PROC_PROC_NONE;
       break;
     case Procedure::EpsAttach:
     case Procedure::TrackingAreaUpdate:
     case Procedure::PeriodicAreaUpdate:
-      eps_.service = final ? Service::Limited : Service::RegistrationFailure;
-      eps_.update = final ? PacketUpdate::RoamingNotAllowed : PacketUpdate::NotUpdated;
-      eps_.reject = cause;
-      eps_.procedure = EpsProcedure::None;
+      eps_.service = final ? Service::KREG_STATUS_LIMITED_SERVICE : Service::KREG_STATUS_REGISTRATION_FAILURE;
+      eps_.update = final ? EpsUpdate::EPS_STATUS_ROAMING_NOT_ALLOWED : EpsUpdate::EPS_STATUS_NOT_UPDATED;
+      eps_.reject = refusal.epsCause;
+      eps_.procedure = EpsProcedure::EMM_PROC_NO_PROC;
       break;
   }
   touch(refused, now, facts);

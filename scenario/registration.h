@@ -8,6 +8,7 @@
 #include <optional>
 #include <vector>
 
+#include "messages/nas_messages.h"
 #include "scenario/facts.h"
 #include "scenario/modem.h"
 #include "scenario/network.h"
@@ -15,69 +16,55 @@
 
 namespace probeview::scenario {
 
-// The numbers of these enumerations are those of the metric service.
-enum class Service : std::int32_t {
-  Normal = 0,
-  RegistrationFailure = 1,
-  Limited = 2,
-  None = 3,
-  NotRegistered = 4,
-  RegistrationInProgress = 11,
-};
-enum class LocationUpdate : std::int32_t { Updated = 1, NotUpdated = 2, RoamingNotAllowed = 3 };
-enum class PacketUpdate : std::int32_t { Updated = 0, NotUpdated = 1, RoamingNotAllowed = 2 };  // GPRS and EPS
-enum class ProcedureFailure : std::int32_t { None = 0, LowerLayers = 1, Rejected = 11 };
-enum class Reject : std::int32_t {
-  None = 0,
-  NoSuitableCellInLocationArea = 15,  // of a tracking area, for EPS
-  NetworkFailure = 17,
-  Congestion = 22,
-};
-enum class GprsProcedure : std::int32_t { Attach = 1, RoutingAreaUpdate = 2, ServiceRequest = 6, None = 10 };
-enum class EpsProcedure : std::int32_t {
-  None = 0,
-  AttachCombined = 2,
-  AreaUpdateCombined = 5,
-  PeriodicAreaUpdate = 6,
-  ServiceRequest = 7,
-};
+// What all three kinds of service have in common has its names from the circuit services.
+using Service = KCellularMmContext::RegStatus;
+using ProcedureFailure = KCellularMmContext::ProcFailureCause;
+using Reject = KCellularMmContext::RejectCause;  // of circuit and GPRS services
+using EpsReject = KCellularEmmContext::RejectCause;
+using MobilityUpdate = KCellularMmContext::UpdateStatus;
+using GprsUpdate = KCellularGmmContext::UpdateStatus;
+using EpsUpdate = KCellularEmmContext::UpdateStatus;
+using GprsProcedure = KCellularGmmContext::RegProc;
+using EpsProcedure = KCellularEmmContext::RegProc;
 
 struct MobilityContext {
-  Service service = Service::NotRegistered;
-  LocationUpdate update = LocationUpdate::NotUpdated;
+  Service::Value service = Service::KREG_STATUS_AT_NOT_REGISTERED;
+  MobilityUpdate::Value update = MobilityUpdate::STATUS_NOT_UPDATED;
   std::optional<std::uint32_t> locationArea;
   std::optional<std::uint32_t> temporaryIdentity;
   std::optional<std::uint32_t> periodicSeconds;  // T3212
-  ProcedureFailure failure = ProcedureFailure::None;
-  Reject reject = Reject::None;
+  ProcedureFailure::Value failure = ProcedureFailure::KNAS_MM_PROC_FAILURE_CAUSE_NONE;
+  Reject::Value reject = Reject::KNAS_MM_REJ_CAUSE_NONE;
   bool combined = false;
 };
 
 struct GprsContext {
-  Service service = Service::NotRegistered;
-  PacketUpdate update = PacketUpdate::NotUpdated;
+  Service::Value service = Service::KREG_STATUS_AT_NOT_REGISTERED;
+  GprsUpdate::Value update = GprsUpdate::GPRS_STATUS_NOT_UPDATED;
   std::optional<std::uint32_t> locationArea;  // with the next, the routing area
   std::uint32_t routingArea = 0;
   std::optional<std::uint32_t> temporaryIdentity;
   std::optional<std::uint32_t> periodicSeconds;  // T3312
-  ProcedureFailure failure = ProcedureFailure::None;
-  Reject reject = Reject::None;
-  GprsProcedure procedure = GprsProcedure::None;
+  ProcedureFailure::Value failure = ProcedureFailure::KNAS_MM_PROC_FAILURE_CAUSE_NONE;
+  Reject::Value reject = Reject::KNAS_MM_REJ_CAUSE_NONE;
+  GprsProcedure::Value procedure = GprsProcedure::KNAS_MM_REG_PROC_PROC_NONE;
 };
 
 struct EpsContext {
-  Service service = Service::NotRegistered;
-  PacketUpdate update = PacketUpdate::NotUpdated;
+  Service::Value service = Service::KREG_STATUS_AT_NOT_REGISTERED;
+  EpsUpdate::Value update = EpsUpdate::EPS_STATUS_NOT_UPDATED;
   std::vector<std::uint32_t> trackingAreas;
   std::uint32_t groupIdentity = 0, groupCode = 0;  // of the mobility management entity
   std::optional<std::uint32_t> temporaryIdentity;  // M-TMSI
-  Reject reject = Reject::None;
-  EpsProcedure procedure = EpsProcedure::None;
+  EpsReject::Value reject = EpsReject::EMM_CAUSE_NO_CAUSE;
+  EpsProcedure::Value procedure = EpsProcedure::EMM_PROC_NO_PROC;
   std::optional<std::uint32_t> periodicSeconds;  // T3412
   bool voiceOverIms = false;
 
-  bool registered() const { return temporaryIdentity.has_value() && service == Service::Normal; }
+  bool registered() const { return temporaryIdentity.has_value() && service == Service::KREG_STATUS_NORMAL_SERVICE; }
 };
+
+struct Refusal;
 
 class Registration final : public ForbiddenAreas {
  public:
@@ -128,7 +115,7 @@ class Registration final : public ForbiddenAreas {
   void begin(Procedure procedure, Milliseconds now, Facts& facts);
   void finish(Milliseconds now, Facts& facts);
   void accept(Milliseconds now, Facts& facts);
-  void refuse(Reject cause, Milliseconds now, Facts& facts);
+  void refuse(const Refusal& refusal, Milliseconds now, Facts& facts);
   void touch(Procedure procedure, Milliseconds now, Facts& facts) const;
   std::uint32_t newTmsi();
   std::uint32_t newPacketTmsi();

@@ -10,9 +10,10 @@
 #include <vector>
 
 #include "scenario/facts.h"
-#include "scenario/phone.h"
 
 namespace probeview::scenario {
+
+class Phone;
 
 // A measurement is news each time that it is made; a state is news when it changes, and stays true in between.
 enum class Nature : std::uint8_t { State, Measurement };

@@ -95,7 +95,7 @@ Bytes location(const MobilityContext& context) {
   appendPlmn(bytes);
   append(bytes, context.locationArea.value_or(0xFFFE), 2);  // the reserved code of no area (3GPP TS 23.003, 4.1)
   append(bytes, unusedByte, 1);
-  append(bytes, context.update == LocationUpdate::Updated ? 0 : 1, 1);
+  append(bytes, context.update == MobilityUpdate::STATUS_UPDATED ? 0 : 1, 1);
   return bytes;
 }
 
@@ -106,7 +106,7 @@ Bytes packetLocation(const GprsContext& context) {
   appendPlmn(bytes);
   append(bytes, context.locationArea.value_or(0xFFFE), 2);
   append(bytes, context.locationArea ? context.routingArea : unusedByte, 1);
-  append(bytes, context.update == PacketUpdate::Updated ? 0 : 1, 1);
+  append(bytes, context.update == GprsUpdate::GPRS_STATUS_UPDATED ? 0 : 1, 1);
   return bytes;
 }
 
@@ -123,7 +123,7 @@ Bytes epsLocation(const EpsContext& context) {
   }
   appendPlmn(bytes);
   append(bytes, context.trackingAreas.empty() ? 0xFFFE : context.trackingAreas.front(), 2);
-  append(bytes, context.update == PacketUpdate::Updated ? 0 : 1, 1);
+  append(bytes, context.update == EpsUpdate::EPS_STATUS_UPDATED ? 0 : 1, 1);
   return bytes;
 }
 

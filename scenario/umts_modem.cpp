@@ -16,7 +16,7 @@ constexpr double outOfSyncEcNo = -20;                     // CPICH Ec/No
 
 }  // namespace
 
-void UmtsModem::change(UmtsConnection to, const Circumstances& c) {
+void UmtsModem::change(UmtsConnection::Value to, const Circumstances& c) {
   state_.connection = to;
   since_ = c.now;
   c.facts.learn(Fact::UmtsConnection, c.now);
@@ -28,11 +28,12 @@ void UmtsModem::change(UmtsConnection to, const Circumstances& c) {
 
 void UmtsModem::configure(const Circumstances& c) {
   std::optional<unsigned> cycle;
-  if (state_.connection == UmtsConnection::Idle) cycle = idleDrxCycle;
-  if (state_.connection == UmtsConnection::UraPch || state_.connection == UmtsConnection::CellPch) {
+  if (state_.connection == UmtsConnection::KWCDMA_RRC_CONN_STATE_IDLE) cycle = idleDrxCycle;
+  if (state_.connection == UmtsConnection::KWCDMA_RRC_CONN_STATE_URA_PCH ||
+      state_.connection == UmtsConnection::KWCDMA_RRC_CONN_STATE_CELL_PCH) {
     cycle = pagingDrxCycle;
   }
-  const bool dualCarrier = state_.connection == UmtsConnection::CellDch && c.demand.download;
+  const bool dualCarrier = state_.connection == UmtsConnection::KWCDMA_RRC_CONN_STATE_CELL_DCH && c.demand.download;
   if (cycle == state_.drxCycle && dualCarrier == state_.dualCarrier) return;
   state_.drxCycle = cycle;
   state_.dualCarrier = dualCarrier;
@@ -58,14 +59,16 @@ void UmtsModem::enter(CellIndex cell, Manner manner, const Circumstances& c) {
   lastActivity_ = c.now;
   backOff_ = 0;
   serve(cell, c);
-  change(manner == Manner::Handover ? UmtsConnection::CellDch : UmtsConnection::Idle, c);
+  change(manner == Manner::Handover ? UmtsConnection::KWCDMA_RRC_CONN_STATE_CELL_DCH
+                                    : UmtsConnection::KWCDMA_RRC_CONN_STATE_IDLE,
+         c);
   if (manner == Manner::Handover) control(c);
   c.facts.learn(Fact::UmtsConfiguration, c.now);
 }
 
 void UmtsModem::leave(const Circumstances& c) {
-  if (state_.connectedMode()) state_.release = UmtsRelease::CellChanged;
-  change(UmtsConnection::Inactive, c);
+  if (state_.connectedMode()) state_.release = UmtsRelease::KRRC_REL_CELL_CHANGED;
+  change(UmtsConnection::KWCDMA_RRC_CONN_STATE_INACTIVE, c);
   for (const Fact fact : {Fact::UmtsServingCell, Fact::UmtsTransmitPower, Fact::UmtsSelection, Fact::UmtsNeighbours,
                           Fact::UmtsConnection, Fact::UmtsConfiguration}) {
     c.facts.leave(fact);
@@ -105,9 +108,9 @@ void UmtsModem::control(const Circumstances& c) {
   c.facts.learn(Fact::UmtsTransmitPower, c.now);
 }
 
-void UmtsModem::release(UmtsRelease cause, const Circumstances& c) {
+void UmtsModem::release(UmtsRelease::Value cause, const Circumstances& c) {
   state_.release = cause;
-  change(UmtsConnection::Releasing, c);
+  change(UmtsConnection::KWCDMA_RRC_CONN_STATE_RELEASE, c);
   deadline_ = c.now + 2 * stepTime;
 }
 
@@ -115,35 +118,38 @@ std::optional<Departure> UmtsModem::advance(const Circumstances& c) {
   if (!state_.camped()) return std::nullopt;
   if (c.measured) measure(c);
   switch (state_.connection) {
-    case UmtsConnection::Inactive:
+    case UmtsConnection::KWCDMA_RRC_CONN_STATE_INVALID:
+    case UmtsConnection::KWCDMA_RRC_CONN_STATE_INACTIVE:
       return std::nullopt;
-    case UmtsConnection::Idle:
+    case UmtsConnection::KWCDMA_RRC_CONN_STATE_IDLE:
       return advanceIdle(c);
-    case UmtsConnection::Establishing:
+    case UmtsConnection::KWCDMA_RRC_CONN_STATE_ESTABLISH:
       if (c.now >= deadline_) {
         if (state_.ecNo > outOfSyncEcNo) {
           const bool dedicated = c.demand.voice || c.demand.download || c.demand.registering;
           lastActivity_ = c.now;
-          change(dedicated ? UmtsConnection::CellDch : UmtsConnection::CellFach, c);
+          change(dedicated ? UmtsConnection::KWCDMA_RRC_CONN_STATE_CELL_DCH
+                           : UmtsConnection::KWCDMA_RRC_CONN_STATE_CELL_FACH,
+                 c);
           control(c);
         } else {
-          state_.release = UmtsRelease::Other;
-          change(UmtsConnection::Idle, c);
+          state_.release = UmtsRelease::KRRC_REL_OTHER_CAUSE;
+          change(UmtsConnection::KWCDMA_RRC_CONN_STATE_IDLE, c);
           backOff_ = c.now + 1000;
         }
       }
       return std::nullopt;
-    case UmtsConnection::UraPch:
-    case UmtsConnection::CellPch:
-    case UmtsConnection::CellFach:
-    case UmtsConnection::CellDch: {
+    case UmtsConnection::KWCDMA_RRC_CONN_STATE_URA_PCH:
+    case UmtsConnection::KWCDMA_RRC_CONN_STATE_CELL_PCH:
+    case UmtsConnection::KWCDMA_RRC_CONN_STATE_CELL_FACH:
+    case UmtsConnection::KWCDMA_RRC_CONN_STATE_CELL_DCH: {
       if (c.demand.any()) lastActivity_ = c.now;
       if (c.measured) {
         if (state_.connected()) control(c);
         outOfSync_ = state_.ecNo < outOfSyncEcNo || state_.rscp < UmtsSelection::qRxLevMin - 3 ? outOfSync_ + 1 : 0;
         if (outOfSync_ >= 5) {
-          state_.release = UmtsRelease::LowerLayerFailureDownlink;
-          change(UmtsConnection::RadioLinkFailure, c);
+          state_.release = UmtsRelease::KRRC_REL_CONN_REL_LOWER_LAYER_FAILURE_DL;
+          change(UmtsConnection::KWCDMA_RRC_CONN_STATE_RADIO_LINK_FAILURE, c);
           deadline_ = c.now + 400;
           return std::nullopt;
         }
@@ -152,12 +158,12 @@ std::optional<Departure> UmtsModem::advance(const Circumstances& c) {
       advanceChannel(c);
       return std::nullopt;
     }
-    case UmtsConnection::SignallingReleaseIndicated:
-      if (c.now >= deadline_) release(UmtsRelease::SignallingConnectionRelease, c);
+    case UmtsConnection::KWCDMA_RRC_CONN_STATE_SCRI_SENT:
+      if (c.now >= deadline_) release(UmtsRelease::KRRC_REL_SIGN_CONN_REL, c);
       return std::nullopt;
-    case UmtsConnection::Releasing:
-    case UmtsConnection::RadioLinkFailure:
-      if (c.now >= deadline_) change(UmtsConnection::Idle, c);
+    case UmtsConnection::KWCDMA_RRC_CONN_STATE_RELEASE:
+    case UmtsConnection::KWCDMA_RRC_CONN_STATE_RADIO_LINK_FAILURE:
+      if (c.now >= deadline_) change(UmtsConnection::KWCDMA_RRC_CONN_STATE_IDLE, c);
       return std::nullopt;
   }
   return std::nullopt;
@@ -208,17 +214,17 @@ std::optional<Departure> UmtsModem::advanceIdle(const Circumstances& c) {
   if (!c.demand.any() || c.now < backOff_ || c.forbidden.knownForbidden(*state_.serving)) return std::nullopt;
   state_.release.reset();
   if (c.demand.voice) {
-    state_.establishment =
-        c.demand.mobileTerminated ? UmtsEstablishment::TerminatingCall : UmtsEstablishment::OriginatingCall;
+    state_.establishment = c.demand.mobileTerminated ? UmtsEstablishment::KRRC_EST_TERM_CONV_CALL
+                                                     : UmtsEstablishment::KRRC_EST_ORIG_CONV_CALL;
   } else if (c.demand.registering) {
-    state_.establishment = UmtsEstablishment::Registration;
+    state_.establishment = UmtsEstablishment::KRRC_EST_REGISTRATION;
   } else if (c.demand.mobileTerminated) {
-    state_.establishment = UmtsEstablishment::TerminatingInteractive;
+    state_.establishment = UmtsEstablishment::KRRC_EST_TERM_INTERACT_CALL;
   } else {
-    state_.establishment =
-        c.demand.download ? UmtsEstablishment::OriginatingInteractive : UmtsEstablishment::OriginatingBackground;
+    state_.establishment = c.demand.download ? UmtsEstablishment::KRRC_EST_ORIG_INTERACT_CALL
+                                             : UmtsEstablishment::KRRC_EST_ORIG_BACKGND_CALL;
   }
-  change(UmtsConnection::Establishing, c);
+  change(UmtsConnection::KWCDMA_RRC_CONN_STATE_ESTABLISH, c);
   deadline_ = c.now + stepTime * c.random.integerBetween(2, 4);
   return std::nullopt;
 }
@@ -229,43 +235,46 @@ void UmtsModem::advanceChannel(const Circumstances& c) {
   const Milliseconds quiet = c.now - lastActivity_;
   const Milliseconds here = c.now - since_;
   switch (state_.connection) {
-    case UmtsConnection::CellDch:
+    case UmtsConnection::KWCDMA_RRC_CONN_STATE_CELL_DCH:
       configure(c);
       // What was only for signalling is released as soon as all has been said.
-      if (state_.establishment == UmtsEstablishment::Registration && !c.demand.any()) {
-        release(UmtsRelease::Normal, c);
+      if (state_.establishment == UmtsEstablishment::KRRC_EST_REGISTRATION && !c.demand.any()) {
+        release(UmtsRelease::KRRC_REL_NORMAL_EVENT, c);
         return;
       }
-      if (quiet >= dedicatedInactivity) change(UmtsConnection::CellFach, c);
+      if (quiet >= dedicatedInactivity) change(UmtsConnection::KWCDMA_RRC_CONN_STATE_CELL_FACH, c);
       return;
-    case UmtsConnection::CellFach:
+    case UmtsConnection::KWCDMA_RRC_CONN_STATE_CELL_FACH:
       if (wide) {
-        change(UmtsConnection::CellDch, c);
+        change(UmtsConnection::KWCDMA_RRC_CONN_STATE_CELL_DCH, c);
       } else if (quiet >= dedicatedInactivity + sharedInactivity) {
-        change(c.random.chance(0.5) ? UmtsConnection::UraPch : UmtsConnection::CellPch, c);
+        change(c.random.chance(0.5) ? UmtsConnection::KWCDMA_RRC_CONN_STATE_URA_PCH
+                                    : UmtsConnection::KWCDMA_RRC_CONN_STATE_CELL_PCH,
+               c);
       }
       return;
-    case UmtsConnection::UraPch:
-    case UmtsConnection::CellPch:
+    case UmtsConnection::KWCDMA_RRC_CONN_STATE_URA_PCH:
+    case UmtsConnection::KWCDMA_RRC_CONN_STATE_CELL_PCH:
       if (c.demand.any()) {
-        change(UmtsConnection::CellFach, c);
+        change(UmtsConnection::KWCDMA_RRC_CONN_STATE_CELL_FACH, c);
         control(c);
       } else if (here >= pagingInactivity) {
         // Either the network has had enough, or the phone says that it has nothing more to send (25.331, 8.1.14).
         if (c.random.chance(0.5)) {
-          release(UmtsRelease::Normal, c);
+          release(UmtsRelease::KRRC_REL_NORMAL_EVENT, c);
         } else {
-          change(UmtsConnection::SignallingReleaseIndicated, c);
+          change(UmtsConnection::KWCDMA_RRC_CONN_STATE_SCRI_SENT, c);
           deadline_ = c.now + 3 * stepTime;
         }
       }
       return;
-    case UmtsConnection::Inactive:
-    case UmtsConnection::Idle:
-    case UmtsConnection::Establishing:
-    case UmtsConnection::Releasing:
-    case UmtsConnection::RadioLinkFailure:
-    case UmtsConnection::SignallingReleaseIndicated:
+    case UmtsConnection::KWCDMA_RRC_CONN_STATE_INVALID:
+    case UmtsConnection::KWCDMA_RRC_CONN_STATE_INACTIVE:
+    case UmtsConnection::KWCDMA_RRC_CONN_STATE_IDLE:
+    case UmtsConnection::KWCDMA_RRC_CONN_STATE_ESTABLISH:
+    case UmtsConnection::KWCDMA_RRC_CONN_STATE_RELEASE:
+    case UmtsConnection::KWCDMA_RRC_CONN_STATE_RADIO_LINK_FAILURE:
+    case UmtsConnection::KWCDMA_RRC_CONN_STATE_SCRI_SENT:
       return;
   }
 }

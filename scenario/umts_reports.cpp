@@ -6,24 +6,22 @@
 #include "scenario/selection.h"
 
 namespace probeview::scenario {
-std::int32_t bandCode(const Carrier& carrier) {
-  using Band = KCellularWcdmaCellInfo::WcdmaBand;
-  switch (carrier.technology) {
-    case Technology::Gsm:
-      return carrier.band == 1800 ? Band::SYS_BAND_GSM_DCS_1800 : Band::SYS_BAND_GSM_PGSM_900;
-    case Technology::Umts:
-      return Band::SYS_BAND_WCDMA_I_IMT_2000 + static_cast<std::int32_t>(carrier.band) - 1;
-    case Technology::Lte:
-      return Band::SYS_BAND_LTE_EUTRAN_BAND1 + static_cast<std::int32_t>(carrier.band) - 1;
-  }
-  return 0;
+namespace {
+
+using Band = KCellularWcdmaCellInfo::WcdmaBand;
+
+// Of the two bands in which the made-up networks have UTRA.
+Band::Value utraBandOf(const Carrier& carrier) {
+  return carrier.band == 8 ? Band::SYS_BAND_WCDMA_VIII_900 : Band::SYS_BAND_WCDMA_I_IMT_2000;
 }
+
+}  // namespace
 
 void report(const Phone& phone, KCellularWcdmaRrcConnectionState& message) {
   const UmtsState& umts = phone.umts();
-  message.setState(static_cast<std::int32_t>(umts.connection));
-  if (umts.establishment) message.setEstablishmentCause(static_cast<std::int32_t>(*umts.establishment));
-  if (umts.release) message.setReleaseCause(static_cast<std::int32_t>(*umts.release));
+  message.setState(umts.connection);
+  if (umts.establishment) message.setEstablishmentCause(*umts.establishment);
+  if (umts.release) message.setReleaseCause(*umts.release);
 }
 
 void report(const Phone& phone, KCellularWcdmaRrcConfiguration& message) {
@@ -41,7 +39,7 @@ void report(const Phone& phone, KCellularWcdmaCellInfo& message) {
   message.setMnc(networkCode);
   message.setLac(cell.areaCode);
   message.setCellId(cell.identity);
-  message.setWcdmaBand(bandCode(carrier));
+  message.setWcdmaBand(utraBandOf(carrier));
   message.setDlUarfcn(carrier.channel);
   message.setPsc(cell.physicalIdentity);
   message.setNumMncDigits(networkCodeDigits);

@@ -125,13 +125,13 @@ TEST(Phone, AddsCarriersForDownloadsAndTakesThemAwayWithTheConnection) {
     phone.advance();
     const LteState& lte = phone.lte();
     for (const SecondaryCarrier& carrier : lte.secondaries) {
-      if (carrier.state == SecondaryState::Deconfigured) continue;
+      if (carrier.state == SecondaryState::SCC_STATE_DECONFIGURED) continue;
       ASSERT_TRUE(phone.technology() == Technology::Lte && lte.connected());
       const Network& network = phone.network();
       EXPECT_EQ(network.cells[carrier.cell].site, network.cells[*lte.serving].site);
       EXPECT_NE(network.cells[carrier.cell].carrier, network.cells[*lte.serving].carrier);
-      activated |= carrier.state == SecondaryState::Activated;
-      deactivated |= carrier.state == SecondaryState::Deactivated;
+      activated |= carrier.state == SecondaryState::SCC_STATE_ACTIVATED;
+      deactivated |= carrier.state == SecondaryState::SCC_STATE_CONFIGURED_DEACTIVATED;
     }
     EXPECT_LE(lte.secondaries.size(), 2U);
   }
@@ -145,8 +145,8 @@ TEST(Phone, LosesItsLinkNowAndThenAndReestablishesIt) {
     Phone phone(cityWorld(seed), seed);
     while (phone.now() < hour) {
       phone.advance();
-      if (phone.lte().cause != LteCause::ReestablishT310Expired) continue;
-      failed |= phone.lte().connection == LteConnection::AttemptingConnection;
+      if (phone.lte().cause != LteCause::KLTE_RRC_CAUSE_REEST_OTHER_FAIL_T310_EXP) continue;
+      failed |= phone.lte().connection == LteConnection::KLTE_RRC_STATE_ATMPT_CONNECTION;
       reestablished |= phone.lte().connected();
     }
   }
@@ -161,10 +161,10 @@ TEST(Phone, LosesServiceInAHighwayTunnelAndFindsItAgain) {
     phone.advance();
     if (phone.technology()) continue;
     without += stepTime;
-    EXPECT_EQ(phone.lte().connection, LteConnection::Null);
+    EXPECT_EQ(phone.lte().connection, LteConnection::KLTE_RRC_STATE_NULL);
     EXPECT_FALSE(phone.umts().camped());
     EXPECT_FALSE(phone.gsm().camped());
-    EXPECT_EQ(phone.registration().eps().service, Service::None);
+    EXPECT_EQ(phone.registration().eps().service, Service::KREG_STATUS_NO_SERVICE);
   }
   EXPECT_GT(without, 5000);
   EXPECT_LT(without, 120000);
