@@ -63,7 +63,7 @@ class KCellularGsmIdleConfig final : public PBCodable {
   PB_FIELD(21, "penalty_t",           penaltyT,          PenaltyT,          uint32, gsmPenaltyTime,            "PENALTY_TIME (31: no time, CELL_RESELECT_OFFSET is taken away)");
   PB_FIELD(22, "t3212",               t3212,             T3212,             uint32, gsmPeriodicUpdate,         "T3212");
   PB_FIELD(23, "acc",                 acc,               Acc,               uint32, none,                      "Access control classes, 16 bits");
-  PB_FIELD(24, "bs_pa_mfrms",         bsPaMfrms,         BsPaMfrms,         uint32, gsmPagingMultiframes,      "BS_PA_MFRMS, between pages");
+  PB_FIELD(24, "bs_pa_mfrms",         bsPaMfrms,         BsPaMfrms,         uint32, gsmPagingMultiframes,      "BS_PA_MFRMS between pages");
   PB_FIELD(25, "cs_pagemode",         csPagemode,        CsPagemode,        uint32, none,                      "Page mode, 0 to 3 (3GPP TS 44.018, 10.5.2.26)");
   PB_FIELD(26, "max_retrans_cs",      maxRetransCs,      MaxRetransCs,      uint32, gsmMaximumRetransmissions, "Max retrans");
   PB_FIELD(27, "emerg_call_allowed",  emergCallAllowed,  EmergCallAllowed,  uint32, none,                      "Whether emergency calls are allowed to all, 0 or 1");

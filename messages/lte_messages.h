@@ -81,7 +81,7 @@ class KCellularLteCdrxConfig final : public PBCodable {
   PB_FIELD( 5, "drx_retx_timer_ms",   drxRetxTimerMs,   DrxRetxTimerMs,   uint32,                                   lteDrxRetransmission, "drx-RetransmissionTimer");
   PB_FIELD( 7, "long_drx_cycle_ms",   longDrxCycleMs,   LongDrxCycleMs,   uint32,                                   lteLongDrxCycle,      "Long DRX cycle");
   PB_FIELD(10, "short_drx_cycle_ms",  shortDrxCycleMs,  ShortDrxCycleMs,  uint32,                                   lteShortDrxCycle,     "Short DRX cycle");
-  PB_FIELD(11, "drx_short_cycle_num", drxShortCycleNum, DrxShortCycleNum, uint32,                                   lteShortDrxCycles,    "drxShortCycleTimer, before the long cycle");
+  PB_FIELD(11, "drx_short_cycle_num", drxShortCycleNum, DrxShortCycleNum, uint32,                                   lteShortDrxCycles,    "drxShortCycleTimer before the long cycle");
   PB_FIELD(12, "rrc_state",           rrcState,         RrcState,         enumeration<KCellularLteRrcState::State>, none,                 "RRC state (3GPP TS 36.331, 4.2.1)");
   PB_FIELD(13, "cdrx_config_status",  cdrxConfigStatus, CdrxConfigStatus, uint32,                                   none,                 "Whether DRX is configured, 0 or 1");
   PB_FIELD(14, "transmission_mode",   transmissionMode, TransmissionMode, uint32,
@@ -143,7 +143,7 @@ class KCellularLteSelReselCellInfo final : public PBCodable {
   PB_FIELD ( 1, "timestamp",                               timestamp,                         Timestamp,                         uint64,
                 timestamp, "Time of the values", viewer::localTime);
   PB_VALUES( 2, "multi_band_info",                         multiBandInfos,                    MultiBandInfos, multiBandInfo, MultiBandInfo, repeated<uint32>,
-                eutraBand, "Further bands to which the cell belongs, numbers of bands", viewer::listTextLogged);
+                eutraBand, "Numbers of the further bands to which the cell belongs", viewer::listTextLogged);
   PB_FIELD ( 3, "ims_emergency_support",                   imsEmergencySupport,               ImsEmergencySupport,               uint32,
                 none, "Whether emergency calls over IMS are supported, 0 or 1");
   PB_FIELD ( 4, "ac_barring_for_emergency",                acBarringForEmergency,             AcBarringForEmergency,             uint32,

@@ -53,7 +53,7 @@ inline constexpr Quantity lteRsrq{.name = "LTE RSRQ", .unit = "dB", .clause = "3
     .decimals = 1, .bands = lteRsrqBands, .bandsSource = androidLte};
 // LTE, samples: whole dBm and dB; the signal to interference and noise ratio in half dB.
 inline constexpr Quantity lteSampleRsrp{.name = "LTE RSRP sample", .unit = "dBm", .clause = "3GPP TS 36.133, 9.1.4",
-    .numbers = {-140, -44}, .measurable = lteRsrp.measurable, .bands = lteRsrpBands, .bandsSource = androidLte};
+    .numbers = lteRsrp.values, .measurable = lteRsrp.measurable, .bands = lteRsrpBands, .bandsSource = androidLte};
 inline constexpr Quantity lteSampleRsrq{.name = "LTE RSRQ sample", .unit = "dB", .clause = "3GPP TS 36.133, 9.1.7",
     .numbers = {-20, -3}, .measurable = lteRsrq.measurable, .bands = lteRsrqBands, .bandsSource = androidLte};
 inline constexpr Quantity lteSampleSinr{.name = "LTE SINR sample", .unit = "dB", .clause = "3GPP TS 36.133, 9.1.17",
@@ -84,7 +84,7 @@ inline constexpr Quantity utraEcNo{.name = "CPICH Ec/No", .unit = "dB", .clause 
 inline constexpr Quantity gsmRxLev{.name = "RXLEV", .unit = "dBm", .clause = "3GPP TS 45.008, 8.1.4",
     .offset = 110, .numbers = {0, 63}, .measurable = {-120, -25}, .bands = gsmLevelBands, .bandsSource = androidGsm};
 inline constexpr Quantity gsmIdleLevel{.name = "idle-mode level", .unit = "dBm", .clause = "3GPP TS 45.008, 6.1",
-    .numbers = {-110, -47}, .measurable = gsmRxLev.measurable, .bands = gsmLevelBands, .bandsSource = androidGsm};
+    .numbers = gsmRxLev.valueRange(), .measurable = gsmRxLev.measurable, .bands = gsmLevelBands, .bandsSource = androidGsm};
 inline constexpr Quantity gsmRxQual{.name = "RXQUAL", .clause = "3GPP TS 45.008, 8.2.4",
     .numbers = {0, 7}, .measurable = {0, 7}};
 

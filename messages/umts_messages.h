@@ -249,7 +249,7 @@ class KCellularWcdmaSelReselCellInfo final : public PBCodable {
   PB_FIELD ( 3, "edch_capable",               edchCapable,            EdchCapable,            uint32,                  none,                "Whether the cell supports E-DCH, 0 or 1");
   PB_FIELD ( 4, "duplex_mode",                duplexMode,             DuplexMode,             enumeration<DuplexMode>, none,                "Duplex mode");
   PB_VALUES( 5, "multi_band_info",            multiBandInfos,         MultiBandInfos, multiBandInfo, MultiBandInfo, repeated<uint32>,
-                utraBand, "Further bands to which the cell belongs, numbers of bands", viewer::listTextLogged);
+                utraBand, "Numbers of the further bands to which the cell belongs", viewer::listTextLogged);
   PB_FIELD ( 6, "ims_emergency_support",      imsEmergencySupport,    ImsEmergencySupport,    uint32,
                 none, "Whether emergency calls over IMS are supported, 0 or 1");
   PB_FIELD ( 7, "cell_barred",                cellBarred,             CellBarred,             uint32,                  none,                "Whether the cell is barred, 0 or 1");

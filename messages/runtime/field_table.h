@@ -71,7 +71,8 @@ constexpr bool isCapitalized(std::string_view property, std::string_view accesso
          property[0] != accessor[0];
 }
 
-// Whether key and property are the same letters. A list's property may be the plural.
+// Whether key and property are the same letters. A list's property may be the plural, of its key and of its element's
+// name.
 constexpr bool isNamedAfter(std::string_view property, std::string_view key, bool isList) {
   std::size_t at = 0;
   for (const char letter : key) {
@@ -224,6 +225,10 @@ consteval MessageDescriptor describeMessage(std::string_view name) {
   static_assert(::probeview::detail::isNamedAfter(#property, key, isList), key " and " #property " differ"); \
   static_assert(::probeview::detail::isCapitalized(#property, #Property), #property " and " #Property " differ");
 
+#define PB_ELEMENT_NAMES(property, single, Single)                                                                 \
+  static_assert(::probeview::detail::isNamedAfter(#property, #single, true), #single " and " #property " differ"); \
+  static_assert(::probeview::detail::isCapitalized(#single, #Single), #single " and " #Single " differ");
+
 #define PB_MEANING(number, ...)                                                                       \
   __VA_OPT__(static constexpr ::probeview::FieldMeaning pbMeaning(::probeview::FieldNumber<number>) { \
     return ::probeview::FieldMeaning(__VA_ARGS__);                                                    \
@@ -280,7 +285,7 @@ consteval MessageDescriptor describeMessage(std::string_view name) {
   std::size_t property##Count() const noexcept { return _##property.count(); }                            \
   type::Handle single##AtIndex(std::size_t index) const { return type::at(_##property, index); }          \
   PB_NAMES(key, property, Property, true)                                                                 \
-  PB_NAMES(key, single, Single, false)                                                                    \
+  PB_ELEMENT_NAMES(property, single, Single)                                                              \
   PB_MEANING(number __VA_OPT__(, ) __VA_ARGS__)                                                           \
   PB_ROW(number, key, property, type)
 
@@ -300,7 +305,7 @@ consteval MessageDescriptor describeMessage(std::string_view name) {
   }                                                                                                     \
   void set##Property(const type::Number* values, std::size_t count) { set##Property({values, count}); } \
   PB_NAMES(key, property, Property, true)                                                               \
-  PB_NAMES(key, single, Single, false)                                                                  \
+  PB_ELEMENT_NAMES(property, single, Single)                                                            \
   PB_MEANING(number __VA_OPT__(, quantities::) __VA_ARGS__)                                             \
   PB_ROW(number, key, property, type)
 

@@ -4,8 +4,9 @@
 #include <algorithm>
 
 #include "messages/metric_identifiers.h"
+#include "messages/registry.h"
 #include "scenario/edges_story.h"
-#include "schema/facts.h"
+#include "schema/field_text.h"
 #include "tests/store/store_fixture.h"
 
 namespace probeview {
@@ -27,13 +28,13 @@ Dictionary shown(const MetricIdentifier& metric, std::string_view dictionaryName
 TEST(PublishedTexts, ATimestampIsShownAsTextWhereTheyAreSaidTo) {
   for (const MetricIdentifier& metric : metricIdentifiers()) {
     if (!metric.isHandled) continue;
-    const MessageFacts* message = factsOfMessage(metric.message->name);
-    const FieldFacts* timestamp = factsOfField(metric.message->name, "timestamp");
-    ASSERT_NE(message, nullptr) << metric.name;
+    const FieldDescriptor* timestamp = metric.message->fieldNamed("timestamp");
     ASSERT_NE(timestamp, nullptr) << metric.name;
-    const Dictionary dictionary = shown(metric, message->dictionary);
+    const Dictionary dictionary = shown(metric, displayDictionaryOf(*metric.message));
     const Value* value = dictionary.find("timestamp");
-    EXPECT_EQ(says(timestamp->viewer, "shown as text"), value != nullptr && value->text().has_value()) << metric.name;
+    EXPECT_EQ(says(viewerText(*metric.message, *timestamp), "shown as text"),
+              value != nullptr && value->text().has_value())
+        << metric.name;
   }
 }
 
@@ -41,7 +42,7 @@ TEST(PublishedTexts, AnEntryOfAListGetsTheTimestampWhereTheySaySo) {
   std::size_t get = 0, stay = 0;
   for (const MetricIdentifier& metric : metricIdentifiers()) {
     if (!metric.isHandled) continue;
-    const Dictionary dictionary = shown(metric, factsOfMessage(metric.message->name)->dictionary);
+    const Dictionary dictionary = shown(metric, displayDictionaryOf(*metric.message));
     for (const FieldDescriptor& field : metric.message->fields()) {
       const Value* value = field.kind == FieldKind::RepeatedMessage ? dictionary.find(field.name) : nullptr;
       if (value == nullptr || value->list() == nullptr) continue;
@@ -49,8 +50,8 @@ TEST(PublishedTexts, AnEntryOfAListGetsTheTimestampWhereTheySaySo) {
       ASSERT_EQ(list.size(), 2U) << metric.name << " " << field.name;
       const bool has = list[0].dictionary()->find("timestamp") != nullptr;
       EXPECT_EQ(list[1].dictionary()->find("timestamp") != nullptr, has);
-      const FieldFacts* facts = factsOfField(metric.message->name, field.name);
-      EXPECT_EQ(says(facts->viewer, "each entry gets the timestamp"), has) << metric.name << " " << field.name;
+      EXPECT_EQ(says(viewerText(*metric.message, field), "each entry gets the timestamp"), has)
+          << metric.name << " " << field.name;
       ++(has ? get : stay);
     }
   }
@@ -61,11 +62,10 @@ TEST(PublishedTexts, AnEntryOfAListGetsTheTimestampWhereTheySaySo) {
 TEST(PublishedTexts, NothingIsMadeOfAMessageThatTheStoreDoesNotTake) {
   // Those that no metric carries to a dictionary, nor are part of one that does.
   std::size_t untaken = 0;
-  for (const MessageFacts& message : allMessageFacts()) {
-    if (!message.dictionary.empty() || message.pages.empty()) continue;
-    for (const FieldFacts& field : allFieldFacts()) {
-      if (field.message != message.message) continue;
-      EXPECT_EQ(field.viewer, "") << field.message << " " << field.field;
+  for (const MessageDescriptor* message : messageClasses()) {
+    if (!displayDictionaryOf(*message).empty() || message->meaning.pages.empty()) continue;
+    for (const FieldDescriptor& field : message->fields()) {
+      EXPECT_EQ(viewerText(*message, field), "") << message->name << " " << field.name;
       ++untaken;
     }
   }
