@@ -9,7 +9,7 @@
 
 #include "messages/metric_identifiers.h"
 #include "messages/registry.h"
-#include "schema/facts.h"
+#include "schema/field_text.h"
 #include "values/plain_text.h"
 
 namespace probeview {
@@ -127,11 +127,9 @@ void appendComment(std::string& out, std::string_view indent, std::string_view t
 std::string number(std::int64_t value) { return std::to_string(value); }
 
 std::string fieldComment(const MessageDescriptor& message, const FieldDescriptor& field) {
-  const FieldFacts* facts = factsOfField(message.name, field.name);
-  if (facts == nullptr) return {};
-  std::string text(facts->meaning);
-  text += '.';
-  if (!facts->viewer.empty()) text += " In the viewer: " + std::string(facts->viewer) + ".";
+  std::string text = meaningText(message, field) + '.';
+  const std::string viewer = viewerText(message, field);
+  if (!viewer.empty()) text += " In the viewer: " + viewer + ".";
   return text;
 }
 
@@ -163,7 +161,7 @@ Page protoFile(const Family& family) {
 
   for (const MessageDescriptor* message : classesOf(family)) {
     out += '\n';
-    if (const MessageFacts* facts = factsOfMessage(message->name)) appendComment(out, "", facts->meaning);
+    appendComment(out, "", message->meaning.text);
     out += "message " + std::string(message->name) + " {\n";
     for (const FieldDescriptor& field : message->fields()) {
       if (field.enumeration == nullptr) continue;
@@ -206,12 +204,51 @@ std::string pageType(const MessageDescriptor& message, const FieldDescriptor& fi
 void appendFields(std::string& out, const MessageDescriptor& message) {
   out += "| no. | field | type | meaning | in the viewer |\n|---|---|---|---|---|\n";
   for (const FieldDescriptor& field : message.fields()) {
-    const FieldFacts* facts = factsOfField(message.name, field.name);
     out += "| " + number(field.number) + " | `" + std::string(field.name) + "` | " + pageType(message, field) + " | " +
-           std::string(facts != nullptr ? facts->meaning : "") + " | " +
-           std::string(facts != nullptr ? facts->viewer : "") + " |\n";
+           meaningText(message, field) + " | " + viewerText(message, field) + " |\n";
   }
   out += '\n';
+}
+
+// Those that a field names, in the order in which they are named first; without the one of what measures nothing.
+std::vector<const Quantity*> namedQuantities() {
+  std::vector<const Quantity*> named;
+  for (const MessageDescriptor* message : messageClasses()) {
+    for (const FieldDescriptor& field : message->fields()) {
+      const Quantity* quantity = message->meaningOf(field).quantity;
+      if (quantity == nullptr || quantity->name.empty()) continue;
+      if (std::find(named.begin(), named.end(), quantity) == named.end()) named.push_back(quantity);
+    }
+  }
+  return named;
+}
+
+std::string readingText(const Quantity& quantity) {
+  if (quantity.isHexadecimal) return "decimal and hexadecimal";
+  if (quantity.decimals == 0) return "whole numbers";
+  return std::to_string(quantity.decimals) + (quantity.decimals == 1 ? " decimal" : " decimals");
+}
+
+std::string bandsText(const Quantity& quantity) {
+  std::string text;
+  for (const QualityBand& band : quantity.bands) {
+    text += (text.empty() ? "" : ", ") + std::string(band.name) + " from " + plainNumber(band.lowest);
+  }
+  return text.empty() ? text : text + " (" + std::string(quantity.bandsSource) + ")";
+}
+
+void appendQuantities(std::string& out) {
+  out +=
+      "## Quantities\n\nWhat the numbers measure, how they travel, and how a person reads them. No standard defines "
+      "bands "
+      "of quality;\nthose here are what phones draw their bars by.\n\n"
+      "| quantity | unit | on the wire | conversion | read as | quality | defined in "
+      "|\n|---|---|---|---|---|---|---|\n";
+  for (const Quantity* quantity : namedQuantities()) {
+    out += "| " + std::string(quantity->name) + " | " + std::string(quantity->unit) + " | " + numbersText(*quantity) +
+           " | " + conversionText(*quantity) + " | " + readingText(*quantity) + " | " + bandsText(*quantity) + " | " +
+           std::string(quantity->clause) + " |\n";
+  }
 }
 
 Page metricsPage() {
@@ -232,19 +269,17 @@ Page metricsPage() {
   for (const Family& family : families) {
     out += "\n## " + std::string(family.title) + "\n\n";
     for (const MessageDescriptor* message : classesOf(family)) {
-      const MessageFacts* facts = factsOfMessage(message->name);
-      out += "### " + std::string(message->name) + "\n\n";
-      if (facts != nullptr) out += std::string(facts->meaning) + "\n\n";
+      out += "### " + std::string(message->name) + "\n\n" + std::string(message->meaning.text) + "\n\n";
       for (const MetricIdentifier& metric : metricIdentifiers()) {
         if (metric.message != message) continue;
         out += "Metric `" + std::string(metric.name) + "`, " + hexText(metric.id) + ".";
       }
-      if (facts != nullptr && !facts->dictionary.empty()) {
-        out += " Display dictionary `" + std::string(facts->dictionary) + "`.";
+      if (const std::string_view dictionary = displayDictionaryOf(*message); !dictionary.empty()) {
+        out += " Display dictionary `" + std::string(dictionary) + "`.";
       }
-      if (facts != nullptr && !facts->pages.empty()) {
+      if (!message->meaning.pages.empty()) {
         if (out.back() != '\n') out += ' ';
-        out += "Pages: " + std::string(facts->pages) + ".";
+        out += "Pages: " + std::string(message->meaning.pages) + ".";
       }
       if (out.back() != '\n') out += "\n\n";
       appendFields(out, *message);
@@ -263,7 +298,7 @@ Page metricsPage() {
       out += '\n';
     }
   }
-  out.pop_back();
+  appendQuantities(out);
   return {"docs/metrics.md", std::move(out)};
 }
 

@@ -8,7 +8,7 @@
 #include <vector>
 
 #include "messages/metric_identifiers.h"
-#include "schema/facts.h"
+#include "schema/field_text.h"
 #include "schema/pages.h"
 #include "tools/names.h"
 #include "values/json.h"
@@ -25,10 +25,10 @@ struct MetricsOptions {
 
 constexpr std::string_view withoutClass = "known, but nothing takes it: it has no message class";
 
-std::string fieldMeaning(const FieldFacts* facts) {
-  if (facts == nullptr) return "";
-  std::string text(facts->meaning);
-  if (!facts->viewer.empty()) text += "; in the viewer " + std::string(facts->viewer);
+std::string explanation(const MessageDescriptor& message, const FieldDescriptor& field) {
+  std::string text = meaningText(message, field);
+  const std::string viewer = viewerText(message, field);
+  if (!viewer.empty()) text += "; in the viewer " + viewer;
   return text;
 }
 
@@ -47,7 +47,7 @@ void appendFields(const MessageDescriptor& message, std::size_t indent, std::str
     out.append(nameWidth - field.name.size() + 2, ' ');
     out += type;
     out.append(typeWidth - type.size() + 2, ' ');
-    out += fieldMeaning(factsOfField(message.name, field.name)) + '\n';
+    out += explanation(message, field) + '\n';
     if (field.element != nullptr) appendFields(*field.element, indent + 2, out);
   }
 }
@@ -57,10 +57,9 @@ std::string explained(const MetricIdentifier& metric, bool withFields) {
   out += "  " + hexText(metric.id) + "  ";
   if (metric.message == nullptr) return out + "no message\n  " + std::string(withoutClass) + "\n";
   out += std::string(metric.message->name) + '\n';
-  if (const MessageFacts* facts = factsOfMessage(metric.message->name)) {
-    out += "  " + std::string(facts->meaning) + '\n';
-    if (!facts->pages.empty()) out += "  pages: " + std::string(facts->pages) + '\n';
-  }
+  const MessageMeaning& meaning = metric.message->meaning;
+  out += "  " + std::string(meaning.text) + '\n';
+  if (!meaning.pages.empty()) out += "  pages: " + std::string(meaning.pages) + '\n';
   if (withFields) appendFields(*metric.message, 2, out);
   return out;
 }
@@ -68,12 +67,11 @@ std::string explained(const MetricIdentifier& metric, bool withFields) {
 List fieldsOf(const MessageDescriptor& message) {
   List fields;
   for (const FieldDescriptor& field : message.fields()) {
-    const FieldFacts* facts = factsOfField(message.name, field.name);
     Dictionary entry{{"key", Value::constant(field.name)},
                      {"number", std::uint32_t{field.number}},
                      {"type", Value::text(publishedType(message, field))},
-                     {"meaning", Value::constant(facts != nullptr ? facts->meaning : "")},
-                     {"viewer", Value::constant(facts != nullptr ? facts->viewer : "")}};
+                     {"meaning", Value::text(meaningText(message, field))},
+                     {"viewer", Value::text(viewerText(message, field))}};
     if (field.enumeration != nullptr) {
       List names;
       for (const EnumerationEntry& each : field.enumeration->entries()) {
@@ -94,10 +92,8 @@ Dictionary asDictionary(const MetricIdentifier& metric) {
     return entry;
   }
   entry.append("message", Value::constant(metric.message->name));
-  if (const MessageFacts* facts = factsOfMessage(metric.message->name)) {
-    entry.append("meaning", Value::constant(facts->meaning));
-    entry.append("pages", Value::constant(facts->pages));
-  }
+  entry.append("meaning", Value::constant(metric.message->meaning.text));
+  entry.append("pages", Value::constant(metric.message->meaning.pages));
   entry.append("fields", fieldsOf(*metric.message));
   return entry;
 }
