@@ -8,6 +8,7 @@
 #include <string_view>
 
 #include "messages/metric_identifiers.h"
+#include "messages/quantities.h"
 #include "messages/runtime/data_writer.h"
 #include "scenario/reports.h"
 
@@ -19,8 +20,9 @@ enum class Shape : std::uint8_t { Everything, NoLists, LongLists, Smallest, Larg
 constexpr std::size_t shapeCount = static_cast<std::size_t>(Shape::Walk);
 
 constexpr std::size_t longListLength = 32;
-// A reader takes up to 140 away from what it shows in dBm, and the smallest number would not survive that.
-constexpr std::int32_t smallestSigned = std::numeric_limits<std::int32_t>::min() + 140;
+// A reader takes an offset away from what it shows in dBm, and the smallest number would not survive that.
+constexpr std::int32_t largestOffset = static_cast<std::int32_t>(quantities::lteRsrp.offset);
+constexpr std::int32_t smallestSigned = std::numeric_limits<std::int32_t>::min() + largestOffset;
 constexpr std::int32_t largestSigned = std::numeric_limits<std::int32_t>::max();
 constexpr std::uint32_t largestUnsigned = std::numeric_limits<std::uint32_t>::max();
 

@@ -8,6 +8,7 @@
 #include <span>
 #include <vector>
 
+#include "messages/quantities.h"
 #include "scenario/network.h"
 #include "scenario/propagation.h"
 #include "scenario/random.h"
@@ -16,13 +17,13 @@ namespace probeview::scenario {
 
 // Ranges of what is reported: RSRP and RSRQ of 3GPP TS 36.133, 9.1.4 and 9.1.7; CPICH RSCP and Ec/No and the power of a
 // UTRA carrier of 25.133, 9.1.1 to 9.1.3; RxLev of 45.008, 8.1.4.
-constexpr double weakestRsrp = -140, strongestRsrp = -44;
-constexpr double worstRsrq = -19.5, bestRsrq = -3;
+constexpr double weakestRsrp = quantities::lteRsrp.values.lowest, strongestRsrp = quantities::lteRsrp.values.highest;
+constexpr double worstRsrq = quantities::lteRsrq.values.lowest, bestRsrq = quantities::lteRsrq.values.highest;
 constexpr double worstSinr = -20, bestSinr = 30;
 constexpr double weakestRscp = -120, strongestRscp = -25;
 constexpr double worstEcNo = -24, bestEcNo = 0;
 constexpr double weakestUtraCarrier = -100, strongestUtraCarrier = -25;
-constexpr double weakestRxLev = -110, strongestRxLev = -48;
+constexpr double weakestRxLev = quantities::gsmRxLev.valueRange().lowest, strongestRxLev = -48;
 
 class Surroundings {
  public:
