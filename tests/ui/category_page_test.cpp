@@ -335,6 +335,16 @@ TEST_F(CategoryPages, WithoutTechnologyOrCategoryEveryQuestionStopsTheProgram) {
   EXPECT_EQ(outline(takeSnapshot(page)), "TxPowerInfo 0 (" + waiting + ")");
 }
 
+TEST_F(CategoryPages, ThePageIsMadeOnceWhenTheFirstQuestionComes) {
+  SecondLevelViewController page(environment);
+  page.firstSelection = "LTE";
+  page.seguedThroughRow = "Tx Power";
+  const std::string first = outline(takeSnapshot(page));
+  // Nobody changes a selection that is shown; a page that were made anew for each question would show another here.
+  page.seguedThroughRow = "RRC State";
+  EXPECT_EQ(outline(takeSnapshot(page)), first);
+}
+
 TEST_F(CategoryPages, RowsAreAsHighAsTheirContentNeeds) {
   const SecondLevelViewController page(environment);
   EXPECT_EQ(page.heightForRowAtIndexPath(0, 0), automaticDimension);
