@@ -12,6 +12,7 @@ function(probeview_room name)
   add_library(pv_${name} STATIC ${ARG_SOURCES})
   list(TRANSFORM ARG_KNOWS PREPEND pv_)
   target_link_libraries(pv_${name} PUBLIC probeview_settings ${ARG_KNOWS} ${ARG_LINKS})
+  probeview_use_compiled_headers(pv_${name})
 endfunction()
 
 function(probeview_program name)
@@ -19,6 +20,7 @@ function(probeview_program name)
   add_executable(${name} ${ARG_SOURCES})
   list(TRANSFORM ARG_KNOWS PREPEND pv_)
   target_link_libraries(${name} PRIVATE probeview_settings ${ARG_KNOWS} ${ARG_LINKS})
+  probeview_use_compiled_headers(${name})
 endfunction()
 
 function(probeview_test name)
@@ -27,10 +29,7 @@ function(probeview_test name)
   list(TRANSFORM ARG_KNOWS PREPEND pv_)
   target_link_libraries(${name} PRIVATE probeview_settings ${ARG_KNOWS} ${ARG_LINKS} GTest::gtest_main GTest::gmock)
   set_target_properties(${name} PROPERTIES RUNTIME_OUTPUT_DIRECTORY ${CMAKE_BINARY_DIR}/tests)
-  # Qt asks for position-independent code, which compiled headers must have been made for.
-  if(TARGET probeview_test_headers AND NOT "pv_ui_qt" IN_LIST ARG_KNOWS)
-    target_precompile_headers(${name} REUSE_FROM probeview_test_headers)
-  endif()
+  probeview_use_compiled_headers(${name})
   # PRE_TEST: the tests are listed when ctest runs, so that a build does not run programs.
   gtest_discover_tests(${name} TEST_PREFIX "${name}." DISCOVERY_MODE PRE_TEST DISCOVERY_TIMEOUT 60
     WORKING_DIRECTORY ${PROJECT_SOURCE_DIR}

@@ -10,7 +10,7 @@ find_program(PROBEVIEW_CCACHE ccache)
 if(PROBEVIEW_CCACHE AND NOT CMAKE_CXX_COMPILER_LAUNCHER)
   set(CMAKE_CXX_COMPILER_LAUNCHER ${PROBEVIEW_CCACHE})
   # Compiled headers are kept in the cache only by who promises that they hold no time of day.
-  if(PROBEVIEW_QUICK_COLD)
+  if(PROBEVIEW_COMPILED_HEADERS)
     list(PREPEND CMAKE_CXX_COMPILER_LAUNCHER ${CMAKE_COMMAND} -E env CCACHE_SLOPPINESS=pch_defines,time_macros)
   endif()
 endif()
