@@ -5,6 +5,7 @@
 #include "messages/lte_messages.h"
 #include "messages/nas_messages.h"
 #include "messages/umts_messages.h"
+#include "values/plain_text.h"
 
 namespace probeview {
 
@@ -57,6 +58,16 @@ const MetricIdentifier* metricNamed(std::string_view name) noexcept {
     if (metric.name == name) return &metric;
   }
   return nullptr;
+}
+
+std::optional<std::int64_t> identifierNamed(std::string_view reference) noexcept {
+  if (const MetricIdentifier* const metric = metricNamed(reference)) return metric->id;
+  return parseInteger64(reference);
+}
+
+const MetricIdentifier* metricReferredTo(std::string_view reference) noexcept {
+  const std::optional<std::int64_t> identifier = identifierNamed(reference);
+  return identifier ? metricWithId(*identifier) : nullptr;
 }
 
 }  // namespace probeview

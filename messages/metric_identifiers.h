@@ -4,6 +4,7 @@
 #pragma once
 
 #include <cstdint>
+#include <optional>
 #include <span>
 #include <string_view>
 
@@ -32,5 +33,11 @@ std::span<const MetricIdentifier> metricIdentifiers() noexcept;
 // Null when there is no such metric.
 const MetricIdentifier* metricWithId(std::int64_t id) noexcept;
 const MetricIdentifier* metricNamed(std::string_view name) noexcept;
+
+// The identifier that a text names: a metric's, by the metric's name, or the number itself (decimal or 0x…), which need
+// not be a metric's.
+std::optional<std::int64_t> identifierNamed(std::string_view reference) noexcept;
+// The metric that a text names, by its name or its identifier; null where there is none.
+const MetricIdentifier* metricReferredTo(std::string_view reference) noexcept;
 
 }  // namespace probeview

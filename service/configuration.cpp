@@ -7,7 +7,7 @@
 #include "messages/metric_identifiers.h"
 #include "values/near_matches.h"
 #include "values/plain_text.h"
-#include "values/printer.h"
+#include "values/utf8.h"
 
 namespace probeview {
 namespace {
@@ -46,23 +46,6 @@ constexpr std::size_t mostNotes = 100;
 constexpr std::string_view sectionNames[] = {"metrics", "triggers"};
 // A reason may quote a key of the file, which may be as long as the file.
 constexpr std::size_t longestReason = 500;
-
-// A text of the file as it may stand in a message: on one line, and not endless.
-std::string shown(std::string_view text) {
-  constexpr std::size_t longest = 60;
-  std::string out = printed(Value::text(text.substr(0, longest)));
-  if (text.size() > longest) out += "…";
-  return out;
-}
-
-// The metric of that name or identifier; absent when nobody knows it.
-std::optional<std::int64_t> metricOf(std::string_view reference) {
-  if (const std::optional<std::int64_t> number = parseInteger64(reference)) {
-    return metricWithId(*number) != nullptr ? number : std::nullopt;
-  }
-  const MetricIdentifier* const metric = metricNamed(reference);
-  return metric != nullptr ? std::optional(metric->id) : std::nullopt;
-}
 
 // What the library is given to read: every character outside ASCII is U+FFFD there. No name of a metric has one, they
 // stay harmless in comments, and version 3.3.0 takes a wrong turn at those that its table of blanks does not expect.
@@ -120,7 +103,7 @@ class Parser {
     if (!sections.empty() && std::ranges::none_of(sections, isKnown)) {
       const toml::key& first = *sections.front().first;
       return refusal(first.source().begin.line, first.source().begin.column,
-                     "there is neither [metrics] nor [triggers] here, only " + shown(first.str()) +
+                     "there is neither [metrics] nor [triggers] here, only " + quotedExcerpt(first.str()) +
                          (sections.size() > 1 ? " and others" : "") + didYouMean(first.str(), sectionNames));
     }
     for (const auto& [key, node] : sections) {
@@ -129,7 +112,7 @@ class Parser {
       } else if (key->str() == "triggers") {
         readSection(*key, *node, &Parser::readTrigger);
       } else {
-        note(key->source(), shown(key->str()) + " is neither [metrics] nor [triggers], ignored");
+        note(key->source(), quotedExcerpt(key->str()) + " is neither [metrics] nor [triggers], ignored");
       }
       if (refused_) return std::move(*refused_);
     }
@@ -162,27 +145,29 @@ class Parser {
   }
 
   void readMetric(const toml::key& key, const toml::node& node) {
-    const std::optional<std::int64_t> metric = metricOf(key.str());
+    const MetricIdentifier* const metric = metricReferredTo(key.str());
     std::optional<std::chrono::milliseconds> period;
     if (const auto text = node.value_exact<std::string_view>()) {
-      if (*text != onChange) return refusePeriod(key, node, shown(*text));
+      if (*text != onChange) return refusePeriod(key, node, quotedExcerpt(*text));
     } else if (const auto number = node.value_exact<std::int64_t>()) {
       if (*number < 1 || *number > longestPeriod) return refusePeriod(key, node, std::to_string(*number));
       period = std::chrono::milliseconds(*number);
     } else {
       return refusePeriod(key, node, "of another kind");
     }
-    if (!metric) return note(key.source(), "the metric " + shown(key.str()) + " is not known, ignored");
-    if (!configuration_.plan.metrics.emplace(*metric, period).second) {
-      refuse(key.source(), std::string(key.str()) + " is the metric " + std::string(metricWithId(*metric)->name) +
-                               ", which has a period already");
+    if (metric == nullptr)
+      return note(key.source(), "the metric " + quotedExcerpt(key.str()) + " is not known, ignored");
+    if (!configuration_.plan.metrics.emplace(metric->id, period).second) {
+      refuse(key.source(),
+             std::string(key.str()) + " is the metric " + std::string(metric->name) + ", which has a period already");
     }
   }
 
   void readTrigger(const toml::key& key, const toml::node& node) {
     const std::optional<std::int64_t> trigger = parseInteger64(key.str());
     if (!trigger)
-      return refuse(key.source(), "a trigger is named by its number, such as 0x7F0013, not " + shown(key.str()));
+      return refuse(key.source(),
+                    "a trigger is named by its number, such as 0x7F0013, not " + quotedExcerpt(key.str()));
     const toml::array* const array = node.as_array();
     if (array == nullptr) {
       return refuse(node.source(), "a trigger takes a list of metrics, such as [\"K_SIM_FILE_INFO\"]");
@@ -192,29 +177,29 @@ class Parser {
     }
     std::vector<std::int64_t> metrics;
     for (const toml::node& element : *array) {
-      std::optional<std::int64_t> metric;
+      const MetricIdentifier* metric = nullptr;
       std::string reference;
       if (const auto text = element.value_exact<std::string_view>()) {
-        reference = shown(*text);
-        metric = metricOf(*text);
+        reference = quotedExcerpt(*text);
+        metric = metricReferredTo(*text);
       } else if (const auto number = element.value_exact<std::int64_t>()) {
         reference = hexText(*number);
-        metric = metricWithId(*number) != nullptr ? number : std::nullopt;
+        metric = metricWithId(*number);
       } else {
         return refuse(element.source(),
                       "a metric is a name, such as \"K_SIM_FILE_INFO\", or a number, such as 0x3C0013");
       }
-      if (!metric) {
+      if (metric == nullptr) {
         note(element.source(), "the metric " + reference + " is not known, ignored");
-      } else if (std::ranges::find(metrics, *metric) == metrics.end()) {
-        metrics.push_back(*metric);
+      } else if (std::ranges::find(metrics, metric->id) == metrics.end()) {
+        metrics.push_back(metric->id);
       }
     }
     configuration_.triggers.emplace(*trigger, std::move(metrics));
   }
 
   void refusePeriod(const toml::key& key, const toml::node& node, const std::string& what) {
-    refuse(node.source(), "the period of " + shown(key.str()) + " is " + what +
+    refuse(node.source(), "the period of " + quotedExcerpt(key.str()) + " is " + what +
                               "; a period is a number of milliseconds, 1 to " + std::to_string(longestPeriod) +
                               ", or \"on change\"");
   }

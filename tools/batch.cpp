@@ -7,7 +7,6 @@
 
 #include "values/json.h"
 #include "values/plain_text.h"
-#include "values/printer.h"
 
 namespace probeview {
 
@@ -104,13 +103,6 @@ std::optional<std::vector<std::uint8_t>> parseHex(std::string_view text) {
     bytes.push_back(static_cast<std::uint8_t>(high << 4 | low));
   }
   return bytes;
-}
-
-std::string quotedExcerpt(std::string_view text) {
-  constexpr std::size_t longest = 60;
-  std::string out = onOneLine(printed(Value::text(text.substr(0, longest))));
-  if (text.size() > longest) out += "…";
-  return out;
 }
 
 }  // namespace probeview

@@ -77,7 +77,4 @@ std::vector<std::string_view> splitWords(std::string_view line);
 // character.
 std::optional<std::vector<std::uint8_t>> parseHex(std::string_view text);
 
-// A piece of a line as it may stand in an error: quoted, and cut when it is long.
-std::string quotedExcerpt(std::string_view text);
-
 }  // namespace probeview

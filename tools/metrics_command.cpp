@@ -101,8 +101,7 @@ Dictionary asDictionary(const MetricIdentifier& metric) {
 ExitStatus showMetrics(const MetricsOptions& options, Tool& tool) {
   std::vector<const MetricIdentifier*> shown;
   for (const std::string& text : options.metrics) {
-    const std::optional<std::int64_t> identifier = metricOnCommandLine(text);
-    const MetricIdentifier* const metric = identifier ? metricWithId(*identifier) : nullptr;
+    const MetricIdentifier* const metric = metricReferredTo(text);
     if (metric == nullptr) {
       tool.errors << "probectl: " << unknownMetric(text) << '\n';
       return ExitStatus::UsageError;

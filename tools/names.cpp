@@ -6,7 +6,6 @@
 
 #include "messages/metric_identifiers.h"
 #include "messages/registry.h"
-#include "tools/batch.h"
 #include "ui/varnet_view_items.h"
 #include "values/near_matches.h"
 #include "values/plain_text.h"
@@ -36,11 +35,6 @@ std::vector<std::string_view> classNames() {
   std::vector<std::string_view> names;
   for (const MessageDescriptor* message : messageClasses()) names.push_back(message->name);
   return names;
-}
-
-std::optional<std::int64_t> metricOnCommandLine(std::string_view text) {
-  if (const MetricIdentifier* const metric = metricNamed(text)) return metric->id;
-  return parseInteger64(text);
 }
 
 std::string unknownMetric(std::string_view text) {

@@ -3,8 +3,6 @@
 // The names that a command line may use, and what to say of one that nobody knows.
 #pragma once
 
-#include <cstdint>
-#include <optional>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -17,9 +15,7 @@ namespace probeview {
 std::vector<std::string_view> metricNames();
 std::vector<std::string_view> classNames();
 
-// The identifier of a metric named on a command line, by its name or its identifier (decimal or 0x…).
-std::optional<std::int64_t> metricOnCommandLine(std::string_view text);
-// Why there is none, with the names that are near.
+// Why a text names no metric, with the names that are near.
 std::string unknownMetric(std::string_view text);
 
 // probectl names: metrics, classes or pages, one a line, for the completion of command lines.

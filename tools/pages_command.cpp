@@ -8,9 +8,9 @@
 #include <vector>
 
 #include "app/viewer.h"
-#include "tools/batch.h"
 #include "ui/varnet_view_items.h"
 #include "values/near_matches.h"
+#include "values/plain_text.h"
 
 namespace probeview {
 

@@ -21,11 +21,7 @@ namespace {
 // Null, with the reason, when the reference leads to no class.
 const MessageDescriptor* findClass(std::string_view reference, DecodeResult& result) {
   if (const MessageDescriptor* const message = messageClass(reference)) return message;
-  const MetricIdentifier* metric = metricNamed(reference);
-  if (metric == nullptr) {
-    const std::optional<std::int64_t> identifier = parseInteger64(reference);
-    if (identifier) metric = metricWithId(*identifier);
-  }
+  const MetricIdentifier* const metric = metricReferredTo(reference);
   if (metric == nullptr) {
     result.error = quotedExcerpt(reference) + " is no message class, no metric and no metric's identifier";
     std::vector<std::string_view> names = metricNames();

@@ -17,8 +17,8 @@
 
 #include "platform/time_zone.h"
 #include "radix/socket_path.h"
-#include "tools/batch.h"
 #include "values/near_matches.h"
+#include "values/plain_text.h"
 
 namespace probeview {
 

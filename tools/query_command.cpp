@@ -7,6 +7,7 @@
 #include <ostream>
 #include <string>
 
+#include "messages/metric_identifiers.h"
 #include "tools/names.h"
 #include "tools/record_text.h"
 #include "tools/service_client.h"
@@ -24,7 +25,7 @@ struct QueryOptions {
 };
 
 ExitStatus query(const QueryOptions& options, Tool& tool) {
-  const std::optional<std::int64_t> metric = metricOnCommandLine(options.metric);
+  const std::optional<std::int64_t> metric = identifierNamed(options.metric);
   if (!metric) {
     tool.errors << "probectl: " << unknownMetric(options.metric) << '\n';
     return ExitStatus::UsageError;

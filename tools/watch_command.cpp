@@ -12,7 +12,7 @@
 #include <string>
 #include <vector>
 
-#include "tools/batch.h"
+#include "messages/metric_identifiers.h"
 #include "tools/names.h"
 #include "tools/record_text.h"
 #include "tools/service_client.h"
@@ -64,7 +64,7 @@ class ServiceNotes {
 std::optional<std::set<std::int64_t>> metricsToShow(const WatchOptions& options, Tool& tool) {
   std::set<std::int64_t> shown;
   for (const std::string& text : options.metrics) {
-    const std::optional<std::int64_t> metric = metricOnCommandLine(text);
+    const std::optional<std::int64_t> metric = identifierNamed(text);
     if (!metric) {
       tool.errors << "probectl: " << unknownMetric(text) << '\n';
       return std::nullopt;

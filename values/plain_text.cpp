@@ -74,4 +74,10 @@ std::string onOneLine(std::string_view text) {
   return line;
 }
 
+std::string quotedExcerpt(std::string_view text, std::size_t longest) {
+  std::string out = onOneLine(printed(Value::text(text.substr(0, longest))));
+  if (text.size() > longest) out += "…";
+  return out;
+}
+
 }  // namespace probeview

@@ -39,6 +39,9 @@ std::string_view beginningOf(std::string_view text, std::size_t longest);
 std::string onOneLine(std::string_view text);
 void appendOnOneLine(std::string_view text, std::string& out);
 
+// A piece of such a text as it may stand in an error: quoted, and cut behind so many bytes.
+std::string quotedExcerpt(std::string_view text, std::size_t longest = 60);
+
 // The character at the beginning of well-formed UTF-8, which is not empty, and the bytes that it takes.
 struct Utf8Character {
   char32_t code;

@@ -8,7 +8,6 @@
 #include <string_view>
 
 #include "values/plain_text.h"
-#include "values/printer.h"
 
 namespace probeview {
 
@@ -20,8 +19,7 @@ inline bool isNoValue(std::string_view field) { return field.empty() || field ==
 
 // A field fit for a line of a log: short, and without what a terminal would act upon.
 inline std::string shownField(std::string_view field) {
-  std::string text = printed(Value::text(beginningOf(field, traceFieldShown)));
-  return field.size() > traceFieldShown ? text + "…" : text;
+  return quotedExcerpt(field, beginningOf(field, traceFieldShown).size());
 }
 
 // The same for a field that has been read as a number, which needs no quotes.

@@ -482,6 +482,18 @@ TEST(MetricIdentifiers, AreThoseOfTheSecondOpinion) {
   EXPECT_EQ(metricIdentifiers().size(), secondOpinion().metrics.size() + secondOpinion().leftAlone.size());
 }
 
+TEST(MetricIdentifiers, AMetricIsReferredToByItsNameOrItsNumber) {
+  for (const std::string_view reference : {"K_LTE_RRC_STATE", "0x3C4E04", "3952132"}) {
+    EXPECT_EQ(metricReferredTo(reference), metricWithId(0x3C4E04)) << reference;
+    EXPECT_EQ(identifierNamed(reference), 0x3C4E04) << reference;
+  }
+  // The number of a trigger, which is no metric's.
+  EXPECT_EQ(metricReferredTo("0x7F0013"), nullptr);
+  EXPECT_EQ(identifierNamed("0x7F0013"), 0x7F0013);
+  EXPECT_EQ(metricReferredTo("K_NOTHING"), nullptr);
+  EXPECT_EQ(identifierNamed("K_NOTHING"), std::nullopt);
+}
+
 TEST(MetricIdentifiers, AreFoundByNumberAndNameAndHandledWhereThereIsAMessage) {
   for (const MetricIdentifier& metric : metricIdentifiers()) {
     EXPECT_EQ(metric.isHandled, metric.message != nullptr) << metric.name;

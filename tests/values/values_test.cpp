@@ -282,6 +282,13 @@ TEST(Json, KeepsIntegersBytesAndTextsThatAreNotUtf8) {
             R"("l":[-1,"q\"\n\u0001"]})");
 }
 
+TEST(PlainText, AnExcerptIsQuotedHarmlessAndCut) {
+  EXPECT_EQ(quotedExcerpt("two\nlines\x1b[2J\xE2\x80\xAE"), R"("two\nlines\u{1b}[2J\u{202e}")");
+  EXPECT_EQ(quotedExcerpt(std::string(60, 'a')), '"' + std::string(60, 'a') + '"');
+  EXPECT_EQ(quotedExcerpt(std::string(61, 'a')), '"' + std::string(60, 'a') + "\"…");
+  EXPECT_EQ(quotedExcerpt("abc", 2), "\"ab\"…");
+}
+
 TEST(PlainText, AnIntegerIsDecimalHexadecimalOrNegativeInSixtyFourBits) {
   EXPECT_EQ(parseInteger64("3952132"), 3952132);
   EXPECT_EQ(parseInteger64("0x3C4E04"), 0x3C4E04);
