@@ -10,6 +10,10 @@ include_guard()
 
 if(PROBEVIEW_COMPILED_HEADERS AND CMAKE_CXX_COMPILER_ID STREQUAL "GNU")
   add_compile_options(-fpch-preprocess)  # else ccache does not see what the compiled headers stand for
+  # Optimising, g++ 12 warns of code of the standard library that it believes it has seen overrun, and keeps that to
+  # itself only where it has read the library's headers in the same run. Builds without compiled headers keep these.
+  target_compile_options(probeview_settings INTERFACE
+    $<$<CONFIG:Release>:-Wno-array-bounds> $<$<CONFIG:Release>:-Wno-restrict> $<$<CONFIG:Release>:-Wno-stringop-overflow>)
 endif()
 
 function(probeview_compile_headers name)

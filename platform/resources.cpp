@@ -27,7 +27,7 @@ std::vector<std::string> ownFolders() {
   if (error) return {};
   std::vector<std::string> folders{(executable.parent_path().parent_path() / "share" / "probeview").string()};
   // An installed program must not read from where somebody's sources once stood.
-  if (liesIn(executable, PROBEVIEW_BUILD_FOLDER)) folders.push_back(PROBEVIEW_RESOURCES_FOLDER);
+  if (liesIn(executable, PROBEVIEW_BUILD_FOLDER)) folders.emplace_back(PROBEVIEW_RESOURCES_FOLDER);
   return folders;
 }
 
