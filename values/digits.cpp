@@ -10,15 +10,15 @@ namespace probeview {
 
 namespace {
 
-char* append(char* to, std::string_view text) noexcept { return std::copy(text.begin(), text.end(), to); }
+char* writeText(char* to, std::string_view text) noexcept { return std::copy(text.begin(), text.end(), to); }
 
 template <typename Real>
 char* writeShortest(char* to, Real number) noexcept {
   // No radio quantity is infinite; should one ever be, it must not print as a plausible number.
-  if (std::isnan(number)) return append(to, "nan");
-  if (std::isinf(number)) return append(to, number < 0 ? "-inf" : "inf");
+  if (std::isnan(number)) return writeText(to, "nan");
+  if (std::isinf(number)) return writeText(to, number < 0 ? "-inf" : "inf");
   char* const end = std::to_chars(to, to + roomForReal, number, std::chars_format::fixed).ptr;
-  return std::find(to, end, '.') == end ? append(end, ".0") : end;
+  return std::find(to, end, '.') == end ? writeText(end, ".0") : end;
 }
 
 // Sixteen bytes at once: the compilers make one vector instruction of each operation, or several where there is none.
