@@ -146,7 +146,8 @@ def flatten(key, suits):
 STEPS = {
     "K_LTE_SCELL_INFO": lambda line: [stamp, change(dl_bw=halved_twice), line],
     "K_LTE_SEL_RESEL_INFO": lambda line: [
-        line, stamp, flatten_bands, merge_reselection("LTE"), collect("nbr_eutra", "LTE", "EutraNbrs", dl_bw=megahertz)],
+        line, stamp, flatten_bands, merge_reselection("LTE"),
+        collect("nbr_eutra", "LTE", "EutraNbrs", dl_bw=megahertz)],
     "K_LTE_TX_POWER": lambda line: [stamp, line, rewrite("tx_power_info")],
     "K_LTE_RSRP_RSRQ_SINR": lambda line: [line, stamp, rewrite("inst_values", sinr0=HALF, sinr1=HALF)],
     "K_LTE_CA_STATUS": lambda line: [
