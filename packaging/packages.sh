@@ -10,10 +10,12 @@ packages_window="qml6-module-qtqml qml6-module-qtqml-models qml6-module-qtqml-wo
 qml6-module-qtquick-controls qml6-module-qtquick-layouts qml6-module-qtquick-templates qml6-module-qtquick-window \
 qt6-wayland fonts-dejavu-core"
 packages_test="libgtest-dev libgmock-dev libprotobuf-dev protobuf-compiler nlohmann-json3-dev python3 locales tzdata dbus"
+# What holds the tree against its rules. Each version of clang-format formats a little differently, so it is named.
+packages_rules="clang-format-14 shellcheck python3-flake8"
 # A compiler and an emulator for the processor of most phones, and the test library as sources.
 packages_arm64="g++-aarch64-linux-gnu qemu-user googletest"
 packages_coverage="gcovr"
-packages_deep="$packages_arm64 clang libclang-rt-14-dev valgrind"
+packages_deep="$packages_arm64 clang clang-tidy-14 libclang-rt-14-dev valgrind"
 # The peers that the benchmarks measure against, and what counts their instructions (its header comes with it).
 packages_bench="libprotozero-dev nanopb libnanopb-dev libprotobuf-dev protobuf-compiler valgrind"
 
