@@ -29,7 +29,7 @@ RootNavigationController::RootNavigationController(RadixWrapper* wrapper, Metric
 
 void RootNavigationController::viewDidLoad() {
   NavigationStack::viewDidLoad();
-  if (myRadixWrapper) myRadixWrapper->removeTelemConfigForAppid(myAppID);
+  if (myRadixWrapper != nullptr) myRadixWrapper->removeTelemConfigForAppid(myAppID);
   const auto path = resourcePath(metricFileName, metricFileType);
   metricFileIsMissing_ = !path;
   if (!path) {
@@ -37,13 +37,13 @@ void RootNavigationController::viewDidLoad() {
     return;
   }
   consoleLog_.line("pushing metric file");
-  if (!myRadixWrapper) fatalError("there is no client wrapper to push the metric file with");
+  if (myRadixWrapper == nullptr) fatalError("there is no client wrapper to push the metric file with");
   if (!myRadixWrapper->addTelemConfigForAppId(myAppID, *path)) return;
   // The store listens since it was made; listening again restarts delivery under the configuration just pushed.
   if (auto* wrapper = myMetricValidator.mySharedRadixInstance()) wrapper->listen();
   consoleLog_.line("Querying SIM files");
   // Trigger 0x7F0013 is the SIM files; the answer comes later, as an ordinary metric event.
-  if (myRadixWrapper) myRadixWrapper->querySpecificMetric("probeview", 9999, 0, 0x7F0013, 0, 0);
+  if (myRadixWrapper != nullptr) myRadixWrapper->querySpecificMetric("probeview", 9999, 0, 0x7F0013, 0, 0);
 }
 
 void RootNavigationController::didReceiveMemoryWarning() { NavigationStack::didReceiveMemoryWarning(); }

@@ -13,6 +13,8 @@ Dictionary placeholderEntry();
 // A list of one placeholder entry.
 List placeholderList();
 
+// Pages and tools name them as they have always been named.
+// NOLINTBEGIN(readability-identifier-naming)
 struct LTE {
   LTE();
 
@@ -42,6 +44,8 @@ struct UMTS {
   List utraNbrMeas;
   List geraNbrMeas;
 };
+
+// NOLINTEND(readability-identifier-naming)
 
 struct GSM {
   GSM();

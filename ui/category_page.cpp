@@ -24,7 +24,7 @@ Overloaded(Visitors...) -> Overloaded<Visitors...>;
 const Dictionary& entryOf(const List& entries, std::size_t section, std::string_view key) {
   requireIndex("entry", section, entries.size(), key);
   const auto* entry = entries[section].dictionary();
-  if (!entry) fatalError("entry " + std::to_string(section) + " of " + std::string(key) + " has no fields");
+  if (entry == nullptr) fatalError("entry " + std::to_string(section) + " of " + std::string(key) + " has no fields");
   return *entry;
 }
 
@@ -74,7 +74,7 @@ void CategoryPage::cellForRowAtIndexPath(std::size_t section, std::size_t row, L
     return;
   }
   const auto* fields = fieldsOf(rule_, metricValidator_, section);
-  if (!fields) return;
+  if (fields == nullptr) return;
   requireIndex("row", row, fields->size(), key_);
   const auto& [key, value] = (*fields)[row];
   cell.text = std::string(key.text());

@@ -57,6 +57,8 @@ template <DisplayDictionary... dictionaries>
 constexpr std::span<const DisplayDictionary> fedBy = feeding<dictionaries...>;
 constexpr std::span<const DisplayDictionary> fedByNone;
 
+// Named as the enumerators that they are.
+// NOLINTBEGIN(readability-identifier-naming)
 constexpr auto One = SectionRule::One;
 constexpr auto PerEntry = SectionRule::OnePerEntry;
 constexpr auto PerField = RowRule::OnePerField;
@@ -64,6 +66,7 @@ constexpr auto PerFieldElseComplaint = RowRule::OnePerFieldElseComplaint;
 constexpr auto OneRow = RowRule::One;
 constexpr auto Field = CellRule::Field;
 constexpr auto ComeBackLater = CellRule::ComeBackLater;
+// NOLINTEND(readability-identifier-naming)
 
 // What looks uneven is meant so; the reason stands above each such row.
 // A table reads by its columns.

@@ -27,7 +27,7 @@ void FirstLevelViewController::cellForRowAtIndexPath(std::size_t, std::size_t ro
 
 void FirstLevelViewController::prepareForNavigation(const ListCell* sender, ListPage& destination) {
   auto* page = dynamic_cast<SecondLevelViewController*>(&destination);
-  if (!sender || !page) return;
+  if (sender == nullptr || page == nullptr) return;
   page->firstSelection = seguedThroughRow;
   page->seguedThroughRow = sender->text;
 }

@@ -44,12 +44,12 @@ std::unique_ptr<ListPage> InterfaceDescription::makeRootPage() const {
 
 std::unique_ptr<ListPage> InterfaceDescription::makeDestination(std::string_view cellIdentifier) const {
   const auto* wire = wireFrom(cellIdentifier);
-  return wire ? wire->makeDestination(environment_) : nullptr;
+  return wire != nullptr ? wire->makeDestination(environment_) : nullptr;
 }
 
 bool showsDisclosure(std::string_view cellIdentifier) {
   const auto* wire = wireFrom(cellIdentifier);
-  return wire && wire->showsDisclosure;
+  return wire != nullptr && wire->showsDisclosure;
 }
 
 }  // namespace probeview

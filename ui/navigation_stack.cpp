@@ -9,7 +9,7 @@ NavigationStack::NavigationStack(InterfaceDescription description)
     : NavigationStack(description, description.makeRootPage()) {}
 
 NavigationStack::NavigationStack(InterfaceDescription description, std::unique_ptr<ListPage> rootPage)
-    : description_(std::move(description)) {
+    : description_(description) {
   push(std::move(rootPage));
 }
 
@@ -32,7 +32,7 @@ bool NavigationStack::tap(const ListCell& cell) {
 
 bool NavigationStack::pop() {
   if (pages_.size() == 1) return false;
-  if (observer_) observer_->willPop(topPage());
+  if (observer_ != nullptr) observer_->willPop(topPage());
   pages_.pop_back();
   return true;
 }
@@ -45,7 +45,7 @@ void NavigationStack::popToRoot() {
 void NavigationStack::push(std::unique_ptr<ListPage> page) {
   pages_.push_back(std::move(page));
   topPage().viewDidLoad();
-  if (observer_) observer_->didPush(topPage());
+  if (observer_ != nullptr) observer_->didPush(topPage());
 }
 
 std::optional<PageFeed> feedOfTopPage(const NavigationStack& navigation) {

@@ -153,8 +153,9 @@ Status StatusLine::away(const StatusFacts& facts) const {
     // Why it does not come is worth its place: who waits may be waiting at the wrong socket.
     return {StatusKind::Away, "Waiting for the baseband service · " + shown(connection.trouble, longestReason)};
   }
-  return {StatusKind::Away, "Baseband service away since " + localTime(connection.since) +
-                                (youngestOf(facts) ? ", showing what was last known" : ", nothing received yet")};
+  return {StatusKind::Away,
+          "Baseband service away since " + localTime(connection.since) +
+              (youngestOf(facts) != nullptr ? ", showing what was last known" : ", nothing received yet")};
 }
 
 Status StatusLine::filled(const ServiceStatus& service, const Record& record) const {
@@ -223,7 +224,7 @@ std::string StatusLine::localTime(std::chrono::milliseconds wallTime) const {
   const auto then = local(wallTime);
   const auto day = floorDivided(then, secondsPerDay);
   const auto second = then - day * secondsPerDay;
-  const auto timeOfDay = twoDigits(second / 3600) + ":" + twoDigits(second / 60 % 60) + ":" + twoDigits(second % 60);
+  std::string timeOfDay = twoDigits(second / 3600) + ":" + twoDigits(second / 60 % 60) + ":" + twoDigits(second % 60);
   if (day == floorDivided(local(clock_.wallTime()), secondsPerDay)) return timeOfDay;
   const std::chrono::year_month_day date{std::chrono::sys_days{std::chrono::days{day}}};
   return std::to_string(static_cast<int>(date.year())) + "-" + twoDigits(static_cast<unsigned>(date.month())) + "-" +

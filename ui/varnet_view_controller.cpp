@@ -26,7 +26,7 @@ void VarnetViewController::cellForRowAtIndexPath(std::size_t, std::size_t row, L
 
 void VarnetViewController::prepareForNavigation(const ListCell* sender, ListPage& destination) {
   auto* page = dynamic_cast<FirstLevelViewController*>(&destination);
-  if (sender && page) page->seguedThroughRow = sender->text;
+  if (sender != nullptr && page != nullptr) page->seguedThroughRow = sender->text;
 }
 
 }  // namespace probeview

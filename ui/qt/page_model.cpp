@@ -26,7 +26,7 @@ PageModel::PageModel(ListPage& page, QObject* parent)
 PageModel::~PageModel() { detach(); }
 
 void PageModel::detach() {
-  if (page_) page_->setReloadObserver({});
+  if (page_ != nullptr) page_->setReloadObserver({});
   page_ = nullptr;
   reloadDue_ = false;
 }
@@ -95,7 +95,7 @@ QHash<int, QByteArray> PageModel::roleNames() const {
 }
 
 void PageModel::reload() {
-  if (!page_) return;
+  if (page_ == nullptr) return;
   reloadDue_ = held_;
   if (held_) return;
   follow(takeSnapshot(*page_));
