@@ -41,12 +41,11 @@ constexpr auto hexPairs = [] {
 }  // namespace
 
 char* detail::writeLongInteger(char* to, std::uint64_t number) noexcept {
-  if (number < 1'000'000) return writeInteger(to, static_cast<std::uint32_t>(number));
   if (number < 1'000'000'000) {
     to = writeInteger(to, static_cast<std::uint32_t>(number / 1000));
     return writeFollowing(to, static_cast<std::uint32_t>(number % 1000));
   }
-  to = writeLongInteger(to, number / 1'000'000'000);
+  to = writeInteger(to, number / 1'000'000'000);
   const auto nine = static_cast<std::uint32_t>(number % 1'000'000'000);
   to = writeFollowing(to, nine / 1'000'000);
   to = writeFollowing(to, nine / 1000 % 1000);

@@ -50,6 +50,7 @@ inline constexpr auto digitGroups = [] {
   return to + 3;
 }
 
+// Of seven digits at least.
 char* writeLongInteger(char* to, std::uint64_t number) noexcept;
 
 }  // namespace detail
@@ -66,7 +67,10 @@ inline char* writeInteger(char* to, std::int32_t number) noexcept {
   // Negated as an unsigned number, so that the least one has its magnitude too.
   return writeInteger(to + 1, 0 - static_cast<std::uint32_t>(number));
 }
-inline char* writeInteger(char* to, std::uint64_t number) noexcept { return detail::writeLongInteger(to, number); }
+inline char* writeInteger(char* to, std::uint64_t number) noexcept {
+  if (number < 1'000'000) return writeInteger(to, static_cast<std::uint32_t>(number));
+  return detail::writeLongInteger(to, number);
+}
 inline char* writeInteger(char* to, std::int64_t number) noexcept {
   if (number >= 0) return writeInteger(to, static_cast<std::uint64_t>(number));
   *to = '-';
