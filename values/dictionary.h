@@ -8,6 +8,7 @@
 #include <cstddef>
 #include <cstdint>
 #include <initializer_list>
+#include <new>
 #include <string_view>
 #include <utility>
 
@@ -26,7 +27,8 @@ class Key {
   static Key constant(std::string_view text) noexcept { return Key(text); }
   static Key copy(std::string_view text);
   // The same as a constant, for a text that stands in memory as it is printed: behind a quotation mark and before one,
-  // a colon and a blank, with nothing in it to escape. It is printed by copying, if it is not too long for that.
+  // a colon and a blank, with nothing in it to escape. It is printed by copying longestFramed characters, whatever its
+  // own length, so that many must stand there from the quotation mark on; if it is longer it is no framed key.
   static Key framed(std::string_view text) noexcept {
     Key key(text);
     key.isFramed_ = text.size() + frame <= longestFramed;
@@ -83,6 +85,16 @@ class List {
   }
   void clear() noexcept { values_.clear(); }
 
+  // Gives a list up to so many values instead of what it has, and looks for room only once. The list has them when this
+  // ends.
+  class Filler : public Sequence<Value>::Filler {
+   public:
+    Filler(List& list, std::size_t most) : Sequence<Value>::Filler(list.values_, most) {}
+  };
+
+  // Whether copies of a value share it; it is not to be changed then.
+  bool isShared() const noexcept { return values_.isShared(); }
+
   // The index must be below size().
   const Value& operator[](std::size_t index) const noexcept { return values_[index]; }
   Value& operator[](std::size_t index) noexcept { return values_[index]; }
@@ -114,6 +126,8 @@ class Dictionary {
   bool empty() const noexcept { return entries_.size() == 0; }
   void reserve(std::size_t count) { entries_.reserve(count); }
   void clear() noexcept { entries_.clear(); }
+  // Whether copies of a value share it; it is not to be changed then.
+  bool isShared() const noexcept { return entries_.isShared(); }
 
   // Null when there is no such key. Valid until the dictionary changes.
   const Value* find(std::string_view key) const noexcept;
@@ -129,6 +143,20 @@ class Dictionary {
     entries_.append(std::move(key), std::forward<Content>(content));
   }
 
+  // Gives a dictionary up to so many entries instead of what it has, and looks for room only once. The dictionary has
+  // them when this ends.
+  class Filler {
+   public:
+    Filler(Dictionary& dictionary, std::size_t most) : entries_(dictionary.entries_, most) {}
+    template <typename Content>
+    [[gnu::always_inline]] void append(Key key, Content&& content) {
+      entries_.append(std::move(key), std::forward<Content>(content));
+    }
+
+   private:
+    Sequence<Entry>::Filler entries_;
+  };
+
   // Entries in the order of insertion; the index must be below size().
   const Entry& operator[](std::size_t index) const noexcept { return entries_[index]; }
   auto begin() const noexcept { return entries_.begin(); }
@@ -142,5 +170,16 @@ class Dictionary {
  private:
   Sequence<Entry> entries_;
 };
+
+// Each is one pointer, which lies in the value's storage.
+static_assert(sizeof(List) == sizeof(void*) && sizeof(Dictionary) == sizeof(void*));
+
+inline Value::Value(List list) noexcept : form_(formShared), kind_(ValueKind::List) {
+  new (storage_) List(std::move(list));
+}
+
+inline Value::Value(Dictionary dictionary) noexcept : form_(formShared), kind_(ValueKind::Dictionary) {
+  new (storage_) Dictionary(std::move(dictionary));
+}
 
 }  // namespace probeview

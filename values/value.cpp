@@ -3,6 +3,7 @@
 
 #include <cstring>
 #include <limits>
+#include <memory>
 #include <new>
 #include <utility>
 
@@ -11,32 +12,7 @@
 
 namespace probeview {
 
-struct Value::ListNode {
-  static void* operator new(std::size_t size) { return takeMemory(size); }
-  static void operator delete(void* memory, std::size_t size) noexcept { giveMemoryBack(memory, size); }
-
-  std::atomic<std::uint32_t> references{1};
-  List list;
-};
-
-struct Value::DictionaryNode {
-  static void* operator new(std::size_t size) { return takeMemory(size); }
-  static void operator delete(void* memory, std::size_t size) noexcept { giveMemoryBack(memory, size); }
-
-  std::atomic<std::uint32_t> references{1};
-  Dictionary dictionary;
-};
-
 static_assert(sizeof(Value) == 32);
-
-namespace {
-
-// The last owner need not pay for a locked instruction.
-bool releaseReference(std::atomic<std::uint32_t>& references) noexcept {
-  return references.load(std::memory_order_acquire) == 1 || references.fetch_sub(1, std::memory_order_acq_rel) == 1;
-}
-
-}  // namespace
 
 Value::Value(ValueKind kind, std::string_view content) : kind_(kind) {
   if (content.size() <= inlineCapacity) {
@@ -45,16 +21,10 @@ Value::Value(ValueKind kind, std::string_view content) : kind_(kind) {
     return;
   }
   void* memory = takeMemory(sizeof(Buffer) + content.size());
-  auto* buffer = new (memory) Buffer{{1}, static_cast<std::uint32_t>(content.size())};
+  auto* buffer = new (memory) Buffer{{}, static_cast<std::uint32_t>(content.size())};
   std::memcpy(buffer->data(), content.data(), content.size());
   form_ = formShared;
   store(buffer);
-}
-
-Value::Value(List list) : kind_(ValueKind::List) { store(new ListNode{.list = std::move(list)}); }
-
-Value::Value(Dictionary dictionary) : kind_(ValueKind::Dictionary) {
-  store(new DictionaryNode{.dictionary = std::move(dictionary)});
 }
 
 Value Value::text(std::string_view text) { return Value(ValueKind::Text, text); }
@@ -64,19 +34,17 @@ Value Value::bytes(std::span<const std::uint8_t> bytes) {
 }
 
 void Value::retain() const noexcept {
-  std::atomic<std::uint32_t>& references = kind_ == ValueKind::List         ? load<ListNode*>()->references
-                                           : kind_ == ValueKind::Dictionary ? load<DictionaryNode*>()->references
-                                                                            : load<Buffer*>()->references;
-  references.fetch_add(1, std::memory_order_relaxed);
+  // An empty list or dictionary has no memory.
+  if (auto* const holders = load<HolderCount*>()) holders->add();
 }
 
 void Value::release() noexcept {
   if (kind_ == ValueKind::List) {
-    if (releaseReference(load<ListNode*>()->references)) delete load<ListNode*>();
+    std::destroy_at(reinterpret_cast<List*>(storage_));
   } else if (kind_ == ValueKind::Dictionary) {
-    if (releaseReference(load<DictionaryNode*>()->references)) delete load<DictionaryNode*>();
-  } else if (releaseReference(load<Buffer*>()->references)) {
-    giveMemoryBack(load<Buffer*>(), sizeof(Buffer) + load<Buffer*>()->size);
+    std::destroy_at(reinterpret_cast<Dictionary*>(storage_));
+  } else if (auto* const buffer = load<Buffer*>(); buffer->holders.remove()) {
+    giveMemoryBack(buffer, sizeof(Buffer) + buffer->size);
   }
 }
 
@@ -153,24 +121,17 @@ std::optional<std::span<const std::uint8_t>> Value::bytes() const noexcept {
   return std::nullopt;
 }
 
-const List* Value::list() const noexcept { return kind_ == ValueKind::List ? &load<ListNode*>()->list : nullptr; }
-
-const Dictionary* Value::dictionary() const noexcept {
-  return kind_ == ValueKind::Dictionary ? &load<DictionaryNode*>()->dictionary : nullptr;
+template <typename Container>
+Container* Value::unsharedContainer() {
+  auto* const content = reinterpret_cast<Container*>(storage_);
+  if (content->isShared()) *this = Value(Container(*content));
+  return content;
 }
 
-List* Value::mutableList() {
-  if (kind_ != ValueKind::List) return nullptr;
-  if (load<ListNode*>()->references.load(std::memory_order_acquire) != 1) *this = Value(List(load<ListNode*>()->list));
-  return &load<ListNode*>()->list;
-}
+List* Value::mutableList() { return kind_ == ValueKind::List ? unsharedContainer<List>() : nullptr; }
 
 Dictionary* Value::mutableDictionary() {
-  if (kind_ != ValueKind::Dictionary) return nullptr;
-  if (load<DictionaryNode*>()->references.load(std::memory_order_acquire) != 1) {
-    *this = Value(Dictionary(load<DictionaryNode*>()->dictionary));
-  }
-  return &load<DictionaryNode*>()->dictionary;
+  return kind_ == ValueKind::Dictionary ? unsharedContainer<Dictionary>() : nullptr;
 }
 
 bool operator==(const Value& left, const Value& right) noexcept {
@@ -194,11 +155,9 @@ bool operator==(const Value& left, const Value& right) noexcept {
     case ValueKind::Bytes:
       return left.rawText() == right.rawText();
     case ValueKind::List:
-      return left.load<Value::ListNode*>() == right.load<Value::ListNode*>() ||
-             left.load<Value::ListNode*>()->list == right.load<Value::ListNode*>()->list;
+      return left.load<void*>() == right.load<void*>() || *left.list() == *right.list();
     case ValueKind::Dictionary:
-      return left.load<Value::DictionaryNode*>() == right.load<Value::DictionaryNode*>() ||
-             left.load<Value::DictionaryNode*>()->dictionary == right.load<Value::DictionaryNode*>()->dictionary;
+      return left.load<void*>() == right.load<void*>() || *left.dictionary() == *right.dictionary();
   }
   return false;
 }

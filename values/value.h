@@ -10,7 +10,6 @@
 // by two threads at once.
 #pragma once
 
-#include <atomic>
 #include <concepts>
 #include <cstddef>
 #include <cstdint>
@@ -20,6 +19,8 @@
 #include <string>
 #include <string_view>
 #include <utility>
+
+#include "values/holder_count.h"
 
 namespace probeview {
 
@@ -81,8 +82,8 @@ class Value {
   }
   // Refers to the text.
   Value(Identifier name) noexcept : Value(name.text, formIdentifier) {}
-  Value(List list);
-  Value(Dictionary dictionary);
+  Value(List list) noexcept;
+  Value(Dictionary dictionary) noexcept;
 
   // Copies the bytes of the text.
   static Value text(std::string_view text);
@@ -125,8 +126,10 @@ class Value {
   std::optional<std::string_view> text() const noexcept;
   std::optional<std::span<const std::uint8_t>> bytes() const noexcept;
   // Null when the value is of another kind. Valid until the value changes.
-  const List* list() const noexcept;
-  const Dictionary* dictionary() const noexcept;
+  const List* list() const noexcept { return kind_ == ValueKind::List ? container<List>() : nullptr; }
+  const Dictionary* dictionary() const noexcept {
+    return kind_ == ValueKind::Dictionary ? container<Dictionary>() : nullptr;
+  }
   // For changing the content in place; copies of this value keep the old content. Null when of another kind.
   List* mutableList();
   Dictionary* mutableDictionary();
@@ -150,20 +153,20 @@ class Value {
   static constexpr std::size_t inlineCapacity = 30;
   static constexpr std::uint8_t formConstant = 31;
   static constexpr std::uint8_t formIdentifier = 32;
+  // The storage holds one pointer, to memory that begins with a count of its holders: that of a longer text, or of the
+  // elements of a list or dictionary.
   static constexpr std::uint8_t formShared = 33;
 
   struct View {
     const char* data;
     std::size_t size;
   };
-  // A text or byte buffer that is never changed once made, shared by all copies.
+  // A text or byte buffer that is never changed once made, shared by all copies. The characters stand behind it.
   struct Buffer {
-    std::atomic<std::uint32_t> references;
+    HolderCount holders;
     std::uint32_t size;
     char* data() noexcept { return reinterpret_cast<char*>(this + 1); }
   };
-  struct ListNode;
-  struct DictionaryNode;
   // The storage is plain bytes, so that a text can use all that the kind and the form leave free.
   template <typename T>
   T load() const noexcept {
@@ -187,6 +190,13 @@ class Value {
     if (form_ <= inlineCapacity) return form_;
     return isConstant() ? load<View>().size : load<Buffer*>()->size;
   }
+  // A list or dictionary is one pointer, which lies in the storage and moves with its bytes.
+  template <typename Container>
+  const Container* container() const noexcept {
+    return reinterpret_cast<const Container*>(storage_);
+  }
+  template <typename Container>
+  Container* unsharedContainer();
   // One holder more, or less, of what is shared; only for a value that shares.
   void retain() const noexcept;
   void release() noexcept;
@@ -199,12 +209,10 @@ class Value {
     form_ = other.form_;
     kind_ = other.kind_;
   }
-  bool isShared() const noexcept {
-    return kind_ >= ValueKind::Text && (kind_ >= ValueKind::List || form_ == formShared);
-  }
+  bool isShared() const noexcept { return form_ == formShared; }
 
   alignas(8) char storage_[inlineCapacity];
-  // For text and bytes: their length when they lie inline, else one of the three forms.
+  // The length of text and bytes that lie inline, else one of the three forms; 0 for numbers.
   std::uint8_t form_ = 0;
   ValueKind kind_ = ValueKind::Text;
 };

@@ -4,6 +4,7 @@
 #include <clocale>
 #include <cstdint>
 #include <limits>
+#include <memory>
 #include <string>
 #include <vector>
 
@@ -62,6 +63,43 @@ TEST(Value, WritingToOneCopyLeavesTheOtherAsItWas) {
   other.mutableList()->append(true);
   EXPECT_EQ(list.list()->size(), 2u);
   EXPECT_EQ(other.list()->size(), 3u);
+}
+
+TEST(Value, WhatAValueHoldsLivesUntilItsLastCopyGoes) {
+  auto first = std::make_unique<Value>(List{Value::text(std::string(40, 'x')), Dictionary{{"a", std::int32_t{1}}}});
+  Value second = *first;
+  EXPECT_EQ(second.list(), second.mutableList()) << "a container is at its own place";
+  const Value inner = (*first->list())[1];
+  first->mutableList()->clear();
+  first.reset();
+  EXPECT_EQ(printed(second), "[\"" + std::string(40, 'x') + "\", [\"a\": 1]]");
+  second = Value();
+  EXPECT_EQ(printed(inner), "[\"a\": 1]");
+}
+
+TEST(Value, AnEmptyContainerIsCopiedAndFilledLikeAnyOther) {
+  for (const Value& empty : {Value(List()), Value(Dictionary())}) {
+    Value copy = empty;
+    const Value other = copy;
+    EXPECT_TRUE(copy == other);
+    if (List* const list = copy.mutableList()) list->append(true);
+    if (Dictionary* const dictionary = copy.mutableDictionary()) dictionary->set("a", true);
+    EXPECT_FALSE(copy == other);
+    EXPECT_EQ(printed(other), "[]");
+  }
+}
+
+TEST(List, AFillerReplacesWhatWasThereAndKeepsWhatItHadWhenItEndsEarly) {
+  List list{std::int32_t{1}, std::int32_t{2}};
+  try {
+    List::Filler values(list, 10);
+    values.append(Value::text(std::string(40, 'y')));
+    throw 1;
+  } catch (int) {
+  }
+  EXPECT_EQ(printed(list), "[\"" + std::string(40, 'y') + "\"]");
+  list.append(std::int32_t{3});
+  EXPECT_EQ(list.size(), 2U);
 }
 
 TEST(Value, AnIntegerIsWhatFitsIntoSigned32Bits) {
@@ -151,7 +189,8 @@ TEST(Printer, AnIntegerOfEveryLengthHasItsDigits) {
 }
 
 TEST(Printer, ALineOfAnyLengthIsTheSumOfItsParts) {
-  static constexpr std::string_view framed = "\"rsrp_of_first_antenna\": ";
+  static constexpr char printedKey[Key::longestFramed] = "\"rsrp_of_first_antenna\": ";
+  const std::string_view framed = printedKey;
   const Key key = Key::framed(framed.substr(1, framed.size() - 4));
   const Value parts[] = {std::numeric_limits<std::uint64_t>::max(),
                          std::numeric_limits<std::int32_t>::min(),
