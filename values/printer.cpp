@@ -180,7 +180,8 @@ char* put(char* to, const Dictionary& dictionary, TextWriter& out) {
     // Asked for once: what most entries take.
     to = out.room<Key::longestFramed + roomForValue>(to);
     if (entry.key.isFramed()) [[likely]] {
-      to = out.putShort(to, entry.key.framedText());
+      std::memcpy(to, entry.key.framedText().data(), Key::longestFramed);
+      to += entry.key.framedText().size();
     } else {
       to = out.room<roomForValue>(append(putQuoted(to, entry.key.text(), out), ": "));
     }

@@ -6,7 +6,7 @@
 
 namespace probeview {
 
-Dictionary PBCodable::dictionaryRepresentation() const { return TableWalker::dictionary(*this, descriptor()); }
+Dictionary PBCodable::dictionaryRepresentation() const { return descriptor().dictionary(*this); }
 
 std::string PBCodable::description() const {
   std::string text(className());

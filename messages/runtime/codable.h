@@ -213,6 +213,8 @@ class PBCodable {
  private:
   friend struct TableWalker;
   friend struct FieldRun;
+  template <const auto& Rows>
+  friend struct DictionaryOf;
 
   std::uint64_t _has = 0;  // bit n: the scalar field of number n is present
   Block* block_ = nullptr;

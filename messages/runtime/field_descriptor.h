@@ -133,6 +133,8 @@ struct MessageDescriptor {
   DecodingProgress (*decodeInOrder)(PBCodable& message, const std::uint8_t* position, const std::uint8_t* limit,
                                     Decoding& decoding);
   std::uint8_t* (*encodeFields)(const PBCodable& message, std::uint8_t* out, PBDataWriter& writer);
+  // The dictionary form (dictionary.h).
+  Dictionary (*dictionary)(const PBCodable& message);
   // Makes a message in memory of the given block, to which it belongs from then on.
   PBCodable* (*makeElement)(void* memory, Block& block);
   std::unique_ptr<PBCodable> (*make)();

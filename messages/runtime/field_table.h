@@ -38,6 +38,7 @@
 #include <span>
 
 #include "messages/runtime/codable.h"
+#include "messages/runtime/dictionary.h"
 #include "messages/runtime/field_meaning.h"
 #include "messages/runtime/field_run.h"
 
@@ -53,7 +54,8 @@ enum class EmptyBraces {};
 
 // The key as it is printed, with all around it, is one constant, so that it is printed by copying; the name lies in it.
 consteval std::string_view nameIn(std::string_view printedKey) {
-  const std::string_view name = printedKey.substr(1, printedKey.size() - 4);
+  if (printedKey.size() < Key::longestFramed) throw "a key is copied with what stands behind it";
+  const std::string_view name = printedKey.substr(1, printedKey.find("\": ") - 1);
   for (const char character : name) {
     const bool isLetter = (character >= 'a' && character <= 'z') || (character >= 'A' && character <= 'Z');
     if (!isLetter && !(character >= '0' && character <= '9') && character != '_') throw "a key is an identifier";
@@ -177,6 +179,7 @@ consteval MessageDescriptor describeMessage(std::string_view name) {
   descriptor.size = sizeof(Message);
   descriptor.decodeInOrder = FieldRun::decode<rows, scalarRows<rows>>;
   descriptor.encodeFields = FieldRun::encode<rows>;
+  descriptor.dictionary = DictionaryOf<rows>::make;
   descriptor.makeElement = [](void* memory, Block& block) -> PBCodable* { return Message::make(memory, block); };
   descriptor.make = []() -> std::unique_ptr<PBCodable> { return std::make_unique<Message>(); };
   descriptor.renew = [](PBCodable& message) { Message::renew(static_cast<Message&>(message)); };
@@ -234,12 +237,15 @@ consteval MessageDescriptor describeMessage(std::string_view name) {
     return ::probeview::FieldMeaning(__VA_ARGS__);                                                    \
   })
 
-#define PB_ROW(number, key, property, type)                                                          \
-  static constexpr ::probeview::FieldDescriptor pbField(::probeview::FieldNumber<number>) {          \
-    return type::describe(number, ::probeview::detail::nameIn("\"" key "\": "), &Self::_##property); \
-  }                                                                                                  \
-                                                                                                     \
- private:                                                                                            \
+// As long as what is copied at once (Key::framed()).
+#define PB_PADDING "                                "
+
+#define PB_ROW(number, key, property, type)                                                                     \
+  static constexpr ::probeview::FieldDescriptor pbField(::probeview::FieldNumber<number>) {                     \
+    return type::describe(number, ::probeview::detail::nameIn("\"" key "\": " PB_PADDING), &Self::_##property); \
+  }                                                                                                             \
+                                                                                                                \
+ private:                                                                                                       \
   type::Stored _##property {}
 
 #define PB_FIELD(number, key, property, Property, type, ...)                                       \

@@ -17,8 +17,6 @@ struct TableWalker {
   static bool decode(PBCodable& message, PBDataReader& reader);
   // encode.cpp
   static void encode(const PBCodable& message, PBDataWriter& writer);
-  // dictionary.cpp
-  static Dictionary dictionary(const PBCodable& message, const MessageDescriptor& descriptor);
   // contents.cpp; the messages are of the class that the descriptor describes.
   static bool isPresent(const PBCodable& message, const FieldDescriptor& row) noexcept;
   // Nested messages are shared.
