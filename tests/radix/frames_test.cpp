@@ -220,13 +220,15 @@ TEST(Frames, AFrameMayHaveAFieldOfAnyNumberAlsoOfOneThatMetricsHave) {
   // Field 19, a text of one byte: 9A 01 01 'x'; field 63: F8 03 07.
   const Bytes inOrder{0x08, 5, 0x9A, 0x01, 1, 'x', 0xF8, 0x03, 7};
   const Bytes inAnotherOrder{0xF8, 0x03, 7, 0x9A, 0x01, 1, 'x', 0x08, 5};
+  LaterFrame expected;
+  expected.setFirst(5);
+  expected.setText("x");
+  expected.setLast(7);
   for (const Bytes& bytes : {inOrder, inAnotherOrder}) {
     LaterFrame frame;
     probeview::PBDataReader reader(bytes);
     EXPECT_TRUE(frame.readFrom(reader));
-    EXPECT_EQ(frame.first(), 5U);
-    EXPECT_EQ(frame.text(), "x");
-    EXPECT_EQ(frame.last(), 7U);
+    EXPECT_EQ(frame, expected);
   }
   // In a frame that does not know it, it is skipped like all that is unknown, whatever it holds: a ping, 3A 08, with
   // the bytes FF FF FF in field 19 before its number.
