@@ -216,6 +216,19 @@ class Rules(unittest.TestCase):
         self.assertEqual(self.run_rule(check).returncode, 0)
         self.assertTrue((self.top / "values/value.cpp").read_text().endswith("\nint one() { return 1; }\n"))
 
+    def testAConstantWithAKFails(self):
+        self.require_linters()
+        self.copy_rules()
+        self.mend()
+        self.write("values/value.h", "constexpr char kKeyOrigin[] = \"kKeyOrigin\";\nconstexpr int mostValues = 3;\n"
+                                     "constexpr int kMost = 3;\nconst Milliseconds kPause{5};\n")
+        checked = self.run_rule(self.top / "tests/rules/check")
+        self.assertEqual(checked.returncode, 1)
+        self.assertEqual(checked.stderr.splitlines(),
+                         ["values/value.h:3:constexpr int kMost = 3;", "values/value.h:4:const Milliseconds kPause{5};",
+                          "error: constants are named as variables are, without a k",
+                          "error: rules are broken: names"])
+
     def testAFaultOfAScriptFails(self):
         self.require_linters()
         self.copy_rules()
