@@ -5,7 +5,7 @@ namespace probeview {
 
 bool AppIDValidator::validate(const Dictionary& event) {
   const auto* value = event.find(appIDKey);
-  setAppID(value ? value->int64() : std::nullopt);
+  setAppID(value != nullptr ? value->int64() : std::nullopt);
   return appID() == 2;
 }
 

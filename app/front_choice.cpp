@@ -11,7 +11,7 @@ namespace {
 
 bool isSet(const char* variable) {
   const char* value = std::getenv(variable);
-  return value && *value;
+  return value != nullptr && *value != '\0';
 }
 
 }  // namespace

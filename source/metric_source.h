@@ -51,6 +51,7 @@ class MetricSink {
   virtual ~MetricSink() = default;
   virtual void emit(MetricRecord record) = 0;
   // The source runs until it says otherwise, and again when it says so. Must not be called from inside emit() either.
+  // Who heeds the condition keeps it. NOLINTNEXTLINE(performance-unnecessary-value-param)
   virtual void conditionChanged(SourceCondition) {}
 };
 

@@ -45,14 +45,14 @@ QString PageModel::sectionTitle(int section) const {
 
 int PageModel::rowAfter(int row) const {
   for (int next = row + 1; next < rowCount(); ++next) {
-    if (cell(next)) return next;
+    if (cell(next) != nullptr) return next;
   }
   return -1;
 }
 
 int PageModel::rowBefore(int row) const {
   for (int next = row - 1; next >= 0; --next) {
-    if (cell(next)) return next;
+    if (cell(next) != nullptr) return next;
   }
   return -1;
 }
@@ -71,17 +71,17 @@ QVariant PageModel::data(const QModelIndex& index, int role) const {
   const auto* shown = cell(index.row());
   switch (role) {
     case LabelRole:
-      return shown ? textOf(shown->text) : QString();
+      return shown != nullptr ? textOf(shown->text) : QString();
     case ValueRole:
-      return shown ? textOf(shown->detail) : QString();
+      return shown != nullptr ? textOf(shown->detail) : QString();
     case HasValueRole:
-      return shown && shown->detail.has_value();
+      return shown != nullptr && shown->detail.has_value();
     case IsShownRole:
       return shown != nullptr;
     case DisclosureRole:
-      return shown && showsDisclosure(shown->identifier);
+      return shown != nullptr && showsDisclosure(shown->identifier);
     case SpokenRole:
-      return shown ? QString::fromStdString(accessibleLabel(*shown)) : QString();
+      return shown != nullptr ? QString::fromStdString(accessibleLabel(*shown)) : QString();
     case SectionRole:
       return static_cast<int>(placeOf(index.row()).section);
     default:  // Qt asks for roles of its own, as a number

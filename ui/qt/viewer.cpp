@@ -43,7 +43,7 @@ QList<QObject*> Viewer::firstPages() const { return QList<QObject*>(pages_.begin
 
 QObject* Viewer::open(int row) {
   const auto* tapped = topPage()->cell(row);
-  if (!tapped) return nullptr;
+  if (tapped == nullptr) return nullptr;
   // A copy: the page may reload while its destination is made.
   const ListCell cell = *tapped;
   return stack_.tap(cell) ? topPage() : nullptr;
@@ -55,7 +55,7 @@ void Viewer::back() {
 }
 
 void Viewer::release(QObject* page) {
-  if (page) page->deleteLater();
+  if (page != nullptr) page->deleteLater();
 }
 
 void Viewer::didPush(ListPage& page) {

@@ -29,7 +29,8 @@ constexpr int escapeDelayMilliseconds = 25;
 // The widths of characters come from a locale whose encoding is UTF-8, also where none but ASCII is written; nothing
 // else of the locale is taken over.
 void chooseCharacters() {
-  if (std::setlocale(LC_CTYPE, "") && characterSetOf(::nl_langinfo(CODESET)) == CharacterSet::Unicode) return;
+  if (std::setlocale(LC_CTYPE, "") != nullptr && characterSetOf(::nl_langinfo(CODESET)) == CharacterSet::Unicode)
+    return;
   std::setlocale(LC_CTYPE, "C.UTF-8");
 }
 
@@ -106,11 +107,11 @@ class TerminalFront::Views final : public NavigationObserver {
 };
 
 std::string TerminalFront::localeEncoding() {
-  if (std::setlocale(LC_CTYPE, "")) return ::nl_langinfo(CODESET);
+  if (std::setlocale(LC_CTYPE, "") != nullptr) return ::nl_langinfo(CODESET);
   // A locale that is not installed, as it often is behind a remote shell: its name tells the encoding all the same.
   for (const char* variable : {"LC_ALL", "LC_CTYPE", "LANG"}) {
     const char* const value = std::getenv(variable);
-    if (!value || !*value) continue;
+    if (value == nullptr || *value == '\0') continue;
     const std::string_view name(value);
     const auto point = name.find('.');
     return std::string(point == std::string_view::npos ? "" : name.substr(point + 1, name.find('@') - point - 1));
@@ -119,12 +120,12 @@ std::string TerminalFront::localeEncoding() {
 }
 
 std::unique_ptr<TerminalFront> TerminalFront::make(std::string& error, std::string_view encoding) {
-  if (!::isatty(STDIN_FILENO) || !::isatty(STDOUT_FILENO)) {
+  if (::isatty(STDIN_FILENO) == 0 || ::isatty(STDOUT_FILENO) == 0) {
     error = "standard input and output are no terminal; --print writes the pages as plain text";
     return nullptr;
   }
   const char* kind = std::getenv("TERM");
-  if (!kind || !*kind) {
+  if (kind == nullptr || *kind == '\0') {
     error = "the environment variable TERM does not say what kind of terminal this is; set it, or use --print";
     return nullptr;
   }
