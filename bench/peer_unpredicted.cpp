@@ -9,7 +9,8 @@
 #include "messages/lte_messages.h"
 #include "messages/metric_utility.h"
 #include "messages/nas_messages.h"
-#include "messages/runtime/table_walker.h"
+#include "messages/runtime/decode.h"
+#include "messages/runtime/message_internals.h"
 #include "messages/umts_messages.h"
 
 namespace probeview::bench {
@@ -18,23 +19,8 @@ namespace {
 
 using Position = const std::uint8_t*;
 
-// What a message keeps to its classes.
-class Opened : public PBCodable {
- public:
-  static void markPresent(PBCodable& message, unsigned number) {
-    (message.*static_cast<void (PBCodable::*)(unsigned) noexcept>(&Opened::setBit))(number);
-  }
-};
-
-struct Record {
-  Position begin;
-  Position end;
-};
-
-Record readRecord(Position position, Position limit) {
-  const wire::Varint length = wire::readVarint(position, limit);
-  if (length.next == nullptr || length.value > static_cast<std::uint64_t>(limit - length.next)) return {};
-  return {length.next, length.next + length.value};
+void markPresent(PBCodable& message, unsigned number) {
+  MessageInternals::presence(message) |= std::uint64_t{1} << number;
 }
 
 Position decode(PBCodable& message, const MessageDescriptor& descriptor, Position position, Position limit,
@@ -62,38 +48,38 @@ Position decodeNumbers(Position position, Position limit, const Add& add) {
 
 Position decodeField(PBCodable& message, const FieldDescriptor& row, Position position, Position limit,
                      PBCodable& root) {
-  Block& block = TableWalker::blockOf(root);
+  Block& block = MessageInternals::blockFor(root);
   const auto makeElement = [&] { return row.element->makeElement(block.allocate(row.element->size), block); };
   switch (row.kind) {
     case FieldKind::UInt64: {
       const wire::Varint scalar = wire::readVarint(position, limit);
       message.*row.member.unsigned64 = scalar.value;
-      Opened::markPresent(message, row.number);
+      markPresent(message, row.number);
       return scalar.next;
     }
     case FieldKind::UInt32: {
       const wire::Varint scalar = wire::readVarint(position, limit);
       message.*row.member.unsigned32 = static_cast<std::uint32_t>(scalar.value);
-      Opened::markPresent(message, row.number);
+      markPresent(message, row.number);
       return scalar.next;
     }
     case FieldKind::Int32:
     case FieldKind::Enumeration: {
       const wire::Varint scalar = wire::readVarint(position, limit);
       message.*row.member.signed32 = static_cast<std::int32_t>(scalar.value);
-      Opened::markPresent(message, row.number);
+      markPresent(message, row.number);
       return scalar.next;
     }
     case FieldKind::SInt32: {
       const wire::Varint scalar = wire::readVarint(position, limit);
       message.*row.member.signed32 = wire::unZigZag(static_cast<std::uint32_t>(scalar.value));
-      Opened::markPresent(message, row.number);
+      markPresent(message, row.number);
       return scalar.next;
     }
     case FieldKind::Bool: {
       const wire::Varint scalar = wire::readVarint(position, limit);
       message.*row.member.truth = scalar.value != 0;
-      Opened::markPresent(message, row.number);
+      markPresent(message, row.number);
       return scalar.next;
     }
     case FieldKind::Bytes:

@@ -109,7 +109,7 @@ void Block::rewind() noexcept {
 }
 
 void Block::destroy() noexcept {
-  releaseContents();
+  if (destructions_ != nullptr || chunks_ != nullptr) releaseContents();
   const bool isRecyclable = isRecyclable_;
   this->~Block();
   if (isRecyclable) {

@@ -20,7 +20,9 @@ class PBByteField {
   PBByteField& operator=(const PBByteField&) = delete;
   PBByteField(PBByteField&& other) noexcept;
   PBByteField& operator=(PBByteField&& other) noexcept;
-  ~PBByteField() { clear(); }
+  ~PBByteField() {
+    if (ownsMemory_) clear();
+  }
 
   bool isPresent() const noexcept { return data_ != nullptr; }
   // Empty when absent. Valid until the field changes.
@@ -31,15 +33,15 @@ class PBByteField {
   void set(std::span<const std::uint8_t> bytes);
   // Copies the bytes into the block, which must outlive them.
   void set(std::span<const std::uint8_t> bytes, Block& block) {
+    auto* copy = static_cast<std::uint8_t*>(block.allocate(bytes.size()));
+    if (!bytes.empty()) std::memcpy(copy, bytes.data(), bytes.size());
+    setLocal({copy, bytes.size()});
+  }
+  // The bytes lie, even if they are none, in a block that outlives them.
+  void setLocal(std::span<const std::uint8_t> bytes) {
     if (bytes.size() > longest) throwTooLong();
-    const std::uint8_t* data = noBytes;
-    if (!bytes.empty()) {
-      auto* copy = static_cast<std::uint8_t*>(block.allocate(bytes.size()));
-      std::memcpy(copy, bytes.data(), bytes.size());
-      data = copy;
-    }
     if (ownsMemory_) clear();
-    data_ = data;
+    data_ = bytes.data();
     size_ = static_cast<std::uint32_t>(bytes.size());
   }
   void clear() noexcept;

@@ -1,7 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "messages/runtime/codable.h"
 
-#include "messages/runtime/table_walker.h"
+#include "messages/runtime/contents.h"
+#include "messages/runtime/message_internals.h"
 #include "values/printer.h"
 
 namespace probeview {
@@ -17,18 +18,18 @@ std::string PBCodable::description() const {
 
 bool PBCodable::copyTo(PBCodable& target) const {
   if (&descriptor() != &target.descriptor()) return false;
-  TableWalker::copy(target, *this, descriptor());
+  copyContents(target, *this, descriptor());
   return true;
 }
 
 bool PBCodable::mergeFrom(const PBCodable& other) {
   if (&descriptor() != &other.descriptor()) return false;
-  TableWalker::merge(*this, other, descriptor());
+  mergeContents(*this, other, descriptor());
   return true;
 }
 
 bool PBCodable::isEqual(const PBCodable& other) const noexcept {
-  return &descriptor() == &other.descriptor() && TableWalker::areEqual(*this, other, descriptor());
+  return &descriptor() == &other.descriptor() && haveEqualContents(*this, other, descriptor());
 }
 
 std::unique_ptr<PBCodable> PBCodable::copyWithZone() const {
@@ -37,9 +38,9 @@ std::unique_ptr<PBCodable> PBCodable::copyWithZone() const {
   return copy;
 }
 
-std::uint64_t PBCodable::hash() const noexcept { return TableWalker::hash(*this, descriptor()); }
+std::uint64_t PBCodable::hash() const noexcept { return hashOfContents(*this, descriptor()); }
 
-bool PBCodable::hasField(const FieldDescriptor& field) const noexcept { return TableWalker::isPresent(*this, field); }
+bool PBCodable::hasField(const FieldDescriptor& field) const noexcept { return isPresent(*this, field); }
 
 void PBCodable::reset() {
   // Taken out of the message while a new one is made in its place.
@@ -63,8 +64,8 @@ void PBCodable::reset() {
 
 void PBCodable::copyFrom(const PBCodable& other) {
   const MessageDescriptor& fields = other.descriptor();
-  Block* block = fields.isFlat || isElement_ ? nullptr : &TableWalker::blockOf(*this);
-  TableWalker::copyDeep(*this, other, fields, block);
+  Block* block = fields.isFlat || isElement_ ? nullptr : &MessageInternals::blockFor(*this);
+  copyDeeply(*this, other, fields, block);
 }
 
 void PBCodable::moveFrom(PBCodable& other) noexcept {
@@ -72,7 +73,7 @@ void PBCodable::moveFrom(PBCodable& other) noexcept {
   if (other.isElement_) {
     copyFrom(other);
   } else {
-    TableWalker::move(*this, other, other.descriptor());
+    moveContents(*this, other, other.descriptor());
   }
 }
 

@@ -16,6 +16,7 @@
 
 #include "messages/runtime/block.h"
 #include "messages/runtime/field_descriptor.h"
+#include "messages/runtime/wire_format.h"
 #include "values/dictionary.h"
 
 namespace probeview {
@@ -211,10 +212,7 @@ class PBCodable {
   void assignFrom(const PBCodable& other);
 
  private:
-  friend struct TableWalker;
-  friend struct FieldRun;
-  template <const auto& Rows>
-  friend struct DictionaryOf;
+  friend struct MessageInternals;
 
   std::uint64_t _has = 0;  // bit n: the scalar field of number n is present
   Block* block_ = nullptr;

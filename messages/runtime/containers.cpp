@@ -64,11 +64,6 @@ void PBMessageField::setCounted(PBCodable* element, const Block* home) noexcept 
   }
 }
 
-void PBMessageField::setLocal(PBCodable* element) noexcept {
-  clear();
-  element_ = ElementPointer::local(element);
-}
-
 PBCodable& PBMessageList::at(std::size_t index) const {
   if (index >= count_) throwIndexOutOfRange(index, count_);
   return *elements_[index].get();
@@ -104,7 +99,7 @@ void PBMessageList::release() noexcept {
 }
 
 void PBMessageList::grow(Block* home) {
-  const std::uint32_t capacity = capacity_ == 0 ? 8 : 2 * capacity_;
+  const std::uint32_t capacity = capacity_ == 0 ? firstCapacity : 2 * capacity_;
   if (capacity >= 1U << 30) throw std::length_error("a list of messages has at most 536870912 of them");
   auto* elements = home != nullptr ? static_cast<ElementPointer*>(home->allocate(capacity * sizeof(ElementPointer)))
                                    : new ElementPointer[capacity];

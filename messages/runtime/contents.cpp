@@ -1,13 +1,32 @@
 // SPDX-License-Identifier: Apache-2.0
-//
-// Copying, merging, comparing and hashing.
-#include <algorithm>
+#include "messages/runtime/contents.h"
 
-#include "messages/runtime/table_walker.h"
+#include <concepts>
+#include <utility>
+
+#include "messages/runtime/message_internals.h"
+#include "messages/runtime/with_member.h"
 
 namespace probeview {
 
 namespace {
+
+template <typename Type>
+concept Scalar = std::integral<Type>;
+
+// What can be done to a member of each type. Scalars know nothing of their presence: their bits are kept apart.
+
+// Whether there is something, where no bit tells.
+struct Presence {
+  bool operator()(const Scalar auto&) const noexcept { return true; }
+  bool operator()(const PBByteField& field) const noexcept { return field.isPresent(); }
+  bool operator()(const PBMessageField& field) const noexcept { return field.isPresent(); }
+  bool operator()(const PBMessageList& list) const noexcept { return list.count() != 0; }
+  template <typename Number>
+  bool operator()(const PBRepeatedNumber<Number>& list) const noexcept {
+    return list.count() != 0;
+  }
+};
 
 // One reference on the block in which the element lies, for a second holder.
 PBCodable* retained(PBCodable* element) noexcept {
@@ -15,356 +34,206 @@ PBCodable* retained(PBCodable* element) noexcept {
   return element;
 }
 
-constexpr std::uint64_t hashFactor = 0x9E3779B1;
+struct Copy {
+  const Block* home;  // of the target
 
-std::uint64_t hashBytes(std::span<const std::uint8_t> bytes) noexcept {
-  std::uint64_t hash = 0xCBF29CE484222325U;
-  for (const std::uint8_t byte : bytes) hash = (hash ^ byte) * 0x100000001B3U;
-  return hash;
-}
-
-}  // namespace
-
-bool TableWalker::isPresent(const PBCodable& message, const FieldDescriptor& row) noexcept {
-  switch (row.kind) {
-    case FieldKind::UInt64:
-    case FieldKind::UInt32:
-    case FieldKind::Int32:
-    case FieldKind::Enumeration:
-    case FieldKind::SInt32:
-    case FieldKind::Bool:
-      return message.hasBit(row.number);
-    case FieldKind::Bytes:
-    case FieldKind::Text:
-      return (message.*row.member.bytes).isPresent();
-    case FieldKind::Message:
-      return (message.*row.member.message).isPresent();
-    case FieldKind::RepeatedMessage:
-      return (message.*row.member.messages).count() != 0;
-    case FieldKind::RepeatedUInt32:
-      return (message.*row.member.unsigned32List).count() != 0;
-    case FieldKind::RepeatedSInt32:
-      return (message.*row.member.signed32List).count() != 0;
+  template <Scalar Type>
+  void operator()(Type& to, const Type& from) const noexcept {
+    to = from;
   }
-  return false;
-}
-
-namespace {
-
-// The value of a scalar alone; its bit is the caller's.
-void copyScalar(PBCodable& target, const PBCodable& source, const FieldDescriptor& row) noexcept {
-  switch (row.kind) {
-    case FieldKind::UInt64:
-      target.*row.member.unsigned64 = source.*row.member.unsigned64;
-      break;
-    case FieldKind::UInt32:
-      target.*row.member.unsigned32 = source.*row.member.unsigned32;
-      break;
-    case FieldKind::Int32:
-    case FieldKind::Enumeration:
-    case FieldKind::SInt32:
-      target.*row.member.signed32 = source.*row.member.signed32;
-      break;
-    case FieldKind::Bool:
-      target.*row.member.truth = source.*row.member.truth;
-      break;
-    case FieldKind::Bytes:
-    case FieldKind::Text:
-    case FieldKind::Message:
-    case FieldKind::RepeatedMessage:
-    case FieldKind::RepeatedUInt32:
-    case FieldKind::RepeatedSInt32:
-      break;
+  void operator()(PBByteField& to, const PBByteField& from) const { to.set(from.bytes()); }
+  void operator()(PBMessageField& to, const PBMessageField& from) const noexcept {
+    to.setCounted(retained(from.element()), home);
   }
-}
+  void operator()(PBMessageList& to, const PBMessageList& from) const {
+    to.clear();
+    for (std::size_t index = 0; index < from.count(); ++index) to.addCounted(retained(&from[index]), home);
+  }
+  template <typename Number>
+  void operator()(PBRepeatedNumber<Number>& to, const PBRepeatedNumber<Number>& from) const {
+    to.set(from.values());
+  }
+};
 
-}  // namespace
+struct Merge : Copy {
+  const MessageDescriptor* element;  // of the row
 
-void TableWalker::copy(PBCodable& target, const PBCodable& source, const MessageDescriptor& descriptor) {
-  if (&target == &source) return;
-  if (!descriptor.isFlat) target.noteOwnedMemory();
-  for (const FieldDescriptor& row : descriptor.fields()) {
-    if (!isPresent(source, row)) continue;
-    switch (row.kind) {
-      case FieldKind::UInt64:
-      case FieldKind::UInt32:
-      case FieldKind::Int32:
-      case FieldKind::Enumeration:
-      case FieldKind::SInt32:
-      case FieldKind::Bool:
-        copyScalar(target, source, row);
-        target.setBit(row.number);
-        break;
-      case FieldKind::Bytes:
-      case FieldKind::Text:
-        (target.*row.member.bytes).set((source.*row.member.bytes).bytes());
-        break;
-      case FieldKind::Message:
-        (target.*row.member.message).setCounted(retained((source.*row.member.message).element()), target.block_);
-        break;
-      case FieldKind::RepeatedMessage: {
-        const PBMessageList& elements = source.*row.member.messages;
-        PBMessageList& list = target.*row.member.messages;
-        list.clear();
-        for (std::size_t index = 0; index < elements.count(); ++index) {
-          list.addCounted(retained(&elements[index]), target.block_);
-        }
-        break;
-      }
-      case FieldKind::RepeatedUInt32:
-        (target.*row.member.unsigned32List).set((source.*row.member.unsigned32List).values());
-        break;
-      case FieldKind::RepeatedSInt32:
-        (target.*row.member.signed32List).set((source.*row.member.signed32List).values());
-        break;
+  using Copy::operator();
+  void operator()(PBMessageField& to, const PBMessageField& from) const {
+    if (to.isPresent()) {
+      mergeContents(*to.element(), *from.element(), *element);
+    } else {
+      Copy::operator()(to, from);
     }
   }
-}
+  void operator()(PBMessageList& to, const PBMessageList& from) const {
+    // The number of elements is read once: merging a message into itself doubles its lists.
+    const std::size_t count = from.count();
+    for (std::size_t index = 0; index < count; ++index) to.addCounted(retained(&from[index]), home);
+  }
+  template <typename Number>
+  void operator()(PBRepeatedNumber<Number>& to, const PBRepeatedNumber<Number>& from) const {
+    to.append(from.values());
+  }
+};
 
-void TableWalker::copyDeep(PBCodable& target, const PBCodable& source, const MessageDescriptor& descriptor,
-                           Block* block) {
-  if (block == nullptr && !descriptor.isFlat) target.noteOwnedMemory();
-  target._has = source._has;
-  // Without a block for all, each element gets one of its own.
-  const auto copyElement = [block](const PBCodable& element, const MessageDescriptor& elementDescriptor) {
-    Block* elementBlock = block != nullptr ? block : Block::makeFor(elementDescriptor.size);
-    PBCodable* made = makeElement(elementDescriptor, *elementBlock);
-    copyDeep(*made, element, elementDescriptor, block);
+// For a target that is empty.
+struct DeepCopy {
+  const Block* home;                 // of the target
+  Block* block;                      // for all copies; without one each element gets one of its own
+  const MessageDescriptor* element;  // of the row
+
+  template <Scalar Type>
+  void operator()(Type& to, const Type& from) const noexcept {
+    to = from;
+  }
+  void operator()(PBByteField& to, const PBByteField& from) const {
+    if (block != nullptr) {
+      to.set(from.bytes(), *block);
+    } else {
+      to.set(from.bytes());
+    }
+  }
+  void operator()(PBMessageField& to, const PBMessageField& from) const {
+    PBCodable* const made = copied(*from.element());
+    if (block != nullptr) {
+      to.setLocal(made);
+    } else {
+      to.setCounted(made, home);
+    }
+  }
+  void operator()(PBMessageList& to, const PBMessageList& from) const {
+    for (std::size_t index = 0; index < from.count(); ++index) {
+      PBCodable* const made = copied(from[index]);
+      if (block != nullptr) {
+        to.addLocal(made, *block);
+      } else {
+        to.addCounted(made, home);
+      }
+    }
+  }
+  template <typename Number>
+  void operator()(PBRepeatedNumber<Number>& to, const PBRepeatedNumber<Number>& from) const {
+    to.set(from.values(), block);
+  }
+
+  PBCodable* copied(const PBCodable& original) const {
+    Block* const elementBlock = block != nullptr ? block : Block::makeFor(element->size);
+    PBCodable* const made = MessageInternals::makeElement(*element, *elementBlock);
+    copyDeeply(*made, original, *element, block);
     return made;
-  };
-  for (const FieldDescriptor& row : descriptor.fields()) {
-    switch (row.kind) {
-      case FieldKind::UInt64:
-      case FieldKind::UInt32:
-      case FieldKind::Int32:
-      case FieldKind::Enumeration:
-      case FieldKind::SInt32:
-      case FieldKind::Bool:
-        if (source.hasBit(row.number)) copyScalar(target, source, row);
-        break;
-      case FieldKind::Bytes:
-      case FieldKind::Text: {
-        const PBByteField& field = source.*row.member.bytes;
-        if (!field.isPresent()) break;
-        if (block != nullptr) {
-          (target.*row.member.bytes).set(field.bytes(), *block);
-        } else {
-          (target.*row.member.bytes).set(field.bytes());
-        }
-        break;
-      }
-      case FieldKind::Message: {
-        const PBCodable* element = (source.*row.member.message).element();
-        if (element == nullptr) break;
-        PBCodable* made = copyElement(*element, *row.element);
-        if (block != nullptr) {
-          (target.*row.member.message).setLocal(made);
-        } else {
-          (target.*row.member.message).setCounted(made, target.block_);
-        }
-        break;
-      }
-      case FieldKind::RepeatedMessage: {
-        const PBMessageList& elements = source.*row.member.messages;
-        PBMessageList& list = target.*row.member.messages;
-        for (std::size_t index = 0; index < elements.count(); ++index) {
-          PBCodable* made = copyElement(elements[index], *row.element);
-          if (block != nullptr) {
-            list.addLocal(made, *block);
-          } else {
-            list.addCounted(made, target.block_);
-          }
-        }
-        break;
-      }
-      case FieldKind::RepeatedUInt32:
-        (target.*row.member.unsigned32List).set((source.*row.member.unsigned32List).values(), block);
-        break;
-      case FieldKind::RepeatedSInt32:
-        (target.*row.member.signed32List).set((source.*row.member.signed32List).values(), block);
-        break;
+  }
+};
+
+// Of members that are both present.
+struct Equality {
+  const MessageDescriptor* element;  // of the row
+
+  bool operator()(const Scalar auto& one, const Scalar auto& other) const noexcept { return one == other; }
+  bool operator()(const PBByteField& one, const PBByteField& other) const noexcept {
+    return one.text() == other.text();
+  }
+  bool operator()(const PBMessageField& one, const PBMessageField& other) const noexcept {
+    return areEqual(*one.element(), *other.element());
+  }
+  bool operator()(const PBMessageList& one, const PBMessageList& other) const noexcept {
+    bool isEqual = one.count() == other.count();
+    for (std::size_t index = 0; isEqual && index < one.count(); ++index) isEqual = areEqual(one[index], other[index]);
+    return isEqual;
+  }
+  template <typename Number>
+  bool operator()(const PBRepeatedNumber<Number>& one, const PBRepeatedNumber<Number>& other) const noexcept {
+    return one.isEqual(other);
+  }
+
+  bool areEqual(const PBCodable& one, const PBCodable& other) const noexcept {
+    return &one == &other || haveEqualContents(one, other, *element);
+  }
+};
+
+struct Hash {
+  const MessageDescriptor* element;  // of the row
+
+  // Signed numbers are extended to 64 bits.
+  std::uint64_t operator()(const Scalar auto& value) const noexcept {
+    return static_cast<std::uint64_t>(value) * 0x9E3779B1;
+  }
+  std::uint64_t operator()(const PBByteField& field) const noexcept {
+    std::uint64_t hash = 0xCBF29CE484222325U;
+    for (const std::uint8_t byte : field.bytes()) hash = (hash ^ byte) * 0x100000001B3U;
+    return hash;
+  }
+  std::uint64_t operator()(const PBMessageField& field) const noexcept {
+    return hashOfContents(*field.element(), *element);
+  }
+  // The order of the elements counts.
+  std::uint64_t operator()(const PBMessageList& list) const noexcept {
+    std::uint64_t hash = list.count();
+    for (std::size_t index = 0; index < list.count(); ++index) {
+      hash = hash * 0x100000001B3U ^ hashOfContents(list[index], *element);
     }
+    return hash;
+  }
+  template <typename Number>
+  std::uint64_t operator()(const PBRepeatedNumber<Number>& list) const noexcept {
+    return list.hash();
+  }
+};
+
+}  // namespace
+
+bool isPresent(const PBCodable& message, const FieldDescriptor& row) noexcept {
+  if (isScalar(row.kind)) return (MessageInternals::presence(message) >> row.number & 1U) != 0;
+  return withMember(row, Presence{}, message);
+}
+
+void copyContents(PBCodable& target, const PBCodable& source, const MessageDescriptor& descriptor) {
+  if (&target == &source) return;
+  if (!descriptor.isFlat) MessageInternals::noteOwnedMemory(target);
+  for (const FieldDescriptor& row : descriptor.fields()) {
+    if (isPresent(source, row)) withMember(row, Copy{target.block()}, target, source);
+  }
+  MessageInternals::presence(target) |= MessageInternals::presence(source);
+}
+
+void copyDeeply(PBCodable& target, const PBCodable& source, const MessageDescriptor& descriptor, Block* block) {
+  if (block == nullptr && !descriptor.isFlat) MessageInternals::noteOwnedMemory(target);
+  for (const FieldDescriptor& row : descriptor.fields()) {
+    if (isPresent(source, row)) withMember(row, DeepCopy{target.block(), block, row.element}, target, source);
+  }
+  MessageInternals::presence(target) = MessageInternals::presence(source);
+}
+
+void moveContents(PBCodable& target, PBCodable& source, const MessageDescriptor& descriptor) noexcept {
+  MessageInternals::presence(target) = std::exchange(MessageInternals::presence(source), 0);
+  std::swap(MessageInternals::block(target), MessageInternals::block(source));
+  for (const FieldDescriptor& row : descriptor.fields()) {
+    withMember(
+        row, [](auto& to, auto& from) noexcept { to = std::move(from); }, target, source);
   }
 }
 
-void TableWalker::move(PBCodable& target, PBCodable& source, const MessageDescriptor& descriptor) noexcept {
-  target._has = std::exchange(source._has, 0);
-  std::swap(target.block_, source.block_);
+void mergeContents(PBCodable& target, const PBCodable& source, const MessageDescriptor& descriptor) {
+  if (!descriptor.isFlat) MessageInternals::noteOwnedMemory(target);
   for (const FieldDescriptor& row : descriptor.fields()) {
-    switch (row.kind) {
-      case FieldKind::UInt64:
-      case FieldKind::UInt32:
-      case FieldKind::Int32:
-      case FieldKind::Enumeration:
-      case FieldKind::SInt32:
-      case FieldKind::Bool:
-        copyScalar(target, source, row);
-        break;
-      case FieldKind::Bytes:
-      case FieldKind::Text:
-        target.*row.member.bytes = std::move(source.*row.member.bytes);
-        break;
-      case FieldKind::Message:
-        target.*row.member.message = std::move(source.*row.member.message);
-        break;
-      case FieldKind::RepeatedMessage:
-        target.*row.member.messages = std::move(source.*row.member.messages);
-        break;
-      case FieldKind::RepeatedUInt32:
-        target.*row.member.unsigned32List = std::move(source.*row.member.unsigned32List);
-        break;
-      case FieldKind::RepeatedSInt32:
-        target.*row.member.signed32List = std::move(source.*row.member.signed32List);
-        break;
-    }
+    if (isPresent(source, row)) withMember(row, Merge{{target.block()}, row.element}, target, source);
   }
+  MessageInternals::presence(target) |= MessageInternals::presence(source);
 }
 
-void TableWalker::merge(PBCodable& target, const PBCodable& source, const MessageDescriptor& descriptor) {
-  if (!descriptor.isFlat) target.noteOwnedMemory();
+bool haveEqualContents(const PBCodable& left, const PBCodable& right, const MessageDescriptor& descriptor) noexcept {
   for (const FieldDescriptor& row : descriptor.fields()) {
-    if (!isPresent(source, row)) continue;
-    switch (row.kind) {
-      case FieldKind::UInt64:
-      case FieldKind::UInt32:
-      case FieldKind::Int32:
-      case FieldKind::Enumeration:
-      case FieldKind::SInt32:
-      case FieldKind::Bool:
-        copyScalar(target, source, row);
-        target.setBit(row.number);
-        break;
-      case FieldKind::Bytes:
-      case FieldKind::Text:
-        (target.*row.member.bytes).set((source.*row.member.bytes).bytes());
-        break;
-      case FieldKind::Message: {
-        PBMessageField& field = target.*row.member.message;
-        PBCodable* element = (source.*row.member.message).element();
-        if (field.isPresent()) {
-          merge(*field.element(), *element, *row.element);
-        } else {
-          field.setCounted(retained(element), target.block_);
-        }
-        break;
-      }
-      case FieldKind::RepeatedMessage: {
-        const PBMessageList& elements = source.*row.member.messages;
-        PBMessageList& list = target.*row.member.messages;
-        // The number of elements is read once: merging a message into itself doubles its lists.
-        const std::size_t count = elements.count();
-        for (std::size_t index = 0; index < count; ++index) {
-          list.addCounted(retained(&elements[index]), target.block_);
-        }
-        break;
-      }
-      case FieldKind::RepeatedUInt32:
-        (target.*row.member.unsigned32List).append((source.*row.member.unsigned32List).values());
-        break;
-      case FieldKind::RepeatedSInt32:
-        (target.*row.member.signed32List).append((source.*row.member.signed32List).values());
-        break;
-    }
-  }
-}
-
-bool TableWalker::areEqual(const PBCodable& left, const PBCodable& right,
-                           const MessageDescriptor& descriptor) noexcept {
-  if (left._has != right._has) return false;
-  for (const FieldDescriptor& row : descriptor.fields()) {
-    bool isEqual = true;
-    switch (row.kind) {
-      case FieldKind::UInt64:
-        isEqual = !left.hasBit(row.number) || left.*row.member.unsigned64 == right.*row.member.unsigned64;
-        break;
-      case FieldKind::UInt32:
-        isEqual = !left.hasBit(row.number) || left.*row.member.unsigned32 == right.*row.member.unsigned32;
-        break;
-      case FieldKind::Int32:
-      case FieldKind::Enumeration:
-      case FieldKind::SInt32:
-        isEqual = !left.hasBit(row.number) || left.*row.member.signed32 == right.*row.member.signed32;
-        break;
-      case FieldKind::Bool:
-        isEqual = !left.hasBit(row.number) || left.*row.member.truth == right.*row.member.truth;
-        break;
-      case FieldKind::Bytes:
-      case FieldKind::Text: {
-        const PBByteField& one = left.*row.member.bytes;
-        const PBByteField& other = right.*row.member.bytes;
-        isEqual = one.isPresent() == other.isPresent() && one.text() == other.text();
-        break;
-      }
-      case FieldKind::Message: {
-        const PBCodable* one = (left.*row.member.message).element();
-        const PBCodable* other = (right.*row.member.message).element();
-        isEqual = one == other || (one != nullptr && other != nullptr && areEqual(*one, *other, *row.element));
-        break;
-      }
-      case FieldKind::RepeatedMessage: {
-        const PBMessageList& one = left.*row.member.messages;
-        const PBMessageList& other = right.*row.member.messages;
-        isEqual = one.count() == other.count();
-        for (std::size_t index = 0; isEqual && index < one.count(); ++index) {
-          isEqual = &one[index] == &other[index] || areEqual(one[index], other[index], *row.element);
-        }
-        break;
-      }
-      case FieldKind::RepeatedUInt32:
-        isEqual = (left.*row.member.unsigned32List).isEqual(right.*row.member.unsigned32List);
-        break;
-      case FieldKind::RepeatedSInt32:
-        isEqual = (left.*row.member.signed32List).isEqual(right.*row.member.signed32List);
-        break;
-    }
-    if (!isEqual) return false;
+    const bool isThere = isPresent(left, row);
+    if (isThere != isPresent(right, row)) return false;
+    if (isThere && !withMember(row, Equality{row.element}, left, right)) return false;
   }
   return true;
 }
 
-std::uint64_t TableWalker::hash(const PBCodable& message, const MessageDescriptor& descriptor) noexcept {
+std::uint64_t hashOfContents(const PBCodable& message, const MessageDescriptor& descriptor) noexcept {
   std::uint64_t hash = 0;
   for (const FieldDescriptor& row : descriptor.fields()) {
-    if (!isPresent(message, row)) continue;
-    switch (row.kind) {
-      case FieldKind::UInt64:
-        hash ^= message.*row.member.unsigned64 * hashFactor;
-        break;
-      case FieldKind::UInt32:
-        hash ^= message.*row.member.unsigned32 * hashFactor;
-        break;
-      case FieldKind::Int32:
-      case FieldKind::Enumeration:
-      case FieldKind::SInt32:
-        hash ^= static_cast<std::uint64_t>(std::int64_t{message.*row.member.signed32}) * hashFactor;
-        break;
-      case FieldKind::Bool:
-        hash ^= (message.*row.member.truth ? 1U : 0U) * hashFactor;
-        break;
-      case FieldKind::Bytes:
-      case FieldKind::Text:
-        hash ^= hashBytes((message.*row.member.bytes).bytes());
-        break;
-      case FieldKind::Message:
-        hash ^= TableWalker::hash(*(message.*row.member.message).element(), *row.element);
-        break;
-      case FieldKind::RepeatedMessage: {
-        const PBMessageList& list = message.*row.member.messages;
-        // The order of the elements counts.
-        std::uint64_t listHash = list.count();
-        for (std::size_t index = 0; index < list.count(); ++index) {
-          listHash = listHash * 0x100000001B3U ^ TableWalker::hash(list[index], *row.element);
-        }
-        hash ^= listHash;
-        break;
-      }
-      case FieldKind::RepeatedUInt32:
-        hash ^= (message.*row.member.unsigned32List).hash();
-        break;
-      case FieldKind::RepeatedSInt32:
-        hash ^= (message.*row.member.signed32List).hash();
-        break;
-    }
+    if (isPresent(message, row)) hash ^= withMember(row, Hash{row.element}, message);
   }
   return hash;
 }

@@ -14,6 +14,8 @@
 
 namespace probeview {
 
+class PBCodable;
+
 class PBDataReader {
  public:
   // The payload must outlive the reader. What decoding has to say ("valid metricId tag", "Unknown tag: 13:7") goes to
@@ -37,7 +39,7 @@ class PBDataReader {
   std::uint64_t readVarint() noexcept;
 
  private:
-  friend struct TableWalker;
+  friend class PBCodable;
   friend struct PBReaderOperations;
 
   // No data has an address too: null means failure wherever a position is returned.

@@ -9,7 +9,7 @@
 #include <string_view>
 #include <utility>
 
-#include "messages/runtime/codable.h"
+#include "messages/runtime/message_internals.h"
 #include "values/dictionary.h"
 
 namespace probeview {
@@ -30,7 +30,7 @@ struct DictionaryOf {
   template <std::size_t... Indices>
   [[gnu::always_inline]] static void addAll(Dictionary& dictionary, const PBCodable& message,
                                             std::index_sequence<Indices...>) {
-    const std::uint64_t presence = message._has;
+    const std::uint64_t presence = MessageInternals::presence(message);
     Dictionary::Filler entries(dictionary, sizeof...(Indices));
     (add<Indices>(entries, message, presence), ...);
   }

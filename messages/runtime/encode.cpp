@@ -1,9 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
-#include <bit>
-#include <cstring>
+#include "messages/runtime/encode.h"
 
-#include "messages/runtime/field_run.h"
-#include "messages/runtime/table_walker.h"
+#include <cstring>
 
 namespace probeview {
 
@@ -21,7 +19,7 @@ inline std::uint8_t* writeUpToEightBytes(std::uint8_t* out, std::uint64_t value)
   bytes += (bytes & 0x0FFFC0000FFFC000U) * 3;
   bytes += bytes & 0x3F803F803F803F80U;
   const std::size_t size = wire::varintSize(value);
-  FieldRun::writeWord(out, bytes | (0x8080808080808080U & ((std::uint64_t{1} << 8 * (size - 1)) - 1)));
+  wire::writeWord(out, bytes | (0x8080808080808080U & ((std::uint64_t{1} << 8 * (size - 1)) - 1)));
   return out + size;
 }
 
@@ -37,19 +35,17 @@ std::uint8_t* writeKey(std::uint8_t* out, std::uint32_t key) noexcept {
 
 }  // namespace
 
-std::uint8_t* FieldRun::writeLongValue(std::uint8_t* out, std::uint64_t value) noexcept {
+std::uint8_t* writeLongValue(std::uint8_t* out, std::uint64_t value) noexcept {
   return value < std::uint64_t{1} << 56 ? writeUpToEightBytes(out, value) : wire::writeVarint(out, value);
 }
 
-void PBCodable::writeTo(PBDataWriter& writer) const { TableWalker::encode(*this, writer); }
-
-void TableWalker::encode(const PBCodable& message, PBDataWriter& writer) {
-  const MessageDescriptor& descriptor = message.descriptor();
-  writer.commit(descriptor.encodeFields(message, writer.reserve(descriptor.scalarBound), writer));
+void PBCodable::writeTo(PBDataWriter& writer) const {
+  const MessageDescriptor& fields = descriptor();
+  writer.commit(fields.encodeFields(*this, writer.reserve(fields.scalarBound), writer));
 }
 
-std::uint8_t* FieldRun::encodeBytes(std::span<const std::uint8_t> bytes, std::uint32_t key, std::uint8_t* out,
-                                    std::size_t room, PBDataWriter& writer) {
+std::uint8_t* encodeBytes(std::span<const std::uint8_t> bytes, std::uint32_t key, std::uint8_t* out, std::size_t room,
+                          PBDataWriter& writer) {
   out = writeKey(writer.reserve(out, recordHeadBound + bytes.size() + room), key);
   out = wire::writeVarint(out, bytes.size());
   std::memcpy(out, bytes.data(), bytes.size());
@@ -81,13 +77,13 @@ std::uint8_t* encodePacked(std::span<const Number> numbers, std::uint32_t key, s
 
 }  // namespace
 
-std::uint8_t* FieldRun::encodeElement(const PBCodable& element, const FieldDescriptor& row, std::uint8_t* out,
-                                      std::size_t room, PBDataWriter& writer) {
+std::uint8_t* encodeElement(const PBCodable& element, const FieldDescriptor& row, std::uint8_t* out, std::size_t room,
+                            PBDataWriter& writer) {
   return writer.reserve(encodeRecord(element, row, out, writer), room);
 }
 
-std::uint8_t* FieldRun::encodeElements(const PBMessageList& list, const FieldDescriptor& row, std::uint8_t* out,
-                                       std::size_t room, PBDataWriter& writer) {
+std::uint8_t* encodeElements(const PBMessageList& list, const FieldDescriptor& row, std::uint8_t* out, std::size_t room,
+                             PBDataWriter& writer) {
   const ElementPointer* const end = list.elements() + list.count();
   for (const ElementPointer* element = list.elements(); element != end; ++element) {
     out = encodeRecord(*element->get(), row, out, writer);
@@ -95,13 +91,13 @@ std::uint8_t* FieldRun::encodeElements(const PBMessageList& list, const FieldDes
   return writer.reserve(out, room);
 }
 
-std::uint8_t* FieldRun::encodeNumbers(const PBRepeatedUInt32& list, std::uint32_t key, std::uint8_t* out,
-                                      std::size_t room, PBDataWriter& writer) {
+std::uint8_t* encodeNumbers(const PBRepeatedUInt32& list, std::uint32_t key, std::uint8_t* out, std::size_t room,
+                            PBDataWriter& writer) {
   return encodePacked(list.values(), key, out, room, writer, [](std::uint32_t number) { return number; });
 }
 
-std::uint8_t* FieldRun::encodeNumbers(const PBRepeatedInt32& list, std::uint32_t key, std::uint8_t* out,
-                                      std::size_t room, PBDataWriter& writer) {
+std::uint8_t* encodeNumbers(const PBRepeatedInt32& list, std::uint32_t key, std::uint8_t* out, std::size_t room,
+                            PBDataWriter& writer) {
   return encodePacked(list.values(), key, out, room, writer, wire::zigZag);
 }
 

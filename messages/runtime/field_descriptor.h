@@ -15,7 +15,6 @@
 #include "messages/runtime/field_meaning.h"
 #include "messages/runtime/message_list.h"
 #include "messages/runtime/repeated_scalar.h"
-#include "messages/runtime/wire_format.h"
 
 namespace probeview {
 
@@ -68,14 +67,11 @@ union FieldMember {
   PBRepeatedInt32 PBCodable::*signed32List;
 };
 
-// A field that is not to be decoded expects this key, which is that of an end of group and is met before any field.
-inline constexpr std::uint32_t neverExpected = static_cast<std::uint32_t>(wire::WireType::EndGroup);
-
 struct FieldDescriptor {
-  std::uint32_t key = 0;                      // as it stands on the wire: number and wire type
-  std::uint32_t expectedKey = neverExpected;  // the same where the field is to be decoded
+  std::uint32_t key = 0;  // as it stands on the wire: number and wire type
   std::uint16_t number = 0;
   FieldKind kind = FieldKind::UInt64;
+  bool isDecoded = false;  // not: what comes under this number is dropped
   FieldMember member;
   // The key in the dictionary form, such as tx_power_info. It lies in memory as it is printed: "tx_power_info": with
   // the quotation marks, the colon and the blank around it.
@@ -83,33 +79,6 @@ struct FieldDescriptor {
   const EnumerationTable* enumeration = nullptr;  // of an enumeration
   const MessageDescriptor* element = nullptr;     // of a nested message, single or repeated
 };
-
-// The part of a row that decoding a scalar needs where the straight-line code has stopped: short, so that the rows of
-// most messages lie in a few cache lines. There is one for each row, in the same order.
-struct ScalarRow {
-  // Stands where there is no such key: no one or two bytes make it.
-  static constexpr std::uint32_t none = 0xFFFFFFFF;
-
-  FieldMember member;
-  std::uint64_t hasBit = 0;  // 0 where the field is no scalar
-  // The keys that are expected, of one byte or of two, the first one in the low bits.
-  std::uint32_t shortKey = none;
-  std::uint32_t longKey = none;
-  FieldKind kind = FieldKind::RepeatedMessage;
-};
-
-// How far a record has been decoded, and which field is expected next.
-struct DecodingProgress {
-  const std::uint8_t* position;
-  const ScalarRow* expected;
-};
-
-// How many bytes before the payload's end the tail begins, which is read with care: a key of two bytes and a value of
-// two fit before it.
-inline constexpr std::size_t decodingTailSize = 3;
-
-// How many bytes more than it needs the last scalar may write over when it is written as a word of eight bytes.
-inline constexpr std::uint16_t wordSlack = 7;
 
 // Whether whatever bears that number is dropped when a message of that class is decoded; says so to the log if there is
 // one.
@@ -120,18 +89,20 @@ inline constexpr std::uint16_t fieldNumberLimit = 64;
 
 struct MessageDescriptor {
   std::string_view name;  // such as "KCellularLteTxPower"
-  // In ascending order of their numbers; one that is never met stands after the last.
+  // In ascending order of their numbers; one that is no field stands after the last.
   const FieldDescriptor* rows;
-  const ScalarRow* scalars;
   std::uint16_t rowCount;
   // Where the field of that number stands in the rows; rowCount when there is none.
   std::array<std::uint8_t, fieldNumberLimit> rowOfNumber;
   std::uint16_t scalarBound;  // bytes that must be free to write all scalars of one message
   bool isFlat;                // scalars only: nothing that owns memory
   std::size_t size;           // bytes of an object
-  // Straight-line code for the fields in their order (field_run.h).
-  DecodingProgress (*decodeInOrder)(PBCodable& message, const std::uint8_t* position, const std::uint8_t* limit,
-                                    Decoding& decoding);
+  // decode.h
+  const std::uint8_t* (*decodeRecord)(PBCodable& message, const std::uint8_t* position, const std::uint8_t* limit,
+                                      Decoding& decoding);
+  const std::uint8_t* (*decodeElements)(PBMessageList& list, std::uint16_t keyBytes, const std::uint8_t* position,
+                                        const std::uint8_t* limit, Decoding& decoding);
+  // encode.h
   std::uint8_t* (*encodeFields)(const PBCodable& message, std::uint8_t* out, PBDataWriter& writer);
   // The dictionary form (dictionary.h).
   Dictionary (*dictionary)(const PBCodable& message);
@@ -146,11 +117,14 @@ struct MessageDescriptor {
 
   std::span<const FieldDescriptor> fields() const noexcept { return {rows, rowCount}; }
   const FieldMeaning& meaningOf(const FieldDescriptor& row) const noexcept { return meanings[&row - rows]; }
+  // The row behind the last when there is no such field.
+  const FieldDescriptor& rowOf(std::uint64_t number) const noexcept {
+    return rows[number < fieldNumberLimit ? rowOfNumber[number] : rowCount];
+  }
   // Null when there is no such field.
   const FieldDescriptor* field(std::uint64_t number) const noexcept {
-    if (number >= fieldNumberLimit) return nullptr;
-    const std::uint8_t row = rowOfNumber[number];
-    return row < rowCount ? &rows[row] : nullptr;
+    const FieldDescriptor& row = rowOf(number);
+    return &row < rows + rowCount ? &row : nullptr;
   }
   const FieldDescriptor* fieldNamed(std::string_view fieldName) const noexcept {
     for (const FieldDescriptor& candidate : fields()) {

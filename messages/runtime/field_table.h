@@ -38,9 +38,10 @@
 #include <span>
 
 #include "messages/runtime/codable.h"
+#include "messages/runtime/decode_in_order.h"
 #include "messages/runtime/dictionary.h"
+#include "messages/runtime/encode.h"
 #include "messages/runtime/field_meaning.h"
-#include "messages/runtime/field_run.h"
 
 namespace probeview {
 
@@ -111,32 +112,13 @@ consteval auto collectFields() {
   [&]<std::size_t... Numbers>(std::index_sequence<Numbers...>) { (collect.template operator()<Numbers>(), ...); }
   (std::make_index_sequence<fieldNumberLimit>{});
   for (FieldDescriptor& row : rows) {
-    if (row.key != 0 && !drops(row.number, {}, nullptr)) row.expectedKey = row.key;
+    row.isDecoded = row.key != 0 && !drops(row.number, {}, nullptr);
   }
   return rows;
 }
 
 template <typename Message, DropRule* drops>
 inline constexpr auto fieldRows = collectFields<Message, drops>();
-
-template <const auto& rows>
-consteval auto collectScalars() {
-  std::array<ScalarRow, rows.size()> scalars;
-  for (std::size_t index = 0; index + 1 < scalars.size(); ++index) {
-    const FieldDescriptor& row = rows[index];
-    ScalarRow& scalar = scalars[index];
-    scalar.kind = row.kind;
-    if (!isScalar(row.kind)) continue;
-    const bool isShort = row.key < 0x80;
-    scalar.member = row.member;
-    scalar.hasBit = std::uint64_t{1} << row.number;
-    if (row.expectedKey != neverExpected) (isShort ? scalar.shortKey : scalar.longKey) = FieldRun::keyBytes(row.key);
-  }
-  return scalars;
-}
-
-template <const auto& rows>
-inline constexpr auto scalarRows = collectScalars<rows>();
 
 // In the order of the rows. Those of a table that is not published are empty.
 template <typename Message>
@@ -166,10 +148,9 @@ consteval MessageDescriptor describeMessage(std::string_view name) {
   MessageDescriptor descriptor{};
   descriptor.name = name;
   descriptor.rows = rows.data();
-  descriptor.scalars = scalarRows<rows>.data();
   descriptor.rowCount = count;
   descriptor.rowOfNumber.fill(count);
-  descriptor.scalarBound = FieldRun::roomFrom<rows>(0);
+  descriptor.scalarBound = EncoderOf<rows>::roomFrom(0);
   descriptor.isFlat = true;
   for (std::size_t index = 0; index < count; ++index) {
     const FieldDescriptor& row = rows[index];
@@ -177,8 +158,9 @@ consteval MessageDescriptor describeMessage(std::string_view name) {
     if (!isScalar(row.kind)) descriptor.isFlat = false;
   }
   descriptor.size = sizeof(Message);
-  descriptor.decodeInOrder = FieldRun::decode<rows, scalarRows<rows>>;
-  descriptor.encodeFields = FieldRun::encode<rows>;
+  descriptor.decodeRecord = DecoderOf<Message, rows>::decodeRecord;
+  descriptor.decodeElements = DecoderOf<Message, rows>::decodeElements;
+  descriptor.encodeFields = EncoderOf<rows>::encodeFields;
   descriptor.dictionary = DictionaryOf<rows>::make;
   descriptor.makeElement = [](void* memory, Block& block) -> PBCodable* { return Message::make(memory, block); };
   descriptor.make = []() -> std::unique_ptr<PBCodable> { return std::make_unique<Message>(); };

@@ -126,7 +126,9 @@ class PBMessageField {
     std::swap(element_, other.element_);
     return *this;
   }
-  ~PBMessageField() { clear(); }
+  ~PBMessageField() {
+    if (ownsMemory()) clear();
+  }
 
   PBCodable* element() const noexcept { return element_.get(); }
   bool isPresent() const noexcept { return element() != nullptr; }
@@ -136,7 +138,10 @@ class PBMessageField {
   // that this place belongs to, if it has one.
   void setCounted(PBCodable* element, const Block* home) noexcept;
   // The element lies in the home of this place.
-  void setLocal(PBCodable* element) noexcept;
+  void setLocal(PBCodable* element) noexcept {
+    if (ownsMemory()) clear();
+    element_ = ElementPointer::local(element);
+  }
 
  private:
   ElementPointer element_;
@@ -169,7 +174,14 @@ class PBMessageList {
   void addCounted(PBCodable* element, const Block* home);
   // The element lies in the home of this list.
   void addLocal(PBCodable* element, Block& home) {
-    if (count_ == capacity_) grow(&home);
+    if (count_ == capacity_) {
+      if (capacity_ == 0) {
+        elements_ = static_cast<ElementPointer*>(home.allocate(firstCapacity * sizeof(ElementPointer)));
+        capacity_ = firstCapacity;
+      } else {
+        grow(&home);
+      }
+    }
     elements_[count_++] = ElementPointer::local(element);
   }
   void clear() noexcept;
@@ -178,6 +190,8 @@ class PBMessageList {
   void swap(PBMessageList& other) noexcept;
 
  private:
+  static constexpr std::uint32_t firstCapacity = 8;
+
   void grow(Block* home);
 
   ElementPointer* elements_ = nullptr;

@@ -26,12 +26,39 @@ constexpr std::uint32_t key(std::uint32_t fieldNumber, WireType type) noexcept {
   return fieldNumber << 3 | static_cast<std::uint32_t>(type);
 }
 
+// The bytes of a key of one byte or two, the first one in the low bits.
+constexpr std::uint16_t keyBytes(std::uint32_t key) noexcept {
+  return static_cast<std::uint16_t>(key < 0x80 ? key : (key & 0x7F) | 0x80 | key >> 7 << 8);
+}
+
 constexpr std::uint32_t zigZag(std::int32_t value) noexcept {
   return static_cast<std::uint32_t>(value) << 1 ^ static_cast<std::uint32_t>(value >> 31);
 }
 
 constexpr std::int32_t unZigZag(std::uint32_t value) noexcept {
   return static_cast<std::int32_t>(value >> 1 ^ (0U - (value & 1U)));
+}
+
+// A word from its bytes, those in the low bits first.
+template <typename Word>
+[[gnu::always_inline]] inline Word readWord(const std::uint8_t* position) noexcept {
+  Word word = 0;
+  if constexpr (std::endian::native == std::endian::little) {
+    std::memcpy(&word, position, sizeof word);
+  } else {
+    for (std::size_t index = sizeof word; index > 0; --index) word = static_cast<Word>(word << 8 | position[index - 1]);
+  }
+  return word;
+}
+
+// The bytes of a word, those in the low bits first.
+template <typename Word>
+[[gnu::always_inline]] inline void writeWord(std::uint8_t* out, Word word) noexcept {
+  if constexpr (std::endian::native == std::endian::little) {
+    std::memcpy(out, &word, sizeof word);
+  } else {
+    for (std::size_t index = 0; index < sizeof word; ++index) out[index] = static_cast<std::uint8_t>(word >> 8 * index);
+  }
 }
 
 // A varint and the position behind it; null, and the value 0, when the data ends inside it.
@@ -45,12 +72,7 @@ Varint readLongVarint(const std::uint8_t* position, const std::uint8_t* limit) n
 
 // A varint of at most eight bytes, read at once; null when it is longer. Eight bytes must be readable.
 inline Varint readUpToEightBytes(const std::uint8_t* position) noexcept {
-  std::uint64_t bits = 0;
-  if constexpr (std::endian::native == std::endian::little) {
-    std::memcpy(&bits, position, sizeof bits);
-  } else {
-    for (int index = 7; index >= 0; --index) bits = bits << 8 | position[index];
-  }
+  auto bits = readWord<std::uint64_t>(position);
   // The first byte whose top bit is clear is the last one; what lies above it belongs to others.
   const std::uint64_t ends = ~bits & 0x8080808080808080U;
   if (ends == 0) return {nullptr, 0};

@@ -3,6 +3,7 @@
 // How payloads are read, sentence by sentence. Wire bytes stand with their meaning beside them.
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <limits>
 #include <string>
 
@@ -493,6 +494,33 @@ TEST(Decoding, ManyElementsNeedNoMoreMemoryThanTheyAreLong) {
   ASSERT_TRUE(decode(message, writer.bytes()));
   EXPECT_EQ(message.txPowerInfosCount(), 50000U);
   EXPECT_EQ(encoded(message), Bytes(writer.bytes().begin(), writer.bytes().end()));
+}
+
+TEST(Decoding, WhatWasDecodedOutlivesThePayload) {
+  Bytes payload = bytesOf("12 07 08 01 12 03 aabbcc");
+  KCellularSimCardFiles files;
+  ASSERT_TRUE(decode(files, payload));
+  std::fill(payload.begin(), payload.end(), std::uint8_t{0});
+  payload = {};
+  EXPECT_EQ(shown(files), R"(["ef_list": [["ef_id": 1, "content": <aabbcc>]]])");
+}
+
+TEST(Decoding, ScalarsAreReadTheSameHoweverLongThePayloadIs) {
+  for (std::size_t unknown = 230; unknown < 270; ++unknown) {
+    PBDataWriter writer;
+    PBDataWriterWriteUint64Field(writer, 5, 1);
+    PBDataWriterWriteDataField(writer, Bytes(unknown, 0x08), 40);
+    PBDataWriterWriteUint32Field(writer, 300, 4);
+    const std::span<const std::uint8_t> payload = writer.bytes();
+    KCellularLteRrcState message;
+    PBDataReader reader(payload);
+    ASSERT_TRUE(message.readFrom(reader)) << unknown;
+    EXPECT_EQ(reader.position(), payload.size());
+    EXPECT_EQ(shown(message), R"(["timestamp": 5, "prev_state_dur_ms": 300])");
+    KCellularLteRrcState cut;
+    EXPECT_FALSE(decode(cut, payload.first(payload.size() - 1))) << unknown;
+    EXPECT_EQ(shown(cut), R"(["timestamp": 5, "prev_state_dur_ms": 0])");
+  }
 }
 
 }  // namespace
