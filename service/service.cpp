@@ -71,7 +71,8 @@ PushedConfiguration readConfiguration(const Dictionary& arguments, ServiceLog& l
   std::string message;
   for (const std::string& note : notesToTell(result.configuration->notes)) {
     log.write(LogLevel::Info, "the configuration of " + who + ": " + note);
-    message += (message.empty() ? "" : "; ") + note;
+    if (!message.empty()) message += "; ";
+    message += note;
   }
   return {std::move(result.configuration), answer(Status::Ok, message)};
 }

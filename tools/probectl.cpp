@@ -74,6 +74,7 @@ std::string unknownSubcommand(const Command& program, std::span<const std::strin
     const auto found = std::ranges::find(subcommands, word, &Command::name);
     if (found == subcommands.end()) {
       std::vector<std::string> names;
+      names.reserve(subcommands.size());
       for (const Command& each : subcommands) names.push_back(each.name());
       const std::string near = didYouMean(word, std::vector<std::string_view>(names.begin(), names.end()));
       return "probectl: there is no subcommand " + quotedExcerpt(word) + (near.empty() ? ";" : near) + " '" + path +

@@ -45,7 +45,8 @@ ExitStatus query(const QueryOptions& options, Tool& tool) {
   Dictionary reply;
   const ExitStatus status = client.perform(radix::kCommandQueryMetric, arguments, &reply);
   if (status != ExitStatus::Success) return status;
-  if (const Value* asked = reply.find("metrics"); asked != nullptr && asked->list() && !asked->list()->empty()) {
+  if (const Value* asked = reply.find("metrics");
+      asked != nullptr && asked->list() != nullptr && !asked->list()->empty()) {
     wanted = (*asked->list())[0].int64().value_or(wanted);
   }
   if (!client.loop().runUntil([&answer] { return answer.has_value(); }, answerDeadline)) {
