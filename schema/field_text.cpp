@@ -113,7 +113,7 @@ std::string meaningText(const MessageDescriptor& message, const FieldDescriptor&
 }
 
 std::string viewerText(const MessageDescriptor& message, const FieldDescriptor& field) {
-  if (field.expectedKey == neverExpected) {
+  if (!field.isDecoded) {
     return "never there: the field number is that of a metric and decoding drops it";
   }
   const FieldMeaning& meaning = message.meaningOf(field);
