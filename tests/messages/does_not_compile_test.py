@@ -38,14 +38,14 @@ def compiled(source, row):
 
 class MadeUpMetric(unittest.TestCase):
     IDENTIFIERS = "messages/metric_identifiers.cpp"
-    TAGS = "messages/metric_utility.cpp"
+    TAG_TABLE = "messages/metric_utility.cpp"
     DICTIONARIES = "store/handlers.cpp"
 
     def row(self, identifier, *, place=PLACES, tag=TAGS):
         return f"METRIC(K_LTE_MADE_UP, {identifier}, KCellularLteRrcState, myLTEMadeUpDict, {place}, {tag})"
 
     def test_a_number_that_no_field_has_compiles(self):
-        for source in (self.IDENTIFIERS, self.TAGS, self.DICTIONARIES):
+        for source in (self.IDENTIFIERS, self.TAG_TABLE, self.DICTIONARIES):
             self.assertEqual(compiled(source, self.row("0x3CD3FF")), "")
 
     def test_the_number_of_a_field_does_not_compile(self):
@@ -54,12 +54,12 @@ class MadeUpMetric(unittest.TestCase):
                           compiled(self.IDENTIFIERS, self.row(identifier)))
 
     def test_the_number_of_another_metric_does_not_compile(self):
-        self.assertIn("two metrics share their low 16 bits", compiled(self.TAGS, self.row("0x3DD30E")))
+        self.assertIn("two metrics share their low 16 bits", compiled(self.TAG_TABLE, self.row("0x3DD30E")))
 
     def test_a_tags_place_that_is_taken_or_lies_behind_a_free_one_does_not_compile(self):
-        self.assertIn("a place is taken twice", compiled(self.TAGS, self.row("0x3CD3FF", tag=3)))
+        self.assertIn("a place is taken twice", compiled(self.TAG_TABLE, self.row("0x3CD3FF", tag=3)))
         self.assertIn("a place lies behind one that is free",
-                      compiled(self.TAGS, self.row("0x3CD3FF", tag=TAGS + 1)))
+                      compiled(self.TAG_TABLE, self.row("0x3CD3FF", tag=TAGS + 1)))
 
     def test_a_dictionarys_place_that_is_taken_or_lies_behind_a_free_one_does_not_compile(self):
         self.assertNotEqual(compiled(self.DICTIONARIES, self.row("0x3CD3FF", place=3)), "")
