@@ -130,7 +130,7 @@ const std::vector<PayloadSet>& payloadSets() {
       single("c", "`KCellularWcdmaNbrCellMeas`, 8 + 8 + 8", "KCellularWcdmaNbrCellMeas", {8, 0, false}),
       single("d", "`KCellularSimCardFiles`, 40 files of 100 bytes", "KCellularSimCardFiles", {40, 100, false}),
       single("e", "`KCellularGsmIdleConfig`", "KCellularGsmIdleConfig", {0, 0, false}),
-      mixed("f", "the mixed stream of all 29 kinds, lists of 2", {2, 8, false}),
+      mixed("f", "the mixed stream of all kinds, lists of 2", {2, 8, false}),
       mixed("r", "the mixed stream, fields in reversed order", {2, 8, true}),
   };
   return sets;

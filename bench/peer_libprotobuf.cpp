@@ -5,7 +5,6 @@
 #include <google/protobuf/text_format.h>
 
 #include "bench/case.h"
-#include "bench/classes.h"
 #include "gsm.pb.h"
 #include "lte.pb.h"
 #include "nas.pb.h"
@@ -31,18 +30,16 @@ void decodeFresh(const Payload& payload) {
 }
 
 Run decoderOf(std::string_view name) {
-#define CLASS(Class) \
+#define METRIC(constant, identifier, Class, ...) \
   if (name == #Class) return decodeFresh<peer::Class>;
-  BENCH_CLASSES(CLASS)
-#undef CLASS
+#include "messages/metrics.inc"
   return nullptr;
 }
 
 std::unique_ptr<Peer> makePeer(std::string_view name) {
-#define CLASS(Class) \
+#define METRIC(constant, identifier, Class, ...) \
   if (name == #Class) return std::make_unique<peer::Class>();
-  BENCH_CLASSES(CLASS)
-#undef CLASS
+#include "messages/metrics.inc"
   return nullptr;
 }
 

@@ -3,7 +3,6 @@
 #include <pb_encode.h>
 
 #include "bench/case.h"
-#include "bench/classes.h"
 #include "gsm_nano.pb.h"
 #include "lte_nano.pb.h"
 #include "nas_nano.pb.h"
@@ -19,10 +18,9 @@ struct Kind {
 };
 
 Kind kindOf(std::string_view name) {
-#define CLASS(Class) \
+#define METRIC(constant, identifier, Class, ...) \
   if (name == #Class) return {cellular_metrics_##Class##_fields, sizeof(cellular_metrics_##Class)};
-  BENCH_CLASSES(CLASS)
-#undef CLASS
+#include "messages/metrics.inc"
   return {};
 }
 

@@ -1,6 +1,5 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "bench/case.h"
-#include "bench/classes.h"
 #include "messages/gsm_messages.h"
 #include "messages/lte_messages.h"
 #include "messages/nas_messages.h"
@@ -26,10 +25,9 @@ void decodeFresh(const Payload& payload) {
 }
 
 Run decoderOf(std::string_view name) {
-#define CLASS(Class) \
+#define METRIC(constant, identifier, Class, ...) \
   if (name == #Class) return decodeFresh<Class>;
-  BENCH_CLASSES(CLASS)
-#undef CLASS
+#include "messages/metrics.inc"
   return nullptr;
 }
 
@@ -107,10 +105,9 @@ void printOne(const Payload& payload, std::string& line) {
 using Print = void (*)(const Payload&, std::string&);
 
 Print printerOf(std::string_view name) {
-#define CLASS(Class) \
+#define METRIC(constant, identifier, Class, ...) \
   if (name == #Class) return printOne<Class>;
-  BENCH_CLASSES(CLASS)
-#undef CLASS
+#include "messages/metrics.inc"
   return nullptr;
 }
 

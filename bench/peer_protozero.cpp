@@ -1,6 +1,5 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "bench/case.h"
-#include "bench/classes.h"
 #include "protozero_peer.h"
 
 namespace probeview::bench {
@@ -18,10 +17,9 @@ void decodeFresh(const Payload& payload) {
 }
 
 Run decoderOf(std::string_view name) {
-#define CLASS(Class) \
+#define METRIC(constant, identifier, Class, ...) \
   if (name == #Class) return decodeFresh<zero::Class>;
-  BENCH_CLASSES(CLASS)
-#undef CLASS
+#include "messages/metrics.inc"
   return nullptr;
 }
 

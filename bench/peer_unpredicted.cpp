@@ -4,7 +4,6 @@
 // number. What expecting the fields in their order saves, and what it costs when they come in another, is measured
 // against this.
 #include "bench/case.h"
-#include "bench/classes.h"
 #include "messages/gsm_messages.h"
 #include "messages/lte_messages.h"
 #include "messages/metric_utility.h"
@@ -134,10 +133,9 @@ void decodeFresh(const Payload& payload) {
 }
 
 Run decoderOf(std::string_view name) {
-#define CLASS(Class) \
+#define METRIC(constant, identifier, Class, ...) \
   if (name == #Class) return decodeFresh<Class>;
-  BENCH_CLASSES(CLASS)
-#undef CLASS
+#include "messages/metrics.inc"
   return nullptr;
 }
 

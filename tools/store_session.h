@@ -9,7 +9,7 @@
 //   state             {"dicts":{…},"LTE":{…},"UMTS":{…},"GSM":{…},"Common":{…}}
 //   page KEY          {"page":KEY,"sections":[{"title":…,"rows":[[label,detail],…]}],"log":[…]}; KEY is the rest of the
 //                     line as it stands
-//   pages             an array of the 42 pages, in the order of the lists
+//   pages             an array of all pages, in the order of the lists
 //   reset             {}; the store is new
 //
 // Whatever it cannot understand is answered {"error":…}. Where the store or a page stops the program the answer is

@@ -24,7 +24,7 @@ const VarnetViewItems& launchViewItems();
 
 // A technology and a category, joined by one blank.
 std::string pageKey(const std::string& technology, const std::string& category);
-// The keys of all 42 category pages, in the order of the lists.
+// The keys of all category pages, in the order of the lists.
 std::vector<std::string> navigablePageKeys();
 
 }  // namespace probeview

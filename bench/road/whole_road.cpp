@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 //
 // whole_road [ROUNDS]         how many metric events a second the store takes on one core: payload, message, display
-//                             dictionary, handler, log line, over the mixed stream of all 29 kinds; with the log
+//                             dictionary, handler, log line, over the mixed stream of all kinds; with the log
 //                             discarded, and with it written to a file. One JSON object.
 // whole_road --instructions   under callgrind with --collect-atstart=no: the same with the log discarded, one dump;
 //                             says how many events that were and how many allocations each took
