@@ -78,7 +78,7 @@ class KCellularGsmIdleConfig final : public PBCodable {
 
 class KCellularGsmIdleScellMeasurement final : public PBCodable {
   PB_MESSAGE(KCellularGsmIdleScellMeasurement,
-             "Level of the serving cell in idle mode, in dBm.",
+             "Level of the serving cell in idle mode.",
              "\"GSM Idle Serv Cell Meas\" (the first field)")
   PB_FIELD(1, "timestamp",           timestamp,         Timestamp,         uint64, timestamp,    "Time of the values", viewer::localTime);
   PB_FIELD(2, "scell_arfcn",         scellArfcn,        ScellArfcn,        uint32, arfcn,        "ARFCN of the serving cell");
@@ -89,8 +89,7 @@ class KCellularGsmIdleScellMeasurement final : public PBCodable {
 
 class KCellularGsmCsRfMeasurement final : public PBCodable {
   PB_MESSAGE(KCellularGsmCsRfMeasurement,
-             "Radio measurement in dedicated mode: transmit powers in dBm, RXLEV_SUB (0 to 63) and RXQUAL_SUB (0 to "
-             "7), 3GPP TS 45.008, 8.",
+             "Radio measurement in dedicated mode: transmit powers, RXLEV_SUB and RXQUAL_SUB, 3GPP TS 45.008, 8.",
              "none that the lists lead to: \"GSM Connected Serv Cell Meas\" reads \"Come back later\"")
   PB_FIELD (1, "timestamp",           timestamp,         Timestamp,         uint64, timestamp, "Time of the values", viewer::localTime);
   PB_FIELD (2, "scell_arfcn",         scellArfcn,        ScellArfcn,        uint32, arfcn,     "ARFCN of the serving cell");

@@ -15,7 +15,7 @@ namespace probeview {
 class KCellularLteRrcState final : public PBCodable {
   PB_MESSAGE(KCellularLteRrcState,
              "State of the RRC connection, 3GPP TS 36.331, 4.2.1, with the cause of the last change and the time "
-             "(ms) spent in the state before.",
+             "spent in the state before.",
              "\"LTE RRC State\"")
 
  public:
@@ -72,7 +72,7 @@ class KCellularLteRrcState final : public PBCodable {
 
 class KCellularLteCdrxConfig final : public PBCodable {
   PB_MESSAGE(KCellularLteCdrxConfig,
-             "Connected-mode DRX as configured by the network, 3GPP TS 36.321, 5.7; times in ms.",
+             "Connected-mode DRX as configured by the network, 3GPP TS 36.321, 5.7.",
              "\"LTE C-DRX\"")
   PB_FIELD( 1, "timestamp",           timestamp,        Timestamp,        uint64,                                   timestamp,            "Time of the values", viewer::localTime);
   PB_FIELD( 2, "cell_status",         cellStatus,       CellStatus,       uint32,                                   none,                 "Status of the cell, a number of the modem");
@@ -90,8 +90,8 @@ class KCellularLteCdrxConfig final : public PBCodable {
 
 class KCellularLteScellInfo final : public PBCodable {
   PB_MESSAGE(KCellularLteScellInfo,
-             "The serving cell: PCI, EARFCNs (3GPP TS 36.101, 5.7.3), bandwidths (dl_bw in quarter MHz, ul_bw in "
-             "MHz), 28-bit cell identity, band, TAC and PLMN, TDD configuration (3GPP TS 36.211, 4.2).",
+             "The serving cell: PCI, EARFCNs, bandwidths, cell identity, band, TAC and PLMN, TDD configuration "
+             "(3GPP TS 36.211, 4.2).",
              "\"LTE Serving Cell Info\"")
   PB_FIELD( 1, "timestamp",          timestamp,        Timestamp,        uint64, timestamp,                   "Time of the values", viewer::localTime);
   PB_FIELD( 2, "phy_cell_id",        phyCellId,        PhyCellId,        uint32, eutraPci,                    "Physical cell identity");
@@ -110,9 +110,7 @@ class KCellularLteScellInfo final : public PBCodable {
 };
 
 class NbrEutra final : public PBCodable {
-  PB_MESSAGE(NbrEutra,
-             "A neighbour frequency for reselection, 3GPP TS 36.331, SystemInformationBlockType5; dl_bw is an index, "
-             "0 to 5 for 1.4 to 20 MHz.")
+  PB_MESSAGE(NbrEutra, "A neighbour frequency for reselection, 3GPP TS 36.331, SystemInformationBlockType5.")
 
  public:
   PB_ENUMERATION(FrameType,
@@ -138,7 +136,7 @@ class NbrEutra final : public PBCodable {
 class KCellularLteSelReselCellInfo final : public PBCodable {
   PB_MESSAGE(KCellularLteSelReselCellInfo,
              "What the serving cell broadcasts for cell selection and reselection, 3GPP TS 36.304, 5.2 and TS "
-             "36.331, 6.3.1: access barring, thresholds (dB), priorities, and the E-UTRA neighbour frequencies.",
+             "36.331, 6.3.1: access barring, thresholds, priorities, and the E-UTRA neighbour frequencies.",
              "\"LTE Sel Resel Parameters\" (twenty of its fields, blank when absent) and \"LTE EUTRA Neighbor Info\"")
   PB_FIELD ( 1, "timestamp",                               timestamp,                         Timestamp,                         uint64,
                 timestamp, "Time of the values", viewer::localTime);
@@ -202,7 +200,7 @@ class KCellularLteServingCellMeasurement final : public PBCodable {
 };
 
 class TxPowerInfo final : public PBCodable {
-  PB_MESSAGE(TxPowerInfo, "Transmit power of PUCCH and PUSCH in one subframe, in dBm.")
+  PB_MESSAGE(TxPowerInfo, "Transmit power of PUCCH and PUSCH in one subframe.")
   PB_FIELD(1, "pucch_tx_power", pucchTxPower,  PucchTxPower,  sint32, lteTxPower, "PUCCH power (3GPP TS 36.213, 5.1.2)");
   PB_FIELD(2, "pusch_tx_power", puschTxPower,  PuschTxPower,  sint32, lteTxPower, "PUSCH power (3GPP TS 36.213, 5.1.1)");
   PB_FIELD(3, "subframe_index", subframeIndex, SubframeIndex, uint32, none,       "Subframe, 0 to 9");
@@ -217,7 +215,7 @@ class KCellularLteTxPower final : public PBCodable {
 };
 
 class RsrpRsrqSinr final : public PBCodable {
-  PB_MESSAGE(RsrpRsrqSinr, "RSRP in dBm, RSRQ in dB and SINR in half dB of one cell, per receive antenna.")
+  PB_MESSAGE(RsrpRsrqSinr, "RSRP, RSRQ and SINR of one cell, per receive antenna.")
   PB_FIELD( 1, "phy_cell_id", phyCellId, PhyCellId, uint32, eutraPci,      "Physical cell identity");
   PB_FIELD( 4, "rsrp0",       rsrp0,     Rsrp0,     sint32, lteSampleRsrp, "RSRP of the first antenna");
   PB_FIELD( 5, "rsrp1",       rsrp1,     Rsrp1,     sint32, lteSampleRsrp, "RSRP of the second antenna");
@@ -245,7 +243,7 @@ class KCellularLteRsrpRsrqSinr final : public PBCodable {
 
 class KCellularLteComponentCarrierInfo final : public PBCodable {
   PB_MESSAGE(KCellularLteComponentCarrierInfo,
-             "EARFCN and bandwidth (index, 0 to 5 for 1.4 to 20 MHz) of the primary and up to two secondary carriers.",
+             "EARFCN and bandwidth of the primary and up to two secondary carriers.",
              "none that the lists lead to: \"LTE Component Carrier Info\" shows it")
   PB_FIELD(1, "timestamp",      timestamp,     Timestamp,     uint64, timestamp,    "Time of the values", viewer::localTime);
   PB_FIELD(2, "pcc_earfcn",     pccEarfcn,     PccEarfcn,     uint32, earfcn,       "EARFCN of the primary carrier");
@@ -257,9 +255,7 @@ class KCellularLteComponentCarrierInfo final : public PBCodable {
 };
 
 class SecondaryComponentCarrier final : public PBCodable {
-  PB_MESSAGE(SecondaryComponentCarrier,
-             "One secondary carrier; RSRP and RSSI in hundredths of a dBm, RSRQ in hundredths of a dB, bandwidths "
-             "are indexes.")
+  PB_MESSAGE(SecondaryComponentCarrier, "One secondary carrier.")
 
  public:
   PB_ENUMERATION(State,

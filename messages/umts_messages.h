@@ -86,7 +86,7 @@ class KCellularWcdmaRrcConnectionState final : public PBCodable {
 
 class KCellularWcdmaRrcConfiguration final : public PBCodable {
   PB_MESSAGE(KCellularWcdmaRrcConfiguration,
-             "RRC configuration: DRX cycle in ms, MIMO, dual cell.",
+             "RRC configuration: DRX cycle, MIMO, dual cell.",
              "\"UMTS RRC Configuration\"")
   PB_FIELD(1, "timestamp",           timestamp,        Timestamp,        uint64,  timestamp,    "Time of the values", viewer::localTime);
   PB_FIELD(2, "drx_cycle_length_ms", drxCycleLengthMs, DrxCycleLengthMs, uint32,  utraDrxCycle, "DRX cycle");
@@ -215,19 +215,19 @@ class KCellularWcdmaTxPower final : public PBCodable {
 };
 
 class EutraFreqInfo final : public PBCodable {
-  PB_MESSAGE(EutraFreqInfo, "Reselection priority (0 to 7) of an LTE frequency.")
+  PB_MESSAGE(EutraFreqInfo, "Reselection priority of an LTE frequency.")
   PB_FIELD(1, "earfcn", earfcn, Earfcn, uint32, earfcn,              "EARFCN");
   PB_FIELD(2, "prio",   prio,   Prio,   uint32, reselectionPriority, "Reselection priority (0: lowest)");
 };
 
 class UtraFreqInfo final : public PBCodable {
-  PB_MESSAGE(UtraFreqInfo, "Reselection priority (0 to 7) of a UMTS frequency.")
+  PB_MESSAGE(UtraFreqInfo, "Reselection priority of a UMTS frequency.")
   PB_FIELD(1, "uarfcn", uarfcn, Uarfcn, uint32, uarfcn,              "UARFCN");
   PB_FIELD(2, "prio",   prio,   Prio,   uint32, reselectionPriority, "Reselection priority (0: lowest)");
 };
 
 class GsmFreqInfo final : public PBCodable {
-  PB_MESSAGE(GsmFreqInfo, "Reselection priority (0 to 7) of a GSM frequency.")
+  PB_MESSAGE(GsmFreqInfo, "Reselection priority of a GSM frequency.")
   PB_FIELD(1, "arfcn", arfcn, Arfcn, uint32, arfcn,               "ARFCN");
   PB_FIELD(2, "prio",  prio,  Prio,  uint32, reselectionPriority, "Reselection priority (0: lowest)");
 };
