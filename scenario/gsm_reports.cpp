@@ -8,8 +8,9 @@
 namespace probeview::scenario {
 namespace {
 
-// System information counts some differences in steps.
-constexpr std::uint32_t gsmDecibelsPerStep = 2;
+constexpr double radioLinkTimeout = 20;  // SACCH blocks
+constexpr double periodicUpdateHours = 1;
+constexpr double retransmissions = 4;
 
 using Band = KCellularWcdmaCellInfo::WcdmaBand;
 
@@ -17,6 +18,9 @@ using Band = KCellularWcdmaCellInfo::WcdmaBand;
 Band::Value gsmBandOf(const Carrier& carrier) {
   return carrier.band == 1800 ? Band::SYS_BAND_GSM_DCS_1800 : Band::SYS_BAND_GSM_PGSM_900;
 }
+
+// The same for messages that hold the band as a plain number.
+std::uint32_t gsmBandNumberOf(const Carrier& carrier) { return static_cast<std::uint32_t>(gsmBandOf(carrier)); }
 
 // The power control level of the largest power in the band (3GPP TS 45.005, 4.1.1).
 std::uint32_t largestPowerLevel(const Carrier& carrier) { return carrier.band == 1800 ? 0 : 5; }
@@ -56,10 +60,10 @@ void report(const Phone& phone, KCellularGsmIdleConfig& message) {
   message.setLac(cell.areaCode);
   message.setCi(cell.identity);
   message.setBsic(cell.physicalIdentity);
-  message.setDtxFromBs(1);         // the phone shall use discontinuous transmission
-  message.setRadioLinkTimeout(4);  // 20 SACCH blocks
-  message.setMultibRep(2);         // neighbours of the other band to report
-  message.setGsmBand(static_cast<std::uint32_t>(gsmBandOf(carrier)));
+  message.setDtxFromBs(1);  // the phone shall use discontinuous transmission
+  message.setRadioLinkTimeout(quantities::gsmRadioLinkTimeout.toUnsigned(radioLinkTimeout));
+  message.setMultibRep(2);  // neighbours of the other band to report
+  message.setGsmBand(gsmBandNumberOf(carrier));
   message.setMsTxpwr(largestPowerLevel(carrier));
   message.setRxAccMin(quantities::gsmRxLev.toUnsigned(GsmSelection::rxLevAccessMin));
   message.setCbq(0);
@@ -67,11 +71,12 @@ void report(const Phone& phone, KCellularGsmIdleConfig& message) {
   message.setC2Valid(1);
   message.setTmpOffset(0);
   message.setPenaltyT(0);
-  message.setT3212(10);  // tenths of hours
-  message.setAcc(0);     // no access class is barred
+  message.setT3212(quantities::gsmPeriodicUpdate.toUnsigned(periodicUpdateHours));
+  message.setAcc(0);  // no access class is barred
   message.setBsPaMfrms(4);
   message.setCsPagemode(0);
-  message.setMaxRetransCs(2);  // 4 times
+  if (const auto index = quantities::gsmMaximumRetransmissions.indexOf(retransmissions))
+    message.setMaxRetransCs(*index);
   message.setEmergCallAllowed(1);
   message.setAttachAllowed(1);
   message.setHalfRateSupported(1);
@@ -97,7 +102,7 @@ void report(const Phone& phone, KCellularGsmCsRfMeasurement& message) {
   for (const int power : gsm.transmitPowers) message.addCsTxPwr(power);
   message.setCsRxlevSub(quantities::gsmRxLev.toUnsigned(gsm.dedicatedRxLev));
   message.setCsRxqualSub(gsm.rxQual);
-  message.setScellBand(static_cast<std::uint32_t>(gsmBandOf(carrier)));
+  message.setScellBand(gsmBandNumberOf(carrier));
 }
 
 void report(const Phone& phone, KCellularGsmGrrEventMeasCr& message) {
@@ -141,7 +146,7 @@ void report(const Phone& phone, KCellularGsmGprsConfig& message) {
   message.setSpPgCy(true);
   message.setNco(0);  // the phone chooses its cells itself
   message.setNom(2);  // circuit and packet services page apart
-  message.setCrHyst(GsmSelection::reselectHysteresis / gsmDecibelsPerStep);
+  message.setCrHyst(quantities::gsmReselectHysteresis.toUnsigned(GsmSelection::reselectHysteresis));
   message.setAccThr(6);
   message.setExtUplTbfSupported(true);
   message.setPriorityClass(0);

@@ -15,9 +15,6 @@ std::uint32_t bandwidthIndex(const Carrier& carrier) {
   return quantities::lteBandwidth.indexOf(bandwidthMegahertz(carrier)).value_or(0);
 }
 
-// System information counts levels in steps of 2 dB (3GPP TS 36.331, 6.3.4: Q-RxLevMin, ReselectionThreshold).
-constexpr int lteDecibelsPerStep = 2;
-
 void fill(RsrpRsrqSinr& values, const Network& network, const LteSample& sample) {
   values.setPhyCellId(network.cells[sample.cell].physicalIdentity);
   values.setRsrp0(quantities::lteSampleRsrp.toSigned(sample.rsrp[0]));
@@ -78,27 +75,27 @@ void report(const Phone& phone, KCellularLteSelReselCellInfo& message) {
   if (serving.band == 3) message.addMultiBandInfo(9);
   message.setImsEmergencySupport(network.hasVoiceOverIms(*phone.lte().serving) ? 1 : 0);
   message.setAcBarringForEmergency(0);
-  message.setQRxLevMin(LteSelection::qRxLevMin / lteDecibelsPerStep);
+  message.setQRxLevMin(quantities::lteQRxLevMin.toSigned(LteSelection::qRxLevMin));
   message.setQQualMin(LteSelection::qQualMin);
   message.setQHyst(LteSelection::hysteresis);
-  message.setSNonIntraSearchP(LteSelection::nonIntraSearchP / lteDecibelsPerStep);
+  message.setSNonIntraSearchP(quantities::lteLevelThreshold.toUnsigned(LteSelection::nonIntraSearchP));
   message.setSNonIntraSearchQ(LteSelection::nonIntraSearchQ);
-  message.setSIntraSearchP(LteSelection::intraSearchP / lteDecibelsPerStep);
+  message.setSIntraSearchP(quantities::lteLevelThreshold.toUnsigned(LteSelection::intraSearchP));
   message.setSIntraSearchQ(LteSelection::intraSearchQ);
-  message.setThreshServingLowP(LteSelection::servingLowP / lteDecibelsPerStep);
+  message.setThreshServingLowP(quantities::lteLevelThreshold.toUnsigned(LteSelection::servingLowP));
   message.setPriorityOperatingFreq(serving.priority);
   std::set<std::uint32_t> listed{serving.channel};
   for (const Carrier& carrier : network.carriers) {
     if (carrier.technology != Technology::Lte || !listed.insert(carrier.channel).second) continue;
     NbrEutra& neighbour = message.addNbrEutra();
     neighbour.setEarfcn(carrier.channel);
-    neighbour.setQRxlevMin(LteSelection::qRxLevMin / lteDecibelsPerStep);
+    neighbour.setQRxlevMin(quantities::lteQRxLevMin.toSigned(LteSelection::qRxLevMin));
     neighbour.setQQualMin(LteSelection::qQualMin);
     neighbour.setQOffset(0);
     neighbour.setPmax(LteSelection::maximumPower);
     neighbour.setDlBw(bandwidthIndex(carrier));
-    neighbour.setThresXHighP(LteSelection::candidateHighP / lteDecibelsPerStep);
-    neighbour.setThresXLowP(LteSelection::candidateLowP / lteDecibelsPerStep);
+    neighbour.setThresXHighP(quantities::lteLevelThreshold.toUnsigned(LteSelection::candidateHighP));
+    neighbour.setThresXLowP(quantities::lteLevelThreshold.toUnsigned(LteSelection::candidateLowP));
     neighbour.setThresXHighQ(LteSelection::candidateHighQ);
     neighbour.setThresXLowQ(LteSelection::candidateLowQ);
     neighbour.setPriority(carrier.priority);

@@ -20,7 +20,8 @@ namespace probeview::scenario {
 constexpr double weakestRsrp = quantities::lteRsrp.values.lowest, strongestRsrp = quantities::lteRsrp.values.highest;
 constexpr double worstRsrq = quantities::lteRsrq.values.lowest, bestRsrq = quantities::lteRsrq.values.highest;
 constexpr double worstSinr = -20, bestSinr = 30;
-constexpr double weakestRscp = -120, strongestRscp = -25;
+constexpr double weakestRscp = quantities::utraRscp.measurable.lowest;
+constexpr double strongestRscp = quantities::utraRscp.measurable.highest;
 constexpr double worstEcNo = -24, bestEcNo = 0;
 constexpr double weakestUtraCarrier = -100, strongestUtraCarrier = -25;
 constexpr double weakestRxLev = quantities::gsmRxLev.valueRange().lowest, strongestRxLev = -48;

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "service/sources/trace_cell.h"
 
+#include "messages/quantities.h"
 #include "service/sources/trace_field.h"
 #include "values/plain_text.h"
 
@@ -18,11 +19,11 @@ Layout layoutOf(TraceTechnology technology) {
     case TraceTechnology::Lte:
       break;
     case TraceTechnology::Umts:
-      return {"UMTS", 0x10000, 0xFFFFFFF};
+      return {"UMTS", 0x10000, (1U << quantities::utraCellIdentity.bits) - 1};
     case TraceTechnology::Gsm:
-      return {"GSM", 0, 0xFFFF};
+      return {"GSM", 0, static_cast<std::uint32_t>(quantities::gsmCellIdentity.numbers.highest)};
   }
-  return {"LTE", 0x100, 0xFFFFFFF};
+  return {"LTE", 0x100, (1U << quantities::eutraCellIdentity.bits) - 1};
 }
 
 // The identity that the parts make; absent when they make none.

@@ -302,7 +302,7 @@ class Reader {
     }
     if (!isNoValue(fields[AreaCode])) {
       area = parseNumber<std::uint32_t>(fields[AreaCode], 16);
-      if (!area || *area > 0xFFFF) {
+      if (!area || *area > quantities::trackingAreaCode.numbers.highest) {
         return skip("LACHEX is " + shownField(fields[AreaCode]) + ", not an area code of 16 bits in hexadecimal"),
                false;
       }
