@@ -30,7 +30,7 @@ void GsmModem::change(GsmConnection to, const Circumstances& c) {
 void GsmModem::serve(CellIndex cell, const Circumstances& c) {
   state_.serving = cell;
   lost_ = false;
-  cellFailingSince_ = -1;
+  failing_.clear();
   reselection_.clear();
   handover_.clear();
   c.facts.learn(Fact::GsmServingCell, c.now);
@@ -99,24 +99,17 @@ std::optional<Departure> GsmModem::advance(const Circumstances& c) {
   if (!state_.camped()) return std::nullopt;
   if (c.measured) {
     measure(c);
-    const bool failing = state_.rxLev <= GsmSelection::rxLevAccessMin - 2;
-    if (!failing) {
-      cellFailingSince_ = -1;
-    } else if (cellFailingSince_ < 0) {
-      cellFailingSince_ = c.now;
-    }
+    failing_.note(state_.rxLev <= GsmSelection::rxLevAccessMin - 2, c.now);
   }
   const bool dedicated = c.demand.voice || c.demand.signalling;
   if (state_.connection == GsmConnection::Idle) {
     if (c.measured) {
       std::optional<CellIndex> target;
       Milliseconds patience = c.firstSearch ? 0 : GsmSelection::reselectionTime;
-      if (cellFailingSince_ >= 0 && c.now - cellFailingSince_ >= 1200) {
+      if (failing_.hasFailedFor(searchAfter, c.now)) {
         patience = 0;
-        target = strongestAllowed(c, Technology::Lte, LteSelection::qRxLevMin);
-        if (!target) target = strongestAllowed(c, Technology::Umts, UmtsSelection::qRxLevMin);
-        if (!target) target = strongestAllowed(c, Technology::Gsm, GsmSelection::rxLevAccessMin);
-        lost_ = !target && c.now - cellFailingSince_ >= 3000;
+        target = selectionCandidate(c);
+        lost_ = !target && failing_.hasFailedFor(lostAfter, c.now);
         if (target == state_.serving) target.reset();
       } else if (c.mayLeave) {
         target = reselectionCandidate(c);
@@ -135,7 +128,7 @@ std::optional<Departure> GsmModem::advance(const Circumstances& c) {
     return std::nullopt;
   }
   if (!c.measured) return std::nullopt;
-  if (cellFailingSince_ >= 0 && c.now - cellFailingSince_ >= 4000) {  // the radio link timeout has run down
+  if (failing_.hasFailedFor(4000, c.now)) {  // the radio link timeout has run down
     change(GsmConnection::Idle, c);
     return std::nullopt;
   }

@@ -45,7 +45,7 @@ class GsmModem {
   const Network& network_;
   GsmState state_;
   int powerStep_ = 0;
-  Milliseconds cellFailingSince_ = -1;
+  FailingCell failing_;
   bool lost_ = false;
   Pending reselection_;
   Pending handover_;

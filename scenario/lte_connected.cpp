@@ -140,7 +140,7 @@ void LteModem::advanceReestablishment(const Circumstances& c) {
   reestablishing_ = false;
   change(LteConnection::KLTE_RRC_STATE_IDLE, LteCause::KLTE_RRC_CAUSE_REL_CONN_FAIL_T311_EXP, c);
   // The search has been made already; the next look decides where to go.
-  cellFailingSince_ = c.now - 1200;
+  failing_.failsSince(c.now - searchAfter);
 }
 
 }  // namespace probeview::scenario

@@ -3,6 +3,7 @@
 
 #include <utility>
 
+#include "messages/quantities.h"
 #include "scenario/decibel.h"
 #include "scenario/selection.h"
 
@@ -10,10 +11,12 @@ namespace probeview::scenario {
 namespace {
 
 constexpr std::size_t mostSamples = 10;
-constexpr std::size_t fewestSamples = 5;                  // that are worth a report, just after a change of the cell
-constexpr double largestPower = 23, smallestPower = -40;  // 3GPP TS 36.101, 6.2.2 and 6.3.2
+constexpr std::size_t fewestSamples = 5;  // that are worth a report, just after a change of the cell
 
-double bounded(double power) { return std::clamp(power, smallestPower, largestPower); }
+double bounded(double power) {
+  constexpr Range possible = quantities::lteTxPower.numbers;
+  return std::clamp(power, possible.lowest, possible.highest);
+}
 
 }  // namespace
 
@@ -30,7 +33,7 @@ void LteModem::change(LteConnection::Value to, LteCause::Value cause, const Circ
 void LteModem::serve(CellIndex cell, const Circumstances& c) {
   state_.serving = cell;
   lost_ = false;
-  cellFailingSince_ = -1;
+  failing_.clear();
   outOfSync_ = 0;
   t310Ends_ = -1;
   reselection_.clear();
@@ -185,12 +188,6 @@ void LteModem::becomeConnected(LteCause::Value cause, const Circumstances& c) {
   control(c);
 }
 
-std::optional<CellIndex> LteModem::selectionCandidate(const Circumstances& c) const {
-  if (const auto cell = strongestAllowed(c, Technology::Lte, LteSelection::qRxLevMin)) return cell;
-  if (const auto cell = strongestAllowed(c, Technology::Umts, UmtsSelection::qRxLevMin)) return cell;
-  return strongestAllowed(c, Technology::Gsm, GsmSelection::rxLevAccessMin);
-}
-
 // The candidate that the rules of 3GPP TS 36.304, 5.2.4.5 and 5.2.4.6 prefer to the serving cell.
 std::optional<CellIndex> LteModem::reselectionCandidate(const Circumstances& c) const {
   const CellIndex serving = *state_.serving;
@@ -225,21 +222,14 @@ std::optional<CellIndex> LteModem::reselectionCandidate(const Circumstances& c) 
 std::optional<Departure> LteModem::advanceIdle(const Circumstances& c) {
   if (c.measured) {
     // 3GPP TS 36.304, 5.2.3.2: the serving cell has to stay suitable.
-    const bool failing = state_.rsrp <= LteSelection::qRxLevMin || state_.sinr < -12;
-    if (!failing) {
-      cellFailingSince_ = -1;
-    } else if (cellFailingSince_ < 0) {
-      cellFailingSince_ = c.now;
-    }
+    failing_.note(state_.rsrp <= LteSelection::qRxLevMin || state_.sinr < -12, c.now);
     std::optional<CellIndex> target;
     Milliseconds patience = LteSelection::reselectionTime;
-    if (cellFailingSince_ >= 0 && c.now - cellFailingSince_ >= 1200) {
+    if (failing_.hasFailedFor(searchAfter, c.now)) {
       target = selectionCandidate(c);
       patience = 0;
-      if (!target || *target == state_.serving) {
-        lost_ = !target && c.now - cellFailingSince_ >= 3000;
-        target.reset();
-      }
+      lost_ = !target && failing_.hasFailedFor(lostAfter, c.now);
+      if (target == state_.serving) target.reset();
     } else if (c.mayLeave) {
       target = reselectionCandidate(c);
       if (c.forbidden.knownForbidden(*state_.serving)) patience = 0;

@@ -93,7 +93,6 @@ class LteModem {
   void endAggregation(const Circumstances& c);
   void forgetDeconfigured(const Circumstances& c);
   void becomeConnected(LteCause::Value cause, const Circumstances& c);
-  std::optional<CellIndex> selectionCandidate(const Circumstances& c) const;
 
   const Network& network_;
   LteState state_;
@@ -101,7 +100,7 @@ class LteModem {
   Milliseconds backOff_ = 0;   // no connection attempt before
   Milliseconds lastActivity_ = 0;
   Milliseconds downloadSince_ = -1;
-  Milliseconds cellFailingSince_ = -1;
+  FailingCell failing_;
   int outOfSync_ = 0;
   Milliseconds t310Ends_ = -1;
   bool reestablishing_ = false;

@@ -80,6 +80,29 @@ class Pending {
   Milliseconds since_ = 0;
 };
 
+// How long the serving cell has been failing, from one look at it to the next.
+class FailingCell {
+ public:
+  void note(bool fails, Milliseconds now) {
+    if (!fails) {
+      since_ = -1;
+    } else if (since_ < 0) {
+      since_ = now;
+    }
+  }
+  // It counts as if it had failed from then on.
+  void failsSince(Milliseconds time) { since_ = time; }
+  bool hasFailedFor(Milliseconds time, Milliseconds now) const { return since_ >= 0 && now - since_ >= time; }
+  void clear() { since_ = -1; }
+
+ private:
+  Milliseconds since_ = -1;
+};
+
+// When a phone in idle mode looks for any other cell, and when it has no service, where it has found none.
+constexpr Milliseconds searchAfter = 1200;
+constexpr Milliseconds lostAfter = 3000;
+
 // The heard cells of a technology but one, as measurements.
 inline void listHeard(const Circumstances& c, Technology technology, std::optional<CellIndex> except, std::size_t most,
                       std::vector<CellMeasurement>& list) {
@@ -105,5 +128,9 @@ inline std::optional<CellIndex> strongestAllowed(const Circumstances& c, Technol
   }
   return std::nullopt;
 }
+
+// Where a phone would go whose cell has failed, the serving cell included: any cell that is good enough, of the best
+// technology first.
+std::optional<CellIndex> selectionCandidate(const Circumstances& c);
 
 }  // namespace probeview::scenario

@@ -13,6 +13,20 @@ constexpr Milliseconds firstSearchAtMost = 5000;
 constexpr double filterWeight = 0.5;           // filter coefficient 4 (3GPP TS 36.331, 5.5.3.2)
 constexpr double slowMeasurementWeight = 0.7;  // what is measured rarely is worth more
 
+// Why E-UTRA is left.
+LteCause::Value causeOf(Manner manner) {
+  switch (manner) {
+    case Manner::Reselection:
+      return LteCause::KLTE_RRC_CAUSE_NA;
+    case Manner::Handover:
+      return LteCause::KLTE_RRC_CAUSE_REL_SUCC_MOB_FROM_EUTRAN;
+    case Manner::Redirection:
+    case Manner::FallbackForVoice:
+      return LteCause::KLTE_RRC_CAUSE_REL_OTHER;
+  }
+  return LteCause::KLTE_RRC_CAUSE_NA;
+}
+
 }  // namespace
 
 Phone::Phone(World world, std::uint64_t seed)
@@ -118,7 +132,7 @@ void Phone::search() {
   if (found) go({*found, Manner::Reselection});
 }
 
-void Phone::leave(Manner manner) {
+void Phone::leave(LteCause::Value cause) {
   if (!technology_) return;
   const Circumstances c = circumstances();
   switch (*technology_) {
@@ -128,21 +142,15 @@ void Phone::leave(Manner manner) {
     case Technology::Umts:
       umts_.leave(c);
       break;
-    case Technology::Lte: {
-      LteCause::Value cause = LteCause::KLTE_RRC_CAUSE_NA;
-      if (manner == Manner::Handover) cause = LteCause::KLTE_RRC_CAUSE_REL_SUCC_MOB_FROM_EUTRAN;
-      if (manner == Manner::Redirection || manner == Manner::FallbackForVoice) {
-        cause = LteCause::KLTE_RRC_CAUSE_REL_OTHER;
-      }
+    case Technology::Lte:
       lte_.leave(cause, c);
       break;
-    }
   }
   technology_.reset();
 }
 
 void Phone::go(const Departure& departure) {
-  leave(departure.manner);
+  leave(causeOf(departure.manner));
   technology_ = world_.network.technologyOf(departure.cell);
   const Circumstances c = circumstances();
   switch (*technology_) {
@@ -161,19 +169,7 @@ void Phone::go(const Departure& departure) {
 }
 
 void Phone::loseService() {
-  const Circumstances c = circumstances();
-  switch (*technology_) {
-    case Technology::Gsm:
-      gsm_.leave(c);
-      break;
-    case Technology::Umts:
-      umts_.leave(c);
-      break;
-    case Technology::Lte:
-      lte_.leave(LteCause::KLTE_RRC_CAUSE_NO_SERVICE, c);
-      break;
-  }
-  technology_.reset();
+  leave(LteCause::KLTE_RRC_CAUSE_NO_SERVICE);
   lastCell_.reset();
   traffic_.interrupt(now_);
   registration_.loseService(now_, facts_);

@@ -49,7 +49,7 @@ class Phone {
   void powerOn();
   void search();
   void go(const Departure& departure);
-  void leave(Manner manner);
+  void leave(LteCause::Value cause);
   void loseService();
 
   World world_;

@@ -43,7 +43,7 @@ void UmtsModem::configure(const Circumstances& c) {
 void UmtsModem::serve(CellIndex cell, const Circumstances& c) {
   state_.serving = cell;
   lost_ = false;
-  cellFailingSince_ = -1;
+  failing_.clear();
   outOfSync_ = 0;
   reselection_.clear();
   bestCell_.clear();
@@ -186,22 +186,14 @@ std::optional<CellIndex> UmtsModem::reselectionCandidate(const Circumstances& c)
 
 std::optional<Departure> UmtsModem::advanceIdle(const Circumstances& c) {
   if (c.measured) {
-    const bool failing = state_.rscp <= UmtsSelection::qRxLevMin || state_.ecNo < UmtsSelection::qQualMin - 3;
-    if (!failing) {
-      cellFailingSince_ = -1;
-    } else if (cellFailingSince_ < 0) {
-      cellFailingSince_ = c.now;
-    }
+    failing_.note(state_.rscp <= UmtsSelection::qRxLevMin || state_.ecNo < UmtsSelection::qQualMin - 3, c.now);
     std::optional<CellIndex> target;
     Milliseconds patience = c.firstSearch ? 0 : UmtsSelection::reselectionTime;
-    if (cellFailingSince_ >= 0 && c.now - cellFailingSince_ >= 1200) {
+    if (failing_.hasFailedFor(searchAfter, c.now)) {
       patience = 0;
-      target = strongestAllowed(c, Technology::Lte, LteSelection::qRxLevMin);
-      if (!target) target = strongestAllowed(c, Technology::Umts, UmtsSelection::qRxLevMin);
-      if (!target || target == state_.serving) {
-        target = strongestAllowed(c, Technology::Gsm, GsmSelection::rxLevAccessMin);
-      }
-      lost_ = !target && c.now - cellFailingSince_ >= 3000;
+      target = selectionCandidate(c);
+      if (target == state_.serving) target = strongestAllowed(c, Technology::Gsm, GsmSelection::rxLevAccessMin);
+      lost_ = !target && failing_.hasFailedFor(lostAfter, c.now);
     } else if (c.mayLeave) {
       target = reselectionCandidate(c);
     }

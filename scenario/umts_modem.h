@@ -72,7 +72,7 @@ class UmtsModem {
   Milliseconds deadline_ = 0;
   Milliseconds backOff_ = 0;
   Milliseconds lastActivity_ = 0;
-  Milliseconds cellFailingSince_ = -1;
+  FailingCell failing_;
   int outOfSync_ = 0;
   bool lost_ = false;
   Pending reselection_;
