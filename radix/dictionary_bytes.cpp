@@ -127,12 +127,6 @@ void fill(wire::Item& item, const Value& value) {
   }
 }
 
-// False when the bytes are neither a list nor a dictionary.
-bool readItems(std::span<const std::uint8_t> bytes, wire::Items& items) {
-  PBDataReader reader(bytes);
-  return items.readFrom(reader);
-}
-
 enum class Reading { Understood, Unknown, Malformed };
 
 // Each takes so many levels below itself and no more.
@@ -185,28 +179,29 @@ Reading read(const wire::Item& item, int depth, Value& value) {
   return Reading::Unknown;
 }
 
-bool readList(std::span<const std::uint8_t> bytes, int depth, List& list) {
+// Hands over each item that is understood. False when the bytes are neither a list nor a dictionary.
+template <typename Add>
+bool readItems(std::span<const std::uint8_t> bytes, int depth, const Add& add) {
   wire::Items items;
-  if (!readItems(bytes, items)) return false;
+  PBDataReader reader(bytes);
+  if (!items.readFrom(reader)) return false;
   for (const wire::Item& item : items.items()) {
     Value value;
     const Reading reading = read(item, depth, value);
     if (reading == Reading::Malformed) return false;
-    if (reading == Reading::Understood) list.append(std::move(value));
+    if (reading == Reading::Understood) add(item, std::move(value));
   }
   return true;
 }
 
+bool readList(std::span<const std::uint8_t> bytes, int depth, List& list) {
+  return readItems(bytes, depth, [&](const wire::Item&, Value&& value) { list.append(std::move(value)); });
+}
+
 bool readDictionary(std::span<const std::uint8_t> bytes, int depth, Dictionary& dictionary) {
-  wire::Items items;
-  if (!readItems(bytes, items)) return false;
-  for (const wire::Item& item : items.items()) {
-    Value value;
-    const Reading reading = read(item, depth, value);
-    if (reading == Reading::Malformed) return false;
-    if (reading == Reading::Understood) dictionary.append(Key::copy(item.key()), std::move(value));
-  }
-  return true;
+  return readItems(bytes, depth, [&](const wire::Item& item, Value&& value) {
+    dictionary.append(Key::copy(item.key()), std::move(value));
+  });
 }
 
 }  // namespace

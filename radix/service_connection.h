@@ -145,7 +145,6 @@ class ServiceConnection final : public std::enable_shared_from_this<ServiceConne
   probeview::ScheduledTaskHandle nextAttempt_;
   probeview::ScheduledTaskHandle greetingDeadline_;
   std::chrono::nanoseconds reconnectDelay_ = firstReconnectDelay;
-  std::string lastTrouble_;
 
   // In the order in which they were asked for.
   std::deque<Waiting> waiting_;
