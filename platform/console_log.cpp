@@ -15,12 +15,12 @@ namespace probeview {
 namespace {
 
 // The logs that live now; registered for the fatal stop as one, because a flush cannot be taken back.
-std::vector<ConsoleLog*>& livingLogs() {
+std::vector<ConsoleLog*>& livingConsoleLogs() {
   static auto* logs = new std::vector<ConsoleLog*>;
   return *logs;
 }
 
-LineSink*& chosenSink() {
+LineSink*& chosenConsoleSink() {
   static LineSink* sink = nullptr;
   return sink;
 }
@@ -49,16 +49,16 @@ ConsoleLog::ConsoleLog(int fileDescriptor, const Settings& settings)
               writeToDescriptor(fileDescriptor)) {
   [[maybe_unused]] static const bool registered = [] {
     addFatalErrorFlush([] {
-      for (ConsoleLog* log : livingLogs()) log->release();
+      for (ConsoleLog* log : livingConsoleLogs()) log->release();
     });
     return true;
   }();
-  livingLogs().push_back(this);
+  livingConsoleLogs().push_back(this);
 }
 
 ConsoleLog::~ConsoleLog() {
   release();
-  std::erase(livingLogs(), this);
+  std::erase(livingConsoleLogs(), this);
 }
 
 void ConsoleLog::line(std::string_view text) {
@@ -84,15 +84,15 @@ void ConsoleLog::flush() {
 }
 
 LineSink& consoleLog() {
-  if (chosenSink() != nullptr) return *chosenSink();
+  if (chosenConsoleSink() != nullptr) return *chosenConsoleSink();
   static auto* standardOutput = new ConsoleLog(STDOUT_FILENO);
   return *standardOutput;
 }
 
-void setConsoleLog(LineSink& sink) { chosenSink() = &sink; }
+void setConsoleLog(LineSink& sink) { chosenConsoleSink() = &sink; }
 
 void awaitLogsAt(int fileDescriptor) {
-  for (ConsoleLog* log : livingLogs()) {
+  for (ConsoleLog* log : livingConsoleLogs()) {
     if (!isSamePlace(log->fileDescriptor_, fileDescriptor)) continue;
     log->release();
     log->writer_.drain(LogWriter::unlimitedPatience);

@@ -24,7 +24,7 @@ namespace probeview {
 
 namespace {
 
-using Clock = std::chrono::steady_clock;
+using SteadyClock = std::chrono::steady_clock;
 using std::chrono::nanoseconds;
 
 // What waits is kept in blocks of this size, which go when they are written: a log that rests holds nothing.
@@ -98,9 +98,9 @@ struct LogWriter::State {
         continue;
       }
       if (patience <= nanoseconds::zero()) return false;
-      const auto begin = Clock::now();
+      const auto begin = SteadyClock::now();
       progress.wait_for(lock, patience);
-      patience -= Clock::now() - begin;
+      patience -= SteadyClock::now() - begin;
     }
     return true;
   }
@@ -327,10 +327,10 @@ LogWriter::Output writeToDescriptor(int fileDescriptor) {
 }
 
 void drainLogs(nanoseconds atMost) {
-  const auto deadline = Clock::now() + atMost;
+  const auto deadline = SteadyClock::now() + atMost;
   LivingLogs& living = livingLogs();
   const std::lock_guard lock(living.mutex);
-  for (LogWriter* log : living.logs) log->drain(std::max(deadline - Clock::now(), nanoseconds::zero()));
+  for (LogWriter* log : living.logs) log->drain(std::max(deadline - SteadyClock::now(), nanoseconds::zero()));
 }
 
 }  // namespace probeview

@@ -18,7 +18,7 @@ namespace {
 
 constexpr char lossPrefix[] = "probeview: warning: ";
 
-std::atomic<LineSink*>& chosenSink() {
+std::atomic<LineSink*>& chosenSystemSink() {
   static std::atomic<LineSink*> sink{nullptr};
   return sink;
 }
@@ -57,11 +57,11 @@ void SystemLog::line(std::string_view text) {
 }
 
 LineSink& systemLog() {
-  if (LineSink* sink = chosenSink().load(std::memory_order_acquire)) return *sink;
+  if (LineSink* sink = chosenSystemSink().load(std::memory_order_acquire)) return *sink;
   static auto* log = new SystemLog("probeview");
   return *log;
 }
 
-void setSystemLog(LineSink& sink) { chosenSink().store(&sink, std::memory_order_release); }
+void setSystemLog(LineSink& sink) { chosenSystemSink().store(&sink, std::memory_order_release); }
 
 }  // namespace probeview

@@ -8,7 +8,7 @@ namespace probeview {
 
 namespace {
 
-void neighbourMeasurement(HandlerTurn& turn) {
+void gsmNeighbourMeasurement(HandlerTurn& turn) {
   static constexpr Adjustment gsm[] = {rxlevToDbm("rxlev")};
   // The message names its Ec/No "cpich_ecn0", with a zero, so the second entry is never found and the raw value stays.
   // Whoever reads the page knows it raw, as it has always been shown.
@@ -26,7 +26,7 @@ constexpr MetricHandler gsmTable[] = {
     {K_GSM_IDLE_CONFIG, "Received GSM Idle Config Info is ", formatTimestampAndLog},
     {K_GSM_IDLE_SCELL_MEAS, "Received GSM Idle Serving Cell Meas Info is ", formatTimestampAndLog},
     {K_GSM_CS_RF_MEAS, "Received GSM Connected Serving Cell Meas Info is ", formatTimestampAndLog},
-    {K_GSM_NCELL_MEAS, "Received GSM Nbr Cell Meas Info is ", neighbourMeasurement},
+    {K_GSM_NCELL_MEAS, "Received GSM Nbr Cell Meas Info is ", gsmNeighbourMeasurement},
     {K_GSM_GPRS_CONFIG, "Received GSM GPRS Config Info is ", formatTimestampAndLog},
 };
 

@@ -19,12 +19,12 @@ void servingCellInfo(HandlerTurn& turn) {
   turn.log();
 }
 
-void txPower(HandlerTurn& turn) {
+void lteTxPower(HandlerTurn& turn) {
   formatTimestampAndLog(turn);
   turn.rewriteList("tx_power_info");
 }
 
-void reselection(HandlerTurn& turn) {
+void lteReselection(HandlerTurn& turn) {
   static constexpr Adjustment neighbour[] = {lookUpBandwidth("dl_bw")};
   // The line shows the message as it came, its timestamp in milliseconds.
   turn.log();
@@ -71,9 +71,9 @@ constexpr MetricHandler lteTable[] = {
     {K_LTE_RRC_STATE, "Current RRC state is ", formatTimestampAndLog},
     {K_LTE_CDRX_CONFIG, "Current CDRX Config is ", formatTimestampAndLog},
     {K_LTE_SCELL_INFO, "Current Serving Cell Info is ", servingCellInfo},
-    {K_LTE_TX_POWER, "Received LTE Tx Power is ", txPower},
+    {K_LTE_TX_POWER, "Received LTE Tx Power is ", lteTxPower},
     {K_LTE_COMPCARR_INFO, "Received Component Carrier info is ", formatTimestampAndLog},
-    {K_LTE_SEL_RESEL_INFO, "Received LTE Cell Resel Info is ", reselection},
+    {K_LTE_SEL_RESEL_INFO, "Received LTE Cell Resel Info is ", lteReselection},
     {K_LTE_INTRARAT_MEAS, "Received LTE IRAT Meas is ", intraRatMeasurement},
     {K_LTE_INTERRAT_MEAS, "Received LTE InterRat Meas Info is ", interRatMeasurement},
     {K_LTE_CA_STATUS, "Received CA Status Dict is ", carrierAggregation},

@@ -14,12 +14,12 @@ void servingCellMeasurement(HandlerTurn& turn) {
   turn.collect("rx_info", turn.umts().rXInfo, {}, inherited);
 }
 
-void txPower(HandlerTurn& turn) {
+void umtsTxPower(HandlerTurn& turn) {
   formatTimestampAndLog(turn);
   turn.collect("tx_power_info", turn.umts().TxPower);
 }
 
-void reselection(HandlerTurn& turn) {
+void umtsReselection(HandlerTurn& turn) {
   formatTimestampAndLog(turn);
   turn.flattenIntegers("multi_band_info");
   turn.mergeInto(turn.umts().SelReselCellInfo);
@@ -28,7 +28,7 @@ void reselection(HandlerTurn& turn) {
   turn.collect("gsm_prio_info", turn.umts().geraNbrs);
 }
 
-void neighbourMeasurement(HandlerTurn& turn) {
+void umtsNeighbourMeasurement(HandlerTurn& turn) {
   static constexpr Adjustment utra[] = {rscpToDbm("rscp"), ecnoToDb("ecno")};
   static constexpr Adjustment gsm[] = {rxlevToDbm("rxlev")};
   static constexpr Adjustment lte[] = {rsrpToDbm("rsrp"), rsrqToDb("rsrq")};
@@ -40,9 +40,9 @@ void neighbourMeasurement(HandlerTurn& turn) {
 
 constexpr MetricHandler umtsTable[] = {
     {K_UMTS_SCELL_MEAS, "Received UMTS Serving Cell Meas is ", servingCellMeasurement},
-    {K_UMTS_TX_POWER, "Received Tx Power is ", txPower},
-    {K_UMTS_SEL_RESEL_INFO, "Received UMTS Cell Resel Info is ", reselection},
-    {K_UMTS_NCELL_MEAS, "Received UMTS InterRat Meas Info is ", neighbourMeasurement},
+    {K_UMTS_TX_POWER, "Received Tx Power is ", umtsTxPower},
+    {K_UMTS_SEL_RESEL_INFO, "Received UMTS Cell Resel Info is ", umtsReselection},
+    {K_UMTS_NCELL_MEAS, "Received UMTS InterRat Meas Info is ", umtsNeighbourMeasurement},
     {K_UMTS_RRC_STATE, "Received UMTS RRC Connection State is ", formatTimestampAndLog},
     {K_UMTS_RRC_CONFIG, "Received UMTS RRC Configuration is ", formatTimestampAndLog},
     {K_UMTS_SCELL_INFO, "Received UMTS Serving Cell Info is ", formatTimestampAndLog},
