@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "app/root_navigation_controller.h"
 
+#include <optional>
+#include <string>
 #include <utility>
 
 #include "platform/fatal_error.h"
@@ -30,7 +32,7 @@ RootNavigationController::RootNavigationController(RadixWrapper* wrapper, Metric
 void RootNavigationController::viewDidLoad() {
   NavigationStack::viewDidLoad();
   if (myRadixWrapper != nullptr) myRadixWrapper->removeTelemConfigForAppid(myAppID);
-  const auto path = resourcePath(metricFileName, metricFileType);
+  const std::optional<std::string> path = resourcePath(metricFileName, metricFileType);
   metricFileIsMissing_ = !path;
   if (!path) {
     consoleLog_.line("Metric Log File path doesnt exist");

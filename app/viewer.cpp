@@ -99,7 +99,7 @@ MadeFront makeFront(FrontKind kind, const MakeWindow& makeWindow, std::ostream& 
 }
 
 int show(const ViewerOptions& options, const MakeWindow& makeWindow, std::ostream& errors) {
-  const auto kind = chooseFront(frontCircumstances(options.front, makeWindow != nullptr));
+  const FrontKind kind = chooseFront(frontCircumstances(options.front, makeWindow != nullptr));
   if (!chooseLogs(options, kind, errors)) return 1;
   std::string error;
   const MadeFront made = makeFront(kind, makeWindow, errors, error);

@@ -83,7 +83,7 @@ struct RadixWrapper::Shared {
 
   // Whatever the library in use has let pass, sums of spans must not overflow.
   static std::optional<std::chrono::milliseconds> span(const Dictionary& event, std::string_view key) {
-    const auto given = milliseconds(event, key);
+    const std::optional<std::chrono::milliseconds> given = milliseconds(event, key);
     if (!given) return std::nullopt;
     return radix::boundedSpan(*given);
   }

@@ -5,6 +5,7 @@
 #include <condition_variable>
 #include <deque>
 #include <mutex>
+#include <optional>
 #include <utility>
 
 namespace probeview {
@@ -107,7 +108,7 @@ void ManualLoop::advance(std::chrono::nanoseconds time) {
 }
 
 std::optional<std::chrono::nanoseconds> ManualLoop::untilNextTimer() const {
-  const auto next = timers_.nextDue();
+  const std::optional<std::chrono::nanoseconds> next = timers_.nextDue();
   if (!next) return std::nullopt;
   return std::max(*next - now_, std::chrono::nanoseconds::zero());
 }

@@ -6,6 +6,7 @@
 #include <chrono>
 #include <deque>
 #include <map>
+#include <memory>
 #include <utility>
 
 #include "platform/guarded.h"
@@ -40,7 +41,7 @@ class EventRoad : public std::enable_shared_from_this<EventRoad> {
 
   // Callers register one after the other; nobody registers for the same manager from two threads at once.
   void setHandler(std::string_view event, EventHandler handler) {
-    auto handlers = handlers_.get();
+    const std::shared_ptr<const Handlers> handlers = handlers_.get();
     auto changed = handlers ? std::make_shared<Handlers>(*handlers) : std::make_shared<Handlers>();
     (*changed)[std::string(event)] = std::move(handler);
     handlers_.set(std::move(changed));
@@ -62,7 +63,7 @@ class EventRoad : public std::enable_shared_from_this<EventRoad> {
   // On the worker.
   void deliver(TaskQueue& queue, std::vector<ArrivedEvent> events,
                const std::shared_ptr<ServiceConnection>& connection) {
-    auto hold = waiting_->add(events, connection);
+    std::shared_ptr<const void> hold = waiting_->add(events, connection);
     queue.post(
         [self = shared_from_this(), batch = Batch{std::move(events), std::move(hold), clock_.ageTime()}]() mutable {
           self->batches_.push_back(std::move(batch));
@@ -100,11 +101,12 @@ class EventRoad : public std::enable_shared_from_this<EventRoad> {
 
   void hand(ArrivedEvent& event, const Batch& batch) const {
     // Asked for each event: the handler before it may have registered another one.
-    const auto handlers = handlers_.get();
+    const std::shared_ptr<const Handlers> handlers = handlers_.get();
     if (!handlers) return;
     const auto found = handlers->find(event.kind == EventKind::Trigger ? kEventTrigger : kEventMetric);
     if (found == handlers->end() || !found->second) return;
-    found->second(objectOf(std::move(event), clock_.ageTime() - batch.arrived, batch.hold), event.group);
+    const Group group = event.group;
+    found->second(objectOf(std::move(event), clock_.ageTime() - batch.arrived, batch.hold), group);
   }
 
   std::shared_ptr<WaitingEvents> waiting_;

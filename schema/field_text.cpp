@@ -3,6 +3,7 @@
 
 #include <array>
 #include <charconv>
+#include <span>
 
 namespace probeview {
 
@@ -20,7 +21,7 @@ std::string withUnit(std::string text, const Quantity& quantity) {
 // The values of a table: all, or the ends of a long one.
 std::string tableText(const Quantity& quantity) {
   constexpr std::size_t mostListed = 8;
-  const auto table = quantity.table;
+  const std::span<const double> table = quantity.table;
   std::string text;
   if (table.size() > mostListed) {
     text = plainNumber(table.front()) + " to " + plainNumber(table.back());

@@ -43,7 +43,7 @@ std::vector<const MessageDescriptor*> classesOf(const Family& family) {
 
 const Family& familyOf(const MessageDescriptor& descriptor) {
   for (const Family& family : families) {
-    const auto classes = classesOf(family);
+    const std::vector<const MessageDescriptor*> classes = classesOf(family);
     if (std::find(classes.begin(), classes.end(), &descriptor) != classes.end()) return family;
   }
   return families.front();
@@ -319,6 +319,7 @@ std::string unnamedZero(std::string_view enumeration) {
 
 std::vector<Page> schemaPages() {
   std::vector<Page> pages;
+  pages.reserve(families.size() + 1);
   for (const Family& family : families) pages.push_back(protoFile(family));
   pages.push_back(metricsPage());
   return pages;

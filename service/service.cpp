@@ -68,9 +68,10 @@ PushedConfiguration readConfiguration(const Dictionary& arguments, ServiceLog& l
     log.write(LogLevel::Warning, "the configuration of " + who + " was refused: " + result.error);
     return {{}, answer(Status::BadConfiguration, result.error)};
   }
+  const std::string subject = "the configuration of " + who + ": ";
   std::string message;
   for (const std::string& note : notesToTell(result.configuration->notes)) {
-    log.write(LogLevel::Info, "the configuration of " + who + ": " + note);
+    log.write(LogLevel::Info, subject + note);
     if (!message.empty()) message += "; ";
     message += note;
   }
@@ -256,7 +257,8 @@ bool Service::isMetric(std::int64_t identifier) const {
 
 std::vector<std::int64_t> Service::metricsOfTrigger(const Session& session, std::int64_t trigger) const {
   // A client's own configuration says what its triggers mean; without one the service's does.
-  const auto& configuration = session.configuration() ? session.configuration() : baseConfiguration_;
+  const std::optional<Configuration>& configuration =
+      session.configuration() ? session.configuration() : baseConfiguration_;
   if (!configuration) return {};
   const auto found = configuration->triggers.find(trigger);
   return found != configuration->triggers.end() ? found->second : std::vector<std::int64_t>();

@@ -21,7 +21,7 @@ HandledMetrics handledMetricsInOrder() {
   std::size_t count = 0;
   for (const auto family : {lteHandlers(), umtsHandlers(), gsmHandlers(), nasHandlers()}) {
     for (const MetricHandler& handler : family) {
-      const auto dictionary = displayDictionaryOf(handler.metricID);
+      const std::optional<DisplayDictionary> dictionary = displayDictionaryOf(handler.metricID);
       if (count == metrics.size() || !dictionary) fatalError("a handler's metric is not among those that are stored");
       metrics[count++] = {handler, metricWithId(handler.metricID)->message, *dictionary};
     }

@@ -60,7 +60,7 @@ std::optional<std::string> CategoryPage::titleForHeaderInSection(std::size_t sec
 
 std::size_t CategoryPage::numberOfRowsInSection(std::size_t section) {
   if (rule_.rows == RowRule::One) return 1;
-  if (const auto* fields = fieldsOf(rule_, metricValidator_, section)) return fields->size();
+  if (const Dictionary* fields = fieldsOf(rule_, metricValidator_, section)) return fields->size();
   if (rule_.rows == RowRule::OnePerField) return 0;
   consoleLog_.line("You are screwed");
   return 1;
@@ -73,7 +73,7 @@ void CategoryPage::cellForRowAtIndexPath(std::size_t section, std::size_t row, L
     cell.detail = "Come back later";
     return;
   }
-  const auto* fields = fieldsOf(rule_, metricValidator_, section);
+  const Dictionary* fields = fieldsOf(rule_, metricValidator_, section);
   if (fields == nullptr) return;
   requireIndex("row", row, fields->size(), key_);
   const auto& [key, value] = (*fields)[row];

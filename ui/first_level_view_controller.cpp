@@ -19,7 +19,7 @@ std::optional<std::string> FirstLevelViewController::titleForHeaderInSection(std
 std::size_t FirstLevelViewController::numberOfRowsInSection(std::size_t) { return categories().size(); }
 
 void FirstLevelViewController::cellForRowAtIndexPath(std::size_t, std::size_t row, ListCell& cell) {
-  const auto& names = categories();
+  const std::vector<std::string>& names = categories();
   requireIndex("row", row, names.size(), *seguedThroughRow);
   cell.identifier = cellIdentifier;
   cell.text = names[row];

@@ -30,7 +30,7 @@ constexpr Wire wires[] = {
 };
 
 const Wire* wireFrom(std::string_view cellIdentifier) {
-  for (const auto& wire : wires) {
+  for (const Wire& wire : wires) {
     if (wire.cellIdentifier == cellIdentifier) return &wire;
   }
   return nullptr;
@@ -43,12 +43,12 @@ std::unique_ptr<ListPage> InterfaceDescription::makeRootPage() const {
 }
 
 std::unique_ptr<ListPage> InterfaceDescription::makeDestination(std::string_view cellIdentifier) const {
-  const auto* wire = wireFrom(cellIdentifier);
+  const Wire* wire = wireFrom(cellIdentifier);
   return wire != nullptr ? wire->makeDestination(environment_) : nullptr;
 }
 
 bool showsDisclosure(std::string_view cellIdentifier) {
-  const auto* wire = wireFrom(cellIdentifier);
+  const Wire* wire = wireFrom(cellIdentifier);
   return wire != nullptr && wire->showsDisclosure;
 }
 
