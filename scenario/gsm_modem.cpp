@@ -132,12 +132,8 @@ std::optional<Departure> GsmModem::advance(const Circumstances& c) {
     change(GsmConnection::Idle, c);
     return std::nullopt;
   }
-  std::optional<CellIndex> better;
-  for (const CellIndex cell : c.surroundings.heard(Technology::Gsm)) {
-    if (cell == state_.serving || network_.cells[cell].areaCode == network_.forbiddenAreaCode) continue;
-    if (c.surroundings.strength(cell) > state_.rxLev + GsmSelection::handoverMargin) better = cell;
-    break;
-  }
+  const std::optional<CellIndex> better =
+      strongerCell(c, Technology::Gsm, *state_.serving, state_.rxLev + GsmSelection::handoverMargin);
   if (handover_.holds(better, c.now, GsmSelection::handoverTime)) serve(*better, c);
   return std::nullopt;
 }

@@ -11,4 +11,13 @@ std::optional<CellIndex> selectionCandidate(const Circumstances& c) {
   return strongestAllowed(c, Technology::Gsm, GsmSelection::rxLevAccessMin);
 }
 
+std::optional<CellIndex> strongerCell(const Circumstances& c, Technology technology, CellIndex serving, double level) {
+  for (const CellIndex cell : c.surroundings.heard(technology)) {
+    if (cell == serving || c.network.cells[cell].areaCode == c.network.forbiddenAreaCode) continue;
+    if (c.surroundings.strength(cell) > level) return cell;
+    break;
+  }
+  return std::nullopt;
+}
+
 }  // namespace probeview::scenario

@@ -133,4 +133,7 @@ inline std::optional<CellIndex> strongestAllowed(const Circumstances& c, Technol
 // technology first.
 std::optional<CellIndex> selectionCandidate(const Circumstances& c);
 
+// The strongest cell of the technology that a connection may go to, if it is stronger than that.
+std::optional<CellIndex> strongerCell(const Circumstances& c, Technology technology, CellIndex serving, double level);
+
 }  // namespace probeview::scenario

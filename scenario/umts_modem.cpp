@@ -272,12 +272,8 @@ void UmtsModem::advanceChannel(const Circumstances& c) {
 }
 
 std::optional<Departure> UmtsModem::changeCell(const Circumstances& c) {
-  std::optional<CellIndex> better;
-  for (const CellIndex cell : c.surroundings.heard(Technology::Umts)) {
-    if (cell == state_.serving || network_.cells[cell].areaCode == network_.forbiddenAreaCode) continue;
-    if (c.surroundings.strength(cell) > state_.rscp + UmtsSelection::hysteresis) better = cell;
-    break;
-  }
+  const std::optional<CellIndex> better =
+      strongerCell(c, Technology::Umts, *state_.serving, state_.rscp + UmtsSelection::hysteresis);
   if (bestCell_.holds(better, c.now, UmtsSelection::timeToTrigger)) {
     serve(*better, c);
     return std::nullopt;
