@@ -60,10 +60,14 @@ class Drive final : public MetricSink, public LineSink {
   std::unique_ptr<MetricSource> source;
 };
 
-inline std::set<std::int64_t> handledMetrics() {
+// Metrics that the store handles and of which a made-up phone can know nothing; it says so by not filling them.
+inline const std::set<std::int64_t> neverTold{};
+
+// What every drive tells: all others that the store handles.
+inline std::set<std::int64_t> toldMetrics() {
   std::set<std::int64_t> ids;
   for (const MetricIdentifier& metric : metricIdentifiers()) {
-    if (metric.isHandled) ids.insert(metric.id);
+    if (metric.isHandled && !neverTold.contains(metric.id)) ids.insert(metric.id);
   }
   return ids;
 }

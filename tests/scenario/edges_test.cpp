@@ -45,16 +45,14 @@ void collect(const std::string& path, const MessageDescriptor& message,
   }
 }
 
-std::vector<const MessageDescriptor*> handledMessages() {
+std::vector<const MessageDescriptor*> toldMessages() {
   std::vector<const MessageDescriptor*> messages;
-  for (const MetricIdentifier& metric : metricIdentifiers()) {
-    if (metric.isHandled) messages.push_back(metric.message);
-  }
+  for (const std::int64_t id : toldMetrics()) messages.push_back(metricWithId(id)->message);
   return messages;
 }
 
 TEST(Edges, ShowEveryFieldOfEveryMessageAndEveryNameOfEveryEnumeration) {
-  for (const MessageDescriptor* message : handledMessages()) {
+  for (const MessageDescriptor* message : toldMessages()) {
     std::map<std::string, const FieldDescriptor*> expected;
     collect("", *message, expected);
     std::set<std::string> seen;
@@ -79,7 +77,7 @@ TEST(Edges, ShowEveryFieldOfEveryMessageAndEveryNameOfEveryEnumeration) {
 }
 
 TEST(Edges, ShowListsThatAreEmptyAndListsThatAreLong) {
-  for (const MessageDescriptor* message : handledMessages()) {
+  for (const MessageDescriptor* message : toldMessages()) {
     std::map<std::string, std::pair<std::size_t, std::size_t>> lengths;  // shortest and longest of each list
     for (const FieldDescriptor& field : message->fields()) {
       if (!isRepeated(field.kind)) continue;
@@ -98,7 +96,7 @@ TEST(Edges, ShowListsThatAreEmptyAndListsThatAreLong) {
 }
 
 TEST(Edges, LeaveRoomForWhatReadersTakeAwayFromTheSmallestNumber) {
-  for (const MessageDescriptor* message : handledMessages()) {
+  for (const MessageDescriptor* message : toldMessages()) {
     for (std::size_t number = 0; number < EdgesStory::variants(*message); ++number) {
       walk("", variantOf(*message, number)->dictionaryRepresentation(),
            [&](const std::string& path, const Value& value) {
@@ -113,8 +111,8 @@ TEST(Edges, TellEachMetricsVariantsInTurnAndBeginAnew) {
   Drive drive("edges");
   drive.listen();
   drive.forSeconds(130);
-  for (const MetricIdentifier& metric : metricIdentifiers()) {
-    if (!metric.isHandled) continue;
+  for (const std::int64_t id : toldMetrics()) {
+    const MetricIdentifier& metric = *metricWithId(id);
     std::size_t number = 0;
     for (const MetricRecord& record : drive.records) {
       if (record.metricId != metric.id) continue;

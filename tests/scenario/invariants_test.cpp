@@ -13,7 +13,7 @@ using namespace std::chrono_literals;
 // What the viewer asks for: measurements at periods, everything else on change.
 MetricPlan viewersPlan() {
   MetricPlan plan;
-  for (const std::int64_t id : handledMetrics()) plan.metrics[id] = std::nullopt;
+  for (const std::int64_t id : toldMetrics()) plan.metrics[id] = std::nullopt;
   for (const std::int64_t id : {K_LTE_RSRP_RSRQ_SINR, K_LTE_TX_POWER, K_LTE_CA_STATUS, K_UMTS_SCELL_MEAS,
                                 K_UMTS_TX_POWER, K_GSM_IDLE_SCELL_MEAS, K_GSM_CS_RF_MEAS}) {
     plan.metrics[id] = 1000ms;

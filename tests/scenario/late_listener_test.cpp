@@ -21,7 +21,7 @@ void listenAnew(Drive& drive) {
 TEST(LateListener, TimeDoesNotGoBackForWhatIsOver) {
   Drive drive("city");
   MetricPlan plan;
-  for (const std::int64_t id : handledMetrics()) plan.metrics[id] = 1000ms;
+  for (const std::int64_t id : toldMetrics()) plan.metrics[id] = 1000ms;
   drive.source->setPlan(plan);
   drive.listen();
   std::map<std::int64_t, std::chrono::milliseconds> last;
@@ -100,7 +100,7 @@ TEST(Asker, IsNotToldLaterOfAnEarlierTimeThanInTheAnswer) {
   std::map<std::int64_t, std::chrono::milliseconds> last;
   for (int round = 0; round < 200; ++round) {
     drive.forSeconds(7.3);
-    for (const std::int64_t id : handledMetrics()) drive.source->query(id);
+    for (const std::int64_t id : toldMetrics()) drive.source->query(id);
     drive.forSeconds(1.1);
     listenAnew(drive);
     drive.forSeconds(0.1);

@@ -57,7 +57,7 @@ TEST(ScenarioSource, EachMetricComesOnceWithinTwoSeconds) {
       Drive drive(name + ",seed=" + std::to_string(seed));
       drive.listen();
       drive.forSeconds(2);
-      for (const std::int64_t id : handledMetrics()) {
+      for (const std::int64_t id : toldMetrics()) {
         EXPECT_GE(drive.count(id), 1U) << name << ", seed " << seed << ": " << nameOf(id);
       }
     }
@@ -108,16 +108,16 @@ TEST(ScenarioSource, ARecordTellsItsPeriodAsPlannedAndItsAge) {
 
 TEST(ScenarioSource, EachMetricComesOnceWithinTwoSecondsWhateverThePlansPeriods) {
   MetricPlan plan;
-  for (const std::int64_t id : handledMetrics()) plan.metrics[id] = 60s;
+  for (const std::int64_t id : toldMetrics()) plan.metrics[id] = 60s;
   Drive drive("city");
   drive.source->setPlan(plan);
   drive.listen();
   drive.forSeconds(2);
-  for (const std::int64_t id : handledMetrics()) EXPECT_EQ(drive.count(id), 1U) << nameOf(id);
+  for (const std::int64_t id : toldMetrics()) EXPECT_EQ(drive.count(id), 1U) << nameOf(id);
 }
 
 TEST(ScenarioSource, NamesTheMetricsThatItFillsInAscendingOrder) {
-  const auto ids = handledMetrics();
+  const auto ids = toldMetrics();
   for (const std::string& name : scenarioNames) {
     EXPECT_EQ(Drive(name).source->metrics(), std::vector<std::int64_t>(ids.begin(), ids.end()));
   }
@@ -183,7 +183,7 @@ TEST(ScenarioSource, AfterAnHourInWhichNothingWasWantedItAnswersAndGoesOnAtTheTi
     drive.records.clear();
     drive.source->setPlan(std::nullopt);
     drive.forSeconds(2);
-    EXPECT_EQ(drive.seen(), handledMetrics());
+    EXPECT_EQ(drive.seen(), toldMetrics());
   }
 }
 
@@ -247,7 +247,7 @@ TEST(ScenarioSource, GoesOnWhereItRestedAtTheTimeThatItIs) {
   drive.listen();
   drive.forSeconds(2);
   // What is known is told to the new listener, the metrics of technologies that are not in service included.
-  EXPECT_EQ(drive.seen(), handledMetrics());
+  EXPECT_EQ(drive.seen(), toldMetrics());
   EXPECT_GE(drive.records.back().time, before + 3600s);
   EXPECT_LE(drive.records.back().time, drive.loop.wallTime());
 }
@@ -354,7 +354,7 @@ TEST(ScenarioSource, GoingBackToNoPlanBringsTheOwnPeriodsBack) {
   drive.forSeconds(10);
   drive.source->setPlan(std::nullopt);
   drive.forSeconds(2);
-  EXPECT_EQ(drive.seen(), handledMetrics());
+  EXPECT_EQ(drive.seen(), toldMetrics());
 }
 
 TEST(ScenarioSource, SpeedMakesTheDriveFasterAndNotTheReportsMore) {
@@ -381,7 +381,7 @@ TEST(ScenarioSource, MeasurementsOnChangeDoNotComeFasterAtSpeed) {
 
 TEST(ScenarioSource, SoakSendsEveryMetricTwentyTimesASecondWhateverThePlanSays) {
   MetricPlan plan;
-  for (const std::int64_t id : handledMetrics()) plan.metrics[id] = std::nullopt;
+  for (const std::int64_t id : toldMetrics()) plan.metrics[id] = std::nullopt;
   plan.metrics.erase(K_SIM_FILE_INFO);
   Drive drive("soak");
   drive.source->setPlan(plan);

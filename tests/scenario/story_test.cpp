@@ -48,7 +48,7 @@ TEST(Story, TellsEveryMetricInAnHourOfEachDrive) {
   for (const std::string& name : drives) {
     std::set<std::int64_t> seen;
     for (const MetricRecord& record : hourOf(name)) seen.insert(record.metricId);
-    EXPECT_EQ(seen, handledMetrics()) << name;
+    EXPECT_EQ(seen, toldMetrics()) << name;
   }
 }
 
