@@ -42,7 +42,7 @@ class MadeUpMetric(unittest.TestCase):
     DICTIONARIES = "store/handlers.cpp"
 
     def row(self, identifier, *, place=PLACES, tag=TAGS):
-        return f"METRIC(K_LTE_MADE_UP, {identifier}, KCellularLteRrcState, myLTEMadeUpDict, {place}, {tag})"
+        return f"METRIC(K_NEVER_TAKEN, {identifier}, KCellularLteRrcState, myNeverTakenDict, {place}, {tag})"
 
     def test_a_number_that_no_field_has_compiles(self):
         for source in (self.IDENTIFIERS, self.TAG_TABLE, self.DICTIONARIES):
@@ -50,7 +50,7 @@ class MadeUpMetric(unittest.TestCase):
 
     def test_the_number_of_a_field_does_not_compile(self):
         for identifier in ("0x3C0004", "0x3D0013"):
-            self.assertIn("the low 16 bits of K_LTE_MADE_UP are the number of a field",
+            self.assertIn("the low 16 bits of K_NEVER_TAKEN are the number of a field",
                           compiled(self.IDENTIFIERS, self.row(identifier)))
 
     def test_the_number_of_another_metric_does_not_compile(self):

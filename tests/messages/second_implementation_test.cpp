@@ -13,6 +13,9 @@
 #include <limits>
 #include <memory>
 #include <random>
+#include <stdexcept>
+#include <string>
+#include <string_view>
 
 #include "gsm.pb.h"
 #include "lte.pb.h"
@@ -37,6 +40,9 @@ std::unique_ptr<Peer> makePeer(std::string_view name) {
   using google::protobuf::MessageFactory;
   const auto* descriptor =
       DescriptorPool::generated_pool()->FindMessageTypeByName("cellular_metrics." + std::string(name));
+  if (descriptor == nullptr) {
+    throw std::runtime_error("the published schema has no " + std::string(name) + "; metrics_page writes it anew");
+  }
   return std::unique_ptr<Peer>(MessageFactory::generated_factory()->GetPrototype(descriptor)->New());
 }
 
