@@ -1,9 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 //
 // client_road [ROUNDS]        how many events a second one core takes on their way through the client: from the frame
-// as
-//                             it has been received, over connection, wrapper and main queue, into the store, over the
-//                             mixed stream of all kinds, both logs discarded. One JSON object.
+//                             as it has been received, over connection, wrapper and main queue, into the store, over
+//                             the mixed stream of all kinds, both logs discarded. One JSON object.
 // client_road --instructions  under callgrind with --collect-atstart=no: the same, one dump; says how many events that
 //                             were and how many allocations each took
 #include <valgrind/callgrind.h>

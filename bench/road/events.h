@@ -13,7 +13,7 @@ struct MetricSample {
   std::vector<std::uint8_t> payload;
 };
 
-// The mixed stream: one of each kind that the viewer takes.
+// The mixed stream: one of each of the kinds that the viewer takes.
 std::vector<MetricSample> mixedStream();
 // One kind alone, a hundred times with other values; empty when the viewer takes no such class.
 std::vector<MetricSample> streamOf(std::string_view message);
