@@ -125,7 +125,7 @@ class Value {
   std::optional<bool> boolean() const noexcept;
   std::optional<std::string_view> text() const noexcept;
   std::optional<std::span<const std::uint8_t>> bytes() const noexcept;
-  // Null when the value is of another kind. Valid until the value changes.
+  // Null when the value is of another kind. Valid until the value changes or moves.
   const List* list() const noexcept { return kind_ == ValueKind::List ? container<List>() : nullptr; }
   const Dictionary* dictionary() const noexcept {
     return kind_ == ValueKind::Dictionary ? container<Dictionary>() : nullptr;

@@ -34,7 +34,7 @@ class PBCodable {
   std::string_view className() const noexcept { return descriptor().name; }
 
   // Decodes the reader's data into this message: scalars replace, lists grow. False when the data ends too early or
-  // holds something that cannot be skipped; what was decoded before that stays.
+  // holds something that cannot be skipped; what was decoded before that stays. Only reset() gives memory free again.
   bool readFrom(PBDataReader& reader);
   // Appends the message's encoding, fields in ascending order of their numbers.
   void writeTo(PBDataWriter& writer) const;
