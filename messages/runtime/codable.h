@@ -73,13 +73,13 @@ class PBCodable {
 
   // The types that the rows of a field table name.
   template <FieldKind Kind, typename Type>
-  struct ScalarType {
+  struct FieldType {
     using Stored = Type;
     template <typename Message>
     static constexpr FieldDescriptor describe(std::uint16_t number, std::string_view name,
                                               Stored Message::*member) noexcept {
       FieldDescriptor row;
-      row.key = wire::key(number, wire::WireType::Varint);
+      row.key = wire::key(number, isScalar(Kind) ? wire::WireType::Varint : wire::WireType::LengthDelimited);
       row.number = number;
       row.kind = Kind;
       row.member = FieldMember(static_cast<Stored PBCodable::*>(member));
@@ -87,46 +87,31 @@ class PBCodable {
       return row;
     }
   };
-  using uint64 = ScalarType<FieldKind::UInt64, std::uint64_t>;
-  using uint32 = ScalarType<FieldKind::UInt32, std::uint32_t>;
-  using int32 = ScalarType<FieldKind::Int32, std::int32_t>;
-  using sint32 = ScalarType<FieldKind::SInt32, std::int32_t>;
-  using boolean = ScalarType<FieldKind::Bool, bool>;
+  using uint64 = FieldType<FieldKind::UInt64, std::uint64_t>;
+  using uint32 = FieldType<FieldKind::UInt32, std::uint32_t>;
+  using int32 = FieldType<FieldKind::Int32, std::int32_t>;
+  using sint32 = FieldType<FieldKind::SInt32, std::int32_t>;
+  using boolean = FieldType<FieldKind::Bool, bool>;
 
   template <typename Names>
-  struct enumeration : ScalarType<FieldKind::Enumeration, std::int32_t> {
+  struct enumeration : FieldType<FieldKind::Enumeration, std::int32_t> {
     template <typename Message>
     static constexpr FieldDescriptor describe(std::uint16_t number, std::string_view name,
                                               std::int32_t Message::*member) noexcept {
-      FieldDescriptor row = ScalarType<FieldKind::Enumeration, std::int32_t>::describe(number, name, member);
+      FieldDescriptor row = FieldType<FieldKind::Enumeration, std::int32_t>::describe(number, name, member);
       row.enumeration = &Names::table;
       return row;
     }
   };
 
-  template <FieldKind Kind, typename Type>
-  struct ObjectType {
-    using Stored = Type;
-    template <typename Message>
-    static constexpr FieldDescriptor describe(std::uint16_t number, std::string_view name,
-                                              Stored Message::*member) noexcept {
-      FieldDescriptor row;
-      row.key = wire::key(number, wire::WireType::LengthDelimited);
-      row.number = number;
-      row.kind = Kind;
-      row.member = FieldMember(static_cast<Stored PBCodable::*>(member));
-      row.name = name;
-      return row;
-    }
-  };
   // Bytes are set from a span, copied; null takes them away.
-  struct bytes : ObjectType<FieldKind::Bytes, PBByteField> {
+  struct bytes : FieldType<FieldKind::Bytes, PBByteField> {
     using Value = std::span<const std::uint8_t>;
     static Value get(const PBByteField& field) noexcept { return field.bytes(); }
     static void set(PBByteField& field, Value value, const Block*) { field.set(value); }
   };
   // Texts are set from a view, copied; null takes them away.
-  struct string : ObjectType<FieldKind::Text, PBByteField> {
+  struct string : FieldType<FieldKind::Text, PBByteField> {
     using Value = std::string_view;
     static Value get(const PBByteField& field) noexcept { return field.text(); }
     static void set(PBByteField& field, Value value, const Block*) {
@@ -135,7 +120,7 @@ class PBCodable {
   };
   // Nested messages are shared with whoever set them; null takes them away.
   template <typename Element>
-  struct message : ObjectType<FieldKind::Message, PBMessageField> {
+  struct message : FieldType<FieldKind::Message, PBMessageField> {
     using Value = Shared<Element>;
     static Value get(const PBMessageField& field) noexcept {
       return field.isPresent() ? Value::of(static_cast<Element&>(*field.element())) : Value(nullptr);
@@ -146,7 +131,7 @@ class PBCodable {
     template <typename Message>
     static constexpr FieldDescriptor describe(std::uint16_t number, std::string_view name,
                                               PBMessageField Message::*member) noexcept {
-      FieldDescriptor row = ObjectType<FieldKind::Message, PBMessageField>::describe(number, name, member);
+      FieldDescriptor row = FieldType<FieldKind::Message, PBMessageField>::describe(number, name, member);
       row.element = &Element::pbDescriptor;
       return row;
     }
@@ -155,7 +140,7 @@ class PBCodable {
   template <typename Type>
   struct repeated;
   template <typename Nested>
-  struct repeated<message<Nested>> : ObjectType<FieldKind::RepeatedMessage, PBMessageList> {
+  struct repeated<message<Nested>> : FieldType<FieldKind::RepeatedMessage, PBMessageList> {
     using Element = Nested;
     using Handle = Shared<Element>;
     using View = MessageView<Element>;
@@ -181,7 +166,7 @@ class PBCodable {
     template <typename Message>
     static constexpr FieldDescriptor describe(std::uint16_t number, std::string_view name,
                                               PBMessageList Message::*member) noexcept {
-      FieldDescriptor row = ObjectType<FieldKind::RepeatedMessage, PBMessageList>::describe(number, name, member);
+      FieldDescriptor row = FieldType<FieldKind::RepeatedMessage, PBMessageList>::describe(number, name, member);
       row.element = &Element::pbDescriptor;
       return row;
     }
@@ -221,11 +206,11 @@ class PBCodable {
 };
 
 template <>
-struct PBCodable::repeated<PBCodable::uint32> : ObjectType<FieldKind::RepeatedUInt32, PBRepeatedUInt32> {
+struct PBCodable::repeated<PBCodable::uint32> : FieldType<FieldKind::RepeatedUInt32, PBRepeatedUInt32> {
   using Number = std::uint32_t;
 };
 template <>
-struct PBCodable::repeated<PBCodable::sint32> : ObjectType<FieldKind::RepeatedSInt32, PBRepeatedInt32> {
+struct PBCodable::repeated<PBCodable::sint32> : FieldType<FieldKind::RepeatedSInt32, PBRepeatedInt32> {
   using Number = std::int32_t;
 };
 
