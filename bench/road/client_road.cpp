@@ -5,8 +5,6 @@
 //                             the mixed stream of all kinds, both logs discarded. One JSON object.
 // client_road --instructions  under callgrind with --collect-atstart=no: the same, one dump; says how many events that
 //                             were and how many allocations each took
-#include <valgrind/callgrind.h>
-
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
@@ -15,9 +13,8 @@
 #include <utility>
 #include <vector>
 
-#include "bench/allocations.h"
 #include "bench/road/events.h"
-#include "bench/road/processor_time.h"
+#include "bench/road/road_measures.h"
 #include "client/radix_wrapper.h"
 #include "platform/manual_loop.h"
 #include "radix/connection_manager.h"
@@ -96,36 +93,21 @@ class Road {
   std::vector<std::vector<std::uint8_t>> frames_;
 };
 
-constexpr int turnsPerRound = 500;
-constexpr int turnsCounted = 50;
-
 int measureRates(int rounds) {
   if (rounds < 1) {
     std::fprintf(stderr, "client_road: expected a number of rounds\n");
     return 2;
   }
   Road road;
-  road.run(1);
-  std::printf("{\"events per second\": [");
-  for (int round = 0; round < rounds; ++round) {
-    const double begin = bench::threadSeconds();
-    const auto events = static_cast<double>(road.run(turnsPerRound));
-    std::printf("%s%.0f", round == 0 ? "" : ", ", events / (bench::threadSeconds() - begin));
-  }
-  std::printf("]}\n");
+  std::printf("{\"events per second\": ");
+  bench::printRates(road, rounds);
+  std::printf("}\n");
   return 0;
 }
 
 int countInstructions() {
   Road road;
-  road.run(2);
-  const std::size_t before = bench::allocationCount();
-  CALLGRIND_TOGGLE_COLLECT;
-  const std::size_t events = road.run(turnsCounted);
-  CALLGRIND_TOGGLE_COLLECT;
-  CALLGRIND_DUMP_STATS_AT("road");
-  const auto allocations = static_cast<double>(bench::allocationCount() - before);
-  std::printf("road\t%zu\t%.4f\n", events, allocations / static_cast<double>(events));
+  bench::countInstructions(road);
   return 0;
 }
 

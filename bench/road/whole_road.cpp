@@ -6,7 +6,6 @@
 // whole_road --instructions   under callgrind with --collect-atstart=no: the same with the log discarded, one dump;
 //                             says how many events that were and how many allocations each took
 #include <unistd.h>
-#include <valgrind/callgrind.h>
 
 #include <cstdio>
 #include <cstdlib>
@@ -14,9 +13,8 @@
 #include <string>
 #include <vector>
 
-#include "bench/allocations.h"
 #include "bench/road/events.h"
-#include "bench/road/processor_time.h"
+#include "bench/road/road_measures.h"
 #include "platform/console_log.h"
 #include "store/metric_validator.h"
 
@@ -54,19 +52,10 @@ class Road {
   std::vector<Dictionary> events_;
 };
 
-constexpr int turnsPerRound = 500;
-constexpr int turnsCounted = 50;
-
 void writeRates(const char* name, LineSink& console, int rounds) {
   Road road(console);
-  road.run(1);
-  std::printf("\"%s\": [", name);
-  for (int round = 0; round < rounds; ++round) {
-    const double begin = bench::threadSeconds();
-    const auto events = static_cast<double>(road.run(turnsPerRound));
-    std::printf("%s%.0f", round == 0 ? "" : ", ", events / (bench::threadSeconds() - begin));
-  }
-  std::printf("]");
+  std::printf("\"%s\": ", name);
+  bench::printRates(road, rounds);
 }
 
 int measureRates(int rounds) {
@@ -90,14 +79,7 @@ int measureRates(int rounds) {
 int countInstructions() {
   DiscardingSink nowhere;
   Road road(nowhere);
-  road.run(2);
-  const std::size_t before = bench::allocationCount();
-  CALLGRIND_TOGGLE_COLLECT;
-  const std::size_t events = road.run(turnsCounted);
-  CALLGRIND_TOGGLE_COLLECT;
-  CALLGRIND_DUMP_STATS_AT("road");
-  const auto allocations = static_cast<double>(bench::allocationCount() - before);
-  std::printf("road\t%zu\t%.4f\n", events, allocations / static_cast<double>(events));
+  bench::countInstructions(road);
   return 0;
 }
 
