@@ -41,21 +41,23 @@ constexpr std::chrono::milliseconds gatheringTime{2};
 // Counts the forks that led to this process: the threads of the one before are not here.
 std::atomic<int> forks{0};
 
-struct Block {
-  explicit Block(std::size_t bytes) : cost(bytes + blockOverhead) {
-    text.reserve(bytes);
-    ends.reserve(entriesPerBlock);
-  }
-  bool takes(std::size_t size) const { return ends.size() < entriesPerBlock && text.size() + size <= text.capacity(); }
-
-  std::size_t cost;
-  std::string text;
-  std::vector<std::uint32_t> ends;  // of each entry in the text
-};
-
 }  // namespace
 
 struct LogWriter::State {
+  struct Block {
+    explicit Block(std::size_t bytes) : cost(bytes + blockOverhead) {
+      text.reserve(bytes);
+      ends.reserve(entriesPerBlock);
+    }
+    bool takes(std::size_t size) const {
+      return ends.size() < entriesPerBlock && text.size() + size <= text.capacity();
+    }
+
+    std::size_t cost;
+    std::string text;
+    std::vector<std::uint32_t> ends;  // of each entry in the text
+  };
+
   State(Settings chosen, Output where)
       : settings(std::move(chosen)), output(std::move(where)), patience(settings.patience) {}
 

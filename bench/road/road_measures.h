@@ -10,7 +10,7 @@
 #include "bench/allocations.h"
 #include "bench/road/processor_time.h"
 
-namespace bench {
+namespace probeview::bench {
 
 // Prints the events a second of each round as a JSON list.
 template <typename Road>
@@ -40,4 +40,4 @@ void countInstructions(Road& road) {
   std::printf("road\t%zu\t%.4f\n", events, allocations / static_cast<double>(events));
 }
 
-}  // namespace bench
+}  // namespace probeview::bench

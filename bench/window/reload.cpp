@@ -1,9 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// reload [ROUNDS]   how long a page of 1000 rows takes to reload: the page asked anew, the difference to what it
-// showed,
-//                   the list told of it; with nothing changed, one value in ten, all values, and one row more at the
-//                   top. In ms of processor time; one JSON object. Drawing comes later and only for rows in sight.
+// reload [ROUNDS]   how long a page of 1000 rows takes to reload: the page asked anew, the difference to what it showed
+//                   before, the list told of it; with nothing changed, one value in ten, all values, and one row more
+//                   at the top. In ms of processor time; one JSON object. Drawing comes later and only for rows in
+//                   sight.
 #include <QDBusConnection>
 #include <QGuiApplication>
 #include <QTest>
@@ -21,6 +21,7 @@
 #include "ui/qt/viewer.h"
 #include "ui/qt/window_engine.h"
 #include "ui/second_level_view_controller.h"
+#include "ui/status.h"
 
 namespace {
 
@@ -82,7 +83,7 @@ int main(int argc, char** argv) {
   const bool isOpen = openPage(stack, "LTE RRC State");
   qt::Appearance appearance(QDBusConnection(QStringLiteral("no bus in benchmarks")));
   qt::Viewer viewer(
-      stack, [] { return std::string("bench"); }, loop, appearance);
+      stack, [] { return Status{.text = "bench"}; }, loop, appearance);
   qt::Window window(viewer);
   window.quickWindow().setVisible(true);
   if (rounds < 1 || !isOpen || viewer.topPage()->rowCount() != rowCount ||
